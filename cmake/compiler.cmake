@@ -1,0 +1,14 @@
+# What every target is compiled with.
+
+add_library(tessel_warnings INTERFACE)
+target_compile_options(tessel_warnings INTERFACE
+    -Wall -Wextra -Wpedantic -Werror -Wconversion -Wsign-conversion -Wshadow -Wold-style-cast
+    -Wnon-virtual-dtor -Woverloaded-virtual -Wcast-align -Wformat=2 -Wno-format-nonliteral)
+
+add_library(tessel_sanitizers INTERFACE)
+if(TESSEL_SANITIZE)
+    set(flags -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
+    target_compile_options(tessel_sanitizers INTERFACE ${flags})
+    target_link_options(tessel_sanitizers INTERFACE ${flags})
+endif()
+target_link_libraries(tessel_warnings INTERFACE tessel_sanitizers)

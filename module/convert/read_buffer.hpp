@@ -1,0 +1,79 @@
+// module/convert/read_buffer.hpp: where the library puts what it reads.
+//
+// Numbers go straight into the storage of the result, which stands in its output slot before the
+// library fills it. Text needs a buffer, because the library's characters are bytes and the host's
+// have 16 bits; the result is made, and the buffer freed, before anyone looks at the status.
+#pragma once
+
+#include "convert/memory.hpp"
+#include "tessel/create.h"
+#include "tessel/memory.h"
+
+#include <cstddef>
+#include <span>
+
+namespace tessel::netcdf {
+
+/// How a family reads a block of text: the size of its buffer's units in bytes, and how many of n
+/// characters it hands over.
+struct TextBlock {
+    std::size_t unit;
+    std::size_t (*handedOver)(std::size_t n);
+};
+
+/// A zero-filled buffer of the host's. Raises where there is none, except for a request of no
+/// bytes, which the host may answer with NULL.
+char *allocateReadBuffer(std::size_t count, std::size_t unit, const OperationEntry *entry);
+
+/// Copies bytes into a char array, each widened with its sign: 0xE9 becomes 0xFFE9.
+void widenText(const char *bytes, std::size_t count, tsArray *characters);
+
+/// Creates a numeric result of the given dimensions in the slot and has `read` fill it. Gives back
+/// the status of `read`.
+template <class T, class Read>
+int readNumbers(tsArray *&slot, std::span<const std::size_t> dims, const Read &read) {
+    slot = tsCreateUninitNumericArray(dims.size(), dims.data(), memory<T>::hostClass);
+    return read(static_cast<T *>(tsGetData(slot)));
+}
+
+/// Creates a result of the given dimensions in the slot, numeric or char, and has `read` fill it.
+template <class T, class Read>
+int readBlock(tsArray *&slot, std::span<const std::size_t> dims, const TextBlock & /*text*/,
+              const OperationEntry * /*entry*/, const Read &read) {
+    return readNumbers<T>(slot, dims, read);
+}
+
+template <std::same_as<char> T, class Read>
+int readBlock(tsArray *&slot, std::span<const std::size_t> dims, const TextBlock &text,
+              const OperationEntry *entry, const Read &read) {
+    slot = tsCreateCharArray(dims.size(), dims.data());
+    const std::size_t length = tsGetNumberOfElements(slot);
+    char *const bytes = allocateReadBuffer(length + 1, text.unit, entry);
+    const int status = read(bytes);
+    widenText(bytes, text.handedOver(length), slot);
+    tsFree(bytes);
+    return status;
+}
+
+/// Creates a result in the slot that is numbers of the given dimensions, or for text a row of at
+/// most `length` characters which ends before the first zero byte, and has `read` fill it.
+template <class T, class Read>
+int readRow(tsArray *&slot, std::span<const std::size_t> dims, std::size_t /*length*/,
+            const OperationEntry * /*entry*/, const Read &read) {
+    return readNumbers<T>(slot, dims, read);
+}
+
+template <std::same_as<char> T, class Read>
+int readRow(tsArray *&slot, std::span<const std::size_t> /*dims*/, std::size_t length,
+            const OperationEntry *entry, const Read &read) {
+    char *const bytes = allocateReadBuffer(length, 2, entry);
+    char none = '\0'; // what the library is given, and the row made of, when there is no buffer
+    char *const text = bytes == nullptr ? &none : bytes;
+    const int status = read(text);
+    text[length] = '\0';
+    slot = tsCreateString(text);
+    tsFree(bytes);
+    return status;
+}
+
+} // namespace tessel::netcdf

@@ -1,0 +1,86 @@
+// module/gateway/lookup.cpp: from the name of an operation to its row.
+//
+// The result is that of a walk through the table; the names are hashed when compiled, so that it
+// takes one comparison as a rule.
+#include "gateway/lookup.hpp"
+
+#include "call/catalogue.hpp"
+#include "gateway/operation_table.hpp"
+
+#include <array>
+#include <cctype>
+#include <cstdint>
+#include <cstring>
+#include <string_view>
+
+namespace tessel::netcdf {
+namespace {
+
+/// The hash of a name, a character at a time (FNV-1a).
+class Hash {
+  public:
+    constexpr void add(char c) { value = (value ^ static_cast<unsigned char>(c)) * 16777619U; }
+    [[nodiscard]] constexpr std::size_t slotIn(std::size_t slots) const {
+        return (value ^ (value >> 15U)) % slots;
+    }
+
+  private:
+    std::uint32_t value = 2166136261U;
+};
+
+struct Slot {
+    const char *name = nullptr;
+    const OperationEntry *entry = nullptr;
+};
+
+/// An open hash table: a name is in the slot of its hash or in one that follows it without a gap.
+/// A power of two, and sparse enough that gaps are frequent.
+constexpr std::size_t slotCount = 1024;
+static_assert(slotCount >= 4 * operationTable.size());
+
+constexpr std::size_t next(std::size_t slot) {
+    return (slot + 1) % slotCount;
+}
+
+constexpr void insert(std::array<Slot, slotCount> &slots, const char *name,
+                      const OperationEntry &entry) {
+    Hash hash;
+    for (const char c : std::string_view(name)) {
+        hash.add(c);
+    }
+    std::size_t at = hash.slotIn(slotCount);
+    while (slots[at].name != nullptr) {
+        if (std::string_view(slots[at].name) == name) {
+            return; // the first row of a name is the one that counts
+        }
+        at = next(at);
+    }
+    slots[at] = {name, &entry};
+}
+
+constexpr std::array<Slot, slotCount> slots = [] {
+    std::array<Slot, slotCount> filled;
+    for (const OperationEntry &entry : operationTable) {
+        insert(filled, entry.longName, entry);
+        insert(filled, entry.shortName, entry);
+    }
+    return filled;
+}();
+
+} // namespace
+
+const OperationEntry *findOperation(char *name) {
+    Hash hash;
+    for (char *at = name; *at != '\0'; ++at) {
+        *at = static_cast<char>(std::tolower(static_cast<unsigned char>(*at)));
+        hash.add(*at);
+    }
+    for (std::size_t at = hash.slotIn(slotCount); slots[at].name != nullptr; at = next(at)) {
+        if (std::strcmp(slots[at].name, name) == 0) {
+            return slots[at].entry;
+        }
+    }
+    raise(catalogue::invalidOperation, name);
+}
+
+} // namespace tessel::netcdf

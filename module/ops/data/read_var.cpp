@@ -1,0 +1,64 @@
+// module/ops/data/read_var.cpp: reading whole variables.
+#include "call/catalogue.hpp"
+#include "convert/memory.hpp"
+#include "convert/read_buffer.hpp"
+#include "convert/scalar.hpp"
+#include "ops/data/handlers.hpp"
+#include "ops/data/result_shape.hpp"
+
+#include <netcdf.h>
+
+#include <cstdint>
+#include <vector>
+
+namespace tessel::netcdf {
+namespace {
+
+template <class T>
+using GetVar = int(int ncid, int varid, T *data);
+
+constexpr Family<GetVar> getVar = {
+    18,
+    catalogue::getVarForeign,
+    {nc_get_var_double, nc_get_var_float, nc_get_var_int, nc_get_var_short, nc_get_var_schar,
+                     nc_get_var_uchar, nc_get_var_text}
+};
+
+/// This family counts the characters it hands over in 32 bits, and none when that is negative.
+std::size_t countedIn32Bits(std::size_t n) {
+    const auto count = static_cast<std::int32_t>(n);
+    return count > 0 ? static_cast<std::size_t>(count) : 0;
+}
+
+constexpr TextBlock text = {1, countedIn32Bits};
+
+/// The lengths of a variable's dimensions now, in library order.
+std::vector<std::size_t> currentLengths(int ncid, int varid) {
+    int ndims = 0;
+    check(nc_inq_varndims(ncid, varid, &ndims), catalogue::getVarNumDims);
+    std::vector<int> dimids(static_cast<std::size_t>(ndims));
+    check(nc_inq_vardimid(ncid, varid, dimids.data()), catalogue::getVarDimids);
+    std::vector<std::size_t> lengths(dimids.size());
+    for (std::size_t i = 0; i < dimids.size(); ++i) {
+        check(nc_inq_dimlen(ncid, dimids[i], &lengths[i]), catalogue::getVarDimLen);
+    }
+    return lengths;
+}
+
+} // namespace
+
+void readVarHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
+                    const OperationEntry *entry) {
+    checkCount(catalogue::getVar, nrhs, entry);
+    const int ncid = unpackID(prhs[1], "ncid");
+    const int varid = unpackID(prhs[2], "varid");
+    const std::vector<std::size_t> dims = resultShape(currentLengths(ncid, varid));
+
+    const int status = withMember(getVar, entry, [&]<class T>(GetVar<T> *get) {
+        return readBlock<T>(plhs[0], dims, text, entry,
+                            [&](T *data) { return get(ncid, varid, data); });
+    });
+    check(status, catalogue::getVar.failure);
+}
+
+} // namespace tessel::netcdf

@@ -1,0 +1,34 @@
+// tessel/runtime/error.hpp: the exception that a host error is.
+#pragma once
+
+#include <exception>
+#include <memory>
+#include <string>
+#include <string_view>
+
+namespace tessel {
+
+/// A host error: what a module raised, or what the host itself refused. The host's own identifiers
+/// begin with "TESSEL:host:". Cheap to copy, and copying does not throw.
+class Error : public std::exception {
+  public:
+    Error(std::string_view identifier, std::string_view message);
+
+    /// Colon-separated, made for programs ("TESSEL:netcdf:open:noSuchFileOrDirectory").
+    [[nodiscard]] const std::string &identifier() const noexcept { return texts->identifier; }
+
+    /// Made for people.
+    [[nodiscard]] const std::string &message() const noexcept { return texts->message; }
+
+    /// The message.
+    [[nodiscard]] const char *what() const noexcept override { return texts->message.c_str(); }
+
+  private:
+    struct Texts {
+        std::string identifier;
+        std::string message;
+    };
+    std::shared_ptr<const Texts> texts;
+};
+
+} // namespace tessel

@@ -1,0 +1,158 @@
+// runtime/src/array_storage.cpp: what a host array is made of.
+#include "array_storage.hpp"
+
+#include "host_errors.hpp"
+#include "tessel/runtime/module.hpp"
+#include "text.hpp"
+
+#include <algorithm>
+#include <cstdint>
+#include <limits>
+#include <optional>
+
+namespace tessel {
+namespace {
+
+struct ClassFacts {
+    const char *name;
+    std::size_t elementSize; ///< 0: no plain data
+    bool numeric;
+};
+
+/// By class id.
+constexpr std::array<ClassFacts, tsFUNCTION + 1> classes = {
+    {
+     {"unknown", 0, false},
+     {"cell", 0, false},
+     {"struct", 0, false},
+     {"logical", 1, false},
+     {"char", sizeof(tsChar), false},
+     {"double", 8, true},
+     {"single", 4, true},
+     {"int8", 1, true},
+     {"uint8", 1, true},
+     {"int16", 2, true},
+     {"uint16", 2, true},
+     {"int32", 4, true},
+     {"uint32", 4, true},
+     {"int64", 8, true},
+     {"uint64", 8, true},
+     {"function_handle", 0, false},
+     }
+};
+
+const ClassFacts &factsOf(tsClassID classID) noexcept {
+    const auto index = static_cast<std::size_t>(classID);
+    return classes[index < classes.size() ? index : std::size_t{tsUNKNOWN}];
+}
+
+/// The product of the dimensions, zero where one of them is; nothing when it overflows.
+std::optional<std::size_t> product(Dims dims) noexcept {
+    if (std::find(dims.begin(), dims.end(), 0) != dims.end()) {
+        return 0;
+    }
+    std::size_t elements = 1;
+    for (const std::size_t length : dims) {
+        if (__builtin_mul_overflow(elements, length, &elements)) {
+            return std::nullopt;
+        }
+    }
+    return elements;
+}
+
+} // namespace
+
+std::size_t elementSize(tsClassID classID) noexcept {
+    return factsOf(classID).elementSize;
+}
+bool isNumericClass(tsClassID classID) noexcept {
+    return factsOf(classID).numeric;
+}
+const char *className(tsClassID classID) noexcept {
+    return factsOf(classID).name;
+}
+
+ArrayPointer makeShape(tsClassID classID, Dims dims) {
+    if (dims.empty()) {
+        raise(host_errors::badDimensions);
+    }
+    const std::optional<std::size_t> elements = product(dims);
+    const std::size_t largest = std::numeric_limits<std::ptrdiff_t>::max();
+    if (!elements || *elements > largest / std::max<std::size_t>(elementSize(classID), 1)) {
+        raise(host_errors::dimensionsTooLarge);
+    }
+    auto array = std::make_unique<tsArray>();
+    array->classID = classID;
+    array->elements = *elements;
+    array->ndim = std::max<std::size_t>(dims.size(), 2);
+    std::size_t *room = array->fewDims.data();
+    if (array->ndim > array->fewDims.size()) {
+        array->manyDims = std::make_unique<std::size_t[]>(array->ndim);
+        room = array->manyDims.get();
+    }
+    room[1] = 1;
+    std::copy(dims.begin(), dims.end(), room);
+    array->dims = room;
+    return array;
+}
+
+ArrayPointer makeArray(tsClassID classID, Dims dims, Fill fill) {
+    ArrayPointer array = makeShape(classID, dims);
+    const std::size_t bytes = array->elements * elementSize(classID);
+    if (bytes <= sizeof(array->smallData) && !isChecked()) {
+        array->data = array->smallData.data();
+        if (fill == Fill::zero) {
+            array->smallData.fill(std::byte{0});
+        }
+        return array;
+    }
+    array->block = allocateBlock(bytes, fill);
+    if (array->block == nullptr) {
+        raise(host_errors::outOfMemory);
+    }
+    array->data = array->block;
+    return array;
+}
+
+ArrayExtras &extrasOf(tsArray &array) {
+    if (!array.extras) {
+        array.extras = std::make_unique<ArrayExtras>();
+    }
+    return *array.extras;
+}
+
+ArrayPointer makeText(std::string_view utf8) {
+    const std::array<std::size_t, 2> dims = {1, utf16Length(utf8)};
+    ArrayPointer array = makeArray(tsCHAR, dims, Fill::none);
+    writeUtf16(utf8, static_cast<tsChar *>(array->data));
+    return array;
+}
+
+ArrayPointer makeCell(Dims dims) {
+    ArrayPointer array = makeShape(tsCELL, dims);
+    if (array->elements > std::vector<Array>().max_size()) {
+        raise(host_errors::dimensionsTooLarge);
+    }
+    extrasOf(*array).cells.resize(array->elements);
+    return array;
+}
+
+void putIntoCell(tsArray &cell, std::size_t index, Array &&value) {
+    if (cell.classID != tsCELL && cell.classID != tsSTRUCT) {
+        raise(host_errors::badClass);
+    }
+    if (index >= cell.extras->cells.size()) {
+        raise(host_errors::badIndex);
+    }
+    cell.extras->cells[index] = std::move(value);
+}
+
+} // namespace tessel
+
+tsArray::~tsArray() {
+    tessel::freeBlock(block);
+    if (extras) {
+        tessel::freeBlock(extras->imaginary);
+    }
+    remove();
+}

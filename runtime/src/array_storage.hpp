@@ -1,0 +1,76 @@
+// runtime/src/array_storage.hpp: what a host array is made of.
+#pragma once
+
+#include "block.hpp"
+#include "tessel/runtime/array.hpp"
+
+#include <array>
+#include <cstddef>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace tessel {
+
+class CallFrame;
+
+/// What few arrays have.
+struct ArrayExtras {
+    void *imaginary = nullptr;      ///< a block of its own
+    std::vector<Array> cells;       ///< of a cell or structure
+    std::vector<std::string> names; ///< the fields of a structure, or the name of a function
+    std::shared_ptr<void> lender;   ///< keeps borrowed data alive
+};
+
+} // namespace tessel
+
+/// A host array. While the call that made it has not handed it out, it is in that call's ring.
+struct tsArray : tessel::Link {
+    tessel::CallFrame *frame =
+        nullptr; ///< the call that owns the array; nullptr: somebody else does
+    tsClassID classID = tsUNKNOWN;
+    std::size_t elements = 0;
+    std::size_t ndim = 0;
+    const std::size_t *dims = nullptr;
+    void *data = nullptr;
+
+    std::array<std::size_t, 4> fewDims{};
+    std::unique_ptr<std::size_t[]> manyDims;
+    void *block = nullptr; ///< the data, where they are neither borrowed nor small
+    std::unique_ptr<tessel::ArrayExtras> extras;
+    alignas(16) std::array<std::byte, 64> smallData;
+
+    tsArray() = default;
+    tsArray(const tsArray &) = delete;
+    tsArray &operator=(const tsArray &) = delete;
+    ~tsArray();
+};
+
+namespace tessel {
+
+using ArrayPointer = std::unique_ptr<tsArray>;
+
+/// An array of the given class and dimensions with data of its own, for the classes that have plain
+/// data, or without. Raises the errors that array.hpp lists.
+ArrayPointer makeArray(tsClassID classID, Dims dims, Fill fill);
+
+/// The same without storage for data.
+ArrayPointer makeShape(tsClassID classID, Dims dims);
+
+/// The extras of an array, made when they are not there.
+ArrayExtras &extrasOf(tsArray &array);
+
+/// A 1-by-n row of characters from UTF-8.
+ArrayPointer makeText(std::string_view utf8);
+
+/// An array of empty cells.
+ArrayPointer makeCell(Dims dims);
+
+bool isNumericClass(tsClassID classID) noexcept;
+const char *className(tsClassID classID) noexcept;
+
+/// Puts a value into a cell or structure. Raises "TESSEL:host:badClass" or "TESSEL:host:badIndex",
+/// and then the value is still the caller's.
+void putIntoCell(tsArray &cell, std::size_t index, Array &&value);
+
+} // namespace tessel

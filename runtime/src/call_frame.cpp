@@ -1,0 +1,170 @@
+// runtime/src/call_frame.cpp: one call in progress, and what it has made so far.
+#include "call_frame.hpp"
+
+#include "host_errors.hpp"
+
+#include <algorithm>
+
+namespace tessel {
+namespace {
+
+// A call begins and ends on one thread, and the module's own threads, if it has any, do not call
+// the host.
+thread_local CallFrame *currentFrame = nullptr;
+
+tsArray &arrayOf(Link &link) noexcept {
+    return static_cast<tsArray &>(link);
+}
+
+std::size_t count(const Link &ring) noexcept {
+    std::size_t n = 0;
+    for (const Link *at = ring.next; at != &ring; at = at->next) {
+        ++n;
+    }
+    return n;
+}
+
+/// A sum over an input's dimensions and plain data, to tell whether they changed (FNV-1a).
+std::uint64_t sumOf(const tsArray &array) noexcept {
+    std::uint64_t sum = 14695981039346656037U;
+    const auto add = [&](const void *data, std::size_t bytes) {
+        const auto *const from = static_cast<const unsigned char *>(data);
+        std::for_each(from, from + bytes,
+                      [&](unsigned char byte) { sum = (sum ^ byte) * 1099511628211U; });
+    };
+    add(array.dims, array.ndim * sizeof(std::size_t));
+    add(array.data, array.elements * elementSize(array.classID));
+    return sum;
+}
+
+bool guardsAreIntact(const tsArray &array) noexcept {
+    return tessel::guardsAreIntact(array.block) &&
+           (!array.extras || tessel::guardsAreIntact(array.extras->imaginary));
+}
+
+constexpr const char *guardFault = "it wrote outside of a block or an array";
+constexpr const char *inputFault = "it changed an input";
+constexpr const char *freeFault = "it freed memory that was not the call's, or freed it twice";
+
+} // namespace
+
+CallFrame::CallFrame(const CallOptions &options) noexcept
+    : failAllocation(options.failAllocation), report(options.report) {
+    currentFrame = this;
+}
+
+CallFrame::~CallFrame() {
+    if (report != nullptr) {
+        report->allocations = allocations;
+    }
+    while (!arrays.alone()) {
+        delete &arrayOf(*arrays.next); // takes itself out of the ring
+    }
+    while (!blocks.alone()) {
+        Link &link = *blocks.next;
+        link.remove();
+        freeBlock(blockOf(link));
+    }
+    currentFrame = nullptr;
+}
+
+CallFrame *CallFrame::current() noexcept {
+    return currentFrame;
+}
+
+CallFrame &CallFrame::wanted() {
+    if (currentFrame == nullptr) {
+        raise(host_errors::noCall);
+    }
+    return *currentFrame;
+}
+
+tsArray *CallFrame::own(ArrayPointer array) noexcept {
+    array->frame = this;
+    array->insertBefore(arrays);
+    return array.release();
+}
+
+Array CallFrame::give(tsArray *array) {
+    if (array->frame != this) {
+        raise(host_errors::badOwner);
+    }
+    if (!guardsAreIntact(*array)) {
+        note(guardFault);
+    }
+    array->frame = nullptr;
+    array->remove();
+    return Array::adopt(array);
+}
+
+void *CallFrame::allocate(std::size_t bytes, Fill fill) noexcept {
+    void *const block = allocateBlock(bytes, fill);
+    if (block != nullptr) {
+        new (&linkOf(block)) Link;
+        linkOf(block).insertBefore(blocks);
+    }
+    return block;
+}
+
+void CallFrame::free(void *block) noexcept {
+    if (isChecked()) {
+        Link *at = blocks.next;
+        while (at != &blocks && blockOf(*at) != block) {
+            at = at->next;
+        }
+        if (at == &blocks) {
+            note(freeFault);
+            return;
+        }
+        if (!guardsAreIntact(block)) {
+            note(guardFault);
+        }
+    }
+    linkOf(block).remove();
+    freeBlock(block);
+}
+
+void CallFrame::watch(std::span<const tsArray *const> inputs) {
+    if (isChecked()) {
+        for (const tsArray *input : inputs) {
+            watched.push_back({input, sumOf(*input)});
+        }
+    }
+}
+
+void CallFrame::note(const char *what) noexcept {
+    if (fault == nullptr) {
+        fault = what;
+    }
+}
+
+const char *CallFrame::inspect() noexcept {
+    if (!isChecked()) {
+        return nullptr;
+    }
+    if (report != nullptr) {
+        report->blocksLeft = count(blocks);
+        report->arraysLeft = count(arrays);
+    }
+    for (Link *at = blocks.next; at != &blocks; at = at->next) {
+        if (!tessel::guardsAreIntact(blockOf(*at))) {
+            note(guardFault);
+        }
+    }
+    for (Link *at = arrays.next; at != &arrays; at = at->next) {
+        if (!guardsAreIntact(arrayOf(*at))) {
+            note(guardFault);
+        }
+    }
+    for (const Watched &one : watched) {
+        if (!guardsAreIntact(*one.input)) {
+            note(guardFault);
+        }
+        if (sumOf(*one.input) != one.sum) {
+            note(inputFault);
+        }
+    }
+    return fault;
+}
+
+} // namespace tessel

@@ -1,0 +1,140 @@
+// runtime/src/interface.cpp: the functions that modules call.
+#include "array_storage.hpp"
+#include "call_frame.hpp"
+#include "host_errors.hpp"
+#include "tessel/host.h"
+#include "text.hpp"
+
+#include <cmath>
+#include <cstdarg>
+#include <cstdio>
+#include <string>
+
+using namespace tessel;
+
+namespace {
+
+/// The frame of the call, after an allocation was counted; raises when it is the one to fail.
+CallFrame &admitted() {
+    CallFrame &frame = CallFrame::wanted();
+    if (!frame.admit()) {
+        raise(host_errors::outOfMemory);
+    }
+    return frame;
+}
+
+} // namespace
+
+tsClassID tsGetClassID(const tsArray *array) {
+    return array->classID;
+}
+const char *tsGetClassName(const tsArray *array) {
+    return className(array->classID);
+}
+bool tsIsNumeric(const tsArray *array) {
+    return isNumericClass(array->classID);
+}
+bool tsIsEmpty(const tsArray *array) {
+    return array->elements == 0;
+}
+size_t tsGetNumberOfElements(const tsArray *array) {
+    return array->elements;
+}
+size_t tsGetNumberOfDimensions(const tsArray *array) {
+    return array->ndim;
+}
+const size_t *tsGetDimensions(const tsArray *array) {
+    return array->dims;
+}
+void *tsGetData(const tsArray *array) {
+    return array->data;
+}
+bool tsIsInf(double value) {
+    return std::isinf(value);
+}
+bool tsIsNaN(double value) {
+    return std::isnan(value);
+}
+
+tsArray *tsCreateDoubleScalar(double value) {
+    constexpr std::array<std::size_t, 2> dims = {1, 1};
+    CallFrame &frame = admitted();
+    ArrayPointer array = makeArray(tsDOUBLE, dims, Fill::none);
+    *static_cast<double *>(array->data) = value;
+    return frame.own(std::move(array));
+}
+
+tsArray *tsCreateString(const char *text) {
+    CallFrame &frame = admitted();
+    return frame.own(makeText(text));
+}
+
+tsArray *tsCreateUninitNumericArray(size_t ndim, const size_t *dims, tsClassID classID) {
+    if (!isNumericClass(classID)) {
+        raise(host_errors::badClass);
+    }
+    CallFrame &frame = admitted();
+    return frame.own(makeArray(classID, {dims, ndim}, Fill::none));
+}
+
+tsArray *tsCreateCharArray(size_t ndim, const size_t *dims) {
+    CallFrame &frame = admitted();
+    return frame.own(makeArray(tsCHAR, {dims, ndim}, Fill::zero));
+}
+
+tsArray *tsCreateCellArray(size_t ndim, const size_t *dims) {
+    CallFrame &frame = admitted();
+    return frame.own(makeCell({dims, ndim}));
+}
+
+void tsSetCell(tsArray *cell, size_t index, tsArray *value) {
+    if (cell == value) {
+        raise(host_errors::badOwner);
+    }
+    putIntoCell(*cell, index, value == nullptr ? Array() : CallFrame::wanted().give(value));
+}
+
+void *tsCalloc(size_t count, size_t size) {
+    CallFrame *const frame = CallFrame::current();
+    std::size_t bytes = 0;
+    if (frame == nullptr || !frame->admit() || __builtin_mul_overflow(count, size, &bytes)) {
+        return nullptr;
+    }
+    return frame->allocate(bytes, Fill::zero);
+}
+
+void tsFree(void *memory) {
+    CallFrame *const frame = CallFrame::current();
+    if (memory != nullptr && frame != nullptr) {
+        frame->free(memory);
+    }
+}
+
+char *tsArrayToString(const tsArray *array) {
+    if (array->classID != tsCHAR) {
+        return nullptr;
+    }
+    CallFrame &frame = admitted();
+    const std::span characters(static_cast<const tsChar *>(array->data), array->elements);
+    const std::size_t length = utf8Length(characters);
+    auto *const text = static_cast<char *>(frame.allocate(length + 1, Fill::none));
+    if (text == nullptr) {
+        raise(host_errors::outOfMemory);
+    }
+    writeUtf8(characters, text);
+    text[length] = '\0';
+    return text;
+}
+
+void tsxErrMsgIdAndTxt(const char *identifier, const char *format, ...) {
+    va_list arguments;
+    va_start(arguments, format);
+    va_list again;
+    va_copy(again, arguments);
+    const int length = std::vsnprintf(nullptr, 0, format, arguments);
+    va_end(arguments);
+    std::string message(length < 0 ? 0 : static_cast<std::size_t>(length), '\0');
+    std::vsnprintf(message.data(), message.size() + 1, format, again);
+    va_end(again);
+    throw Error(identifier, message);
+}

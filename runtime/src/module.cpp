@@ -1,0 +1,181 @@
+// runtime/src/module.cpp: loading modules and calling them.
+#include "tessel/runtime/module.hpp"
+
+#include "call_frame.hpp"
+#include "host_errors.hpp"
+#include "tessel/extension.h"
+
+#include <cxxabi.h>
+#include <dlfcn.h>
+
+#include <cstdlib>
+#include <mutex>
+#include <optional>
+#include <string>
+#include <system_error>
+
+namespace tessel {
+namespace {
+
+using EntryPoint = decltype(tsxFunction);
+
+constexpr const char *entryPointName = "tsxFunction";
+constexpr const char *moduleSuffix = ".tsx";
+constexpr const char *moduleFolder = "tessel";
+constexpr const char *pathVariable = "TESSEL_MODULE_PATH";
+
+/// One lock for all calls of the process: what a module stands on may be shared with another one.
+std::mutex &callLock() {
+    static std::mutex lock;
+    return lock;
+}
+
+[[noreturn]] void raiseLoadError(const HostError &error, const std::string &name,
+                                 std::string_view detail = {}) {
+    std::string message = "Cannot load module \"" + name + "\": " + error.message;
+    if (!detail.empty()) {
+        message.append(" (").append(detail).append(")");
+    }
+    throw Error(error.identifier, message);
+}
+
+/// The file that this host was loaded from: a library, or the program that it is linked into.
+std::filesystem::path ownFile() {
+    Dl_info info{};
+    if (dladdr(reinterpret_cast<void *>(&tsGetClassID), &info) == 0 || info.dli_fname == nullptr) {
+        return {};
+    }
+    return info.dli_fname;
+}
+
+/// Makes the host's functions visible to modules also when this library was loaded privately, as by
+/// an interpreter. Where it is linked into the program there is nothing to do, and the call fails.
+void showOwnFunctions() {
+    if (void *self = dlopen(ownFile().c_str(), RTLD_NOW | RTLD_NOLOAD | RTLD_GLOBAL)) {
+        dlclose(self);
+    }
+}
+
+std::vector<std::filesystem::path> searchFolders() {
+    std::vector<std::filesystem::path> folders;
+    if (const char *variable = std::getenv(pathVariable)) {
+        std::string_view rest = variable;
+        while (!rest.empty()) {
+            const std::size_t end = std::min(rest.find(':'), rest.size());
+            const std::filesystem::path folder = rest.substr(0, end);
+            if (folder.is_absolute()) {
+                folders.push_back(folder);
+            }
+            rest.remove_prefix(std::min(end + 1, rest.size()));
+        }
+    }
+    const std::filesystem::path own = std::filesystem::absolute(ownFile());
+    folders.push_back(own.parent_path() / moduleFolder);
+    return folders;
+}
+
+/// What went wrong in the module, as a host error. Called while the exception is being handled.
+Error translated() {
+    try {
+        throw;
+    } catch (const Error &error) {
+        return error;
+    } catch (const std::bad_alloc &) {
+        return {host_errors::outOfMemory.identifier, host_errors::outOfMemory.message};
+    } catch (const std::exception &error) {
+        return {host_errors::foreignException.identifier,
+                std::string(host_errors::foreignException.message) + ": " + error.what()};
+    } catch (const abi::__forced_unwind &) {
+        throw; // the thread is being cancelled, which is not an error and must go on
+    } catch (...) {
+        return {host_errors::foreignException.identifier,
+                std::string(host_errors::foreignException.message) + "."};
+    }
+}
+
+} // namespace
+
+struct Module::Loaded {
+    Loaded(std::filesystem::path path) : file(std::move(path)) {
+        std::error_code ignored;
+        if (!std::filesystem::exists(file, ignored)) {
+            raiseLoadError(host_errors::moduleNotFound, file.string());
+        }
+        showOwnFunctions();
+        handle = dlopen(std::filesystem::absolute(file).c_str(), RTLD_NOW | RTLD_LOCAL);
+        if (handle == nullptr) {
+            const char *const reason = dlerror();
+            raiseLoadError(host_errors::notAModule, file.string(), reason == nullptr ? "" : reason);
+        }
+        entryPoint = reinterpret_cast<EntryPoint *>(dlsym(handle, entryPointName));
+        if (entryPoint == nullptr) {
+            dlclose(handle);
+            raiseLoadError(host_errors::noEntryPoint, file.string());
+        }
+    }
+    ~Loaded() { dlclose(handle); }
+    Loaded(const Loaded &) = delete;
+    Loaded &operator=(const Loaded &) = delete;
+
+    std::filesystem::path file;
+    void *handle = nullptr;
+    EntryPoint *entryPoint = nullptr;
+};
+
+Module::Module(const std::filesystem::path &file) : loaded(std::make_shared<const Loaded>(file)) {}
+
+Module Module::find(std::string_view name) {
+    std::string searched;
+    for (const std::filesystem::path &folder : searchFolders()) {
+        const std::filesystem::path file = folder / (std::string(name) + moduleSuffix);
+        std::error_code ignored;
+        if (std::filesystem::exists(file, ignored)) {
+            return Module(file);
+        }
+        searched += (searched.empty() ? "searched " : ", ") + folder.string();
+    }
+    raiseLoadError(host_errors::moduleNotFound, std::string(name) + moduleSuffix, searched);
+}
+
+const std::filesystem::path &Module::file() const noexcept {
+    return loaded->file;
+}
+
+Results Module::call(std::span<const tsArray *> inputs, const CallOptions &options) const {
+    if (CallFrame::current() != nullptr) {
+        raise(host_errors::nestedCall);
+    }
+    if (options.outputs > static_cast<int>(Results::slots)) {
+        raise(host_errors::tooManyOutputs);
+    }
+    const std::lock_guard serialised(callLock());
+    Results results;
+    CallFrame frame(options);
+    frame.watch(inputs);
+    std::array<tsArray *, Results::slots> slots{};
+    const auto run = [&] {
+        loaded->entryPoint(options.outputs, slots.data(), static_cast<int>(inputs.size()),
+                           inputs.data());
+        for (std::size_t i = 0; i < slots.size(); ++i) {
+            if (slots[i] != nullptr) {
+                results.arrays[i] = frame.give(slots[i]);
+                results.count = i + 1;
+            }
+        }
+    };
+    std::optional<Error> error;
+    try {
+        run();
+    } catch (...) {
+        error = translated();
+    }
+    if (const char *fault = frame.inspect()) {
+        raise(host_errors::violation, fault);
+    }
+    if (error) {
+        throw *std::move(error);
+    }
+    return results;
+}
+
+} // namespace tessel
