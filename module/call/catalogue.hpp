@@ -69,20 +69,75 @@ inline constexpr Operation
 
 // The typed families.
 inline constexpr Operation
-    getAtt = {4, {"TESSEL:netcdf:getAtt:badInputParameterCount", "Must supply four input parameters for the %s function."}, {"getAtt", "Attribute retrieval operation failed"}},
-    getVar = {3, {"TESSEL:netcdf:getVar:badInputParameterCount", "Must supply three input parameters for %s."},             {"getVar", "Variable data retrieval failed"}};
+    getAtt     = {4, {"TESSEL:netcdf:getAtt:badInputParameterCount",     "Must supply four input parameters for the %s function."},                  {"getAtt",     "Attribute retrieval operation failed"}},
+    getVar     = {3, {"TESSEL:netcdf:getVar:badInputParameterCount",     "Must supply three input parameters for %s."},                              {"getVar",     "Variable data retrieval failed"}},
+    getVar1    = {4, {"TESSEL:netcdf:getVar1:badInputParameterCount",    "Must supply four input parameters for %s function."},                      {"getVar1",    "Single datum retrieval failed"}},
+    getVara    = {5, {"TESSEL:netcdf:getVara:badInputParameterCount",    "Must supply five input parameters for %s operation."},                     {"getVara",    "Contiguous data retrieval failed"}},
+    getVars    = {6, {"TESSEL:netcdf:getVars:badInputParameterCount",    "Must supply six input parameters for %s operation."},                      {"getVars",    "Strided data retrieval failed"}},
+    putAtt     = {6, {"TESSEL:netcdf:putAtt:badInputParameterCount",     "Must supply six input parameters for %s operation."},                      {"putAtt",     "Attribute write operation failed"}},
+    putAttText = {5, {"TESSEL:netcdf:putAttText:badInputParameterCount", "Must supply five input parameters to PUT_ATT_TEXT."},                      {"putAttText", "Char attribute write operation failed"}},
+    putVar     = {4, {"TESSEL:netcdf:putVar:badInputParameterCount",     "Must supply four input parameters for %s"},                                {"putVar",     "Variable write operation failed"}},
+    putVar1    = {5, {"TESSEL:netcdf:putVar1:badInputParameterCount",    "Must supply five input parameters for PUT_VAR1_(X) family of operations."}, {"putVar1",    "Single datum write operation failed"}},
+    putVara    = {6, {"TESSEL:netcdf:putVara:badInputParameterCount",    "Must supply six input parameters for %s operation."},                      {"putVara",    "Contiguous data write failed"}},
+    putVars    = {7, {"TESSEL:netcdf:putVars:badInputParameterCount",    "Must supply seven input parameters for %s"},                               {"putVars",    "Strided data write operation failed"}};
 
-// The inquiries that come before a family's own call.
+// The inquiries that come before a family's own call; some have an identifier that does not tell the
+// status.
 inline constexpr LibraryFailure
-    getAttInquiry       = {"getAtt",                "Attribute inquiry failed"},
-    getVarNumDims       = {"getVar:numDimsInquiry", "Unable to retrieve number of variable's dimensions"},
-    getVarDimids        = {"getVar:dimidsInquiry",  "Unable to retrieve a netCDF variable's dimension IDs"},
-    getVarDimLen        = {"getVar:dimLenInquiry",  "Dimension length inquiry failed"};
+    getAttInquiry  = {"getAtt",                 "Attribute inquiry failed"},
+    getVarNumDims  = {"getVar:numDimsInquiry",  "Unable to retrieve number of variable's dimensions"},
+    getVarDimids   = {"getVar:dimidsInquiry",   "Unable to retrieve a netCDF variable's dimension IDs"},
+    getVarDimLen   = {"getVar:dimLenInquiry",   "Dimension length inquiry failed"},
+    getVar1NumDims = {"getVar1",                "Unable to retrieve number of variable's dimensions"},
+    getVaraNumDims = {"getVara:numDimsInquiry", "Unable to retrieve number of netCDF variable's dimensions"},
+    putVarInquiry  = {"putVar",                 "Variable inquiry failed"},
+    putVarDimLen   = {"putVar",                 "Retrieval of dimension length failed"};
+inline constexpr Error<const char *> // the library's text
+    getVarsNumDims = {"TESSEL:netcdf:getVars:numVarsInquiryFailure",   "Retrieval of number of variable dimensions failed, library error message \"%s\""},
+    getVarsDimids  = {"TESSEL:netcdf:getVars:varDimIDsInquiryFailure", "Retrieval of variable dimensions failed, library error message \"%s\""},
+    putVar1Inquiry = {"TESSEL:netcdf:putVar1:inqVarNDimsFailure",      "Unable to read the number of dimensions, \"%s\"."},
+    putVaraInquiry = {"TESSEL:netcdf:putVara:inqVarNDimsFailure",      "Unable to read the number of dimensions, \"%s\"."},
+    putVarsInquiry = {"TESSEL:netcdf:putVars:inqVarNDimsFailure",      "Unable to read the number of dimensions, \"%s\"."};
 
 // An entry whose id a family does not serve; the argument is the entry's short name.
 inline constexpr Error<const char *>
-    getAttForeign = {"TESSEL:netcdf:getAtt:unhandledOperation", "\"%s\" is not a recognized operation."},
-    getVarForeign = {"TESSEL:netcdf:getVar:unhandledOperation", "Unhandled operation:  \"%s\""};
+    getAttForeign  = {"TESSEL:netcdf:getAtt:unhandledOperation",     "\"%s\" is not a recognized operation."},
+    getVarForeign  = {"TESSEL:netcdf:getVar:unhandledOperation",     "Unhandled operation:  \"%s\""},
+    getVar1Foreign = {"TESSEL:netcdf:getVar1:unrecognizedOperation", "Unrecognized operation:  \"%s\""},
+    getVaraForeign = {"TESSEL:netcdf:getVara:unhandledOperation",    "Unhandled operation:  \"%s\""},
+    getVarsForeign = {"TESSEL:netcdf:getVars:unhandledOperation",    "Unhandled operation:  \"%s\""},
+    putAttForeign  = {"TESSEL:netcdf:putAtt:unhandledOperation",     "Unrecognized operation:  \"%s\""},
+    putVarForeign  = {"TESSEL:netcdf:putVar:unhandledOperation",     "Unhandled operation:  \"%s\""},
+    putVar1Foreign = {"TESSEL:netcdf:putVar1:unhandledOperation",    "Unhandled operation:  \"%s\""},
+    putVaraForeign = {"TESSEL:netcdf:putVara:unhandledOperation",    "Unhandled operation:  \"%s\""},
+    putVarsForeign = {"TESSEL:netcdf:putVars:unhandledOperation",    "Unhandled operation:  \"%s\""};
+
+// Index vectors that do not fit the variable. The stride's text speaks of the count.
+inline constexpr Error<>
+    getVar1IndexLength  = {"TESSEL:netcdf:getVar1:indexVectorLengthMismatch",  "The length of the start index does not match up with the number of variable dimensions."},
+    getVaraStartLength  = {"TESSEL:netcdf:getVara:startVectorLengthMismatch",  "The length of the start index does not match up with the number of variable dimensions."},
+    getVaraCountLength  = {"TESSEL:netcdf:getVara:countVectorLengthMismatch",  "The length of the count index does not match up with the number of variable dimensions."},
+    getVarsStartLength  = {"TESSEL:netcdf:getVars:startVectorLengthMismatch",  "The length of the start index does not match up with the number of variable dimensions."},
+    getVarsCountLength  = {"TESSEL:netcdf:getVars:countVectorLengthMismatch",  "The length of the count index does not match up with the number of variable dimensions."},
+    getVarsStrideLength = {"TESSEL:netcdf:getVars:strideVectorLengthMismatch", "The length of the count index does not match up with the number of variable dimensions."};
+inline constexpr Error<const char *, int, unsigned> // the variable's name, its number of dimensions, the vector's length
+    putVar1StartLength  = {"TESSEL:netcdf:putVar1:badStartLength",  "The length of the start argument for %s must be %d instead of %u."},
+    putVaraStartLength  = {"TESSEL:netcdf:putVara:badStartLength",  "The length of the start argument for %s must be %d instead of %u."},
+    putVaraCountLength  = {"TESSEL:netcdf:putVara:badCountLength",  "The length of the count argument for %s must be %d instead of %u."},
+    putVarsStartLength  = {"TESSEL:netcdf:putVars:badStartLength",  "The length of the start argument for %s must be %d instead of %u."},
+    putVarsCountLength  = {"TESSEL:netcdf:putVars:badCountLength",  "The length of the count argument for %s must be %d instead of %u."},
+    putVarsStrideLength = {"TESSEL:netcdf:putVars:badStrideLength", "The length of the stride argument for %s must be %d instead of %u."};
+
+// Data that do not fit what is to be written.
+inline constexpr Error<>
+    emptyVariableData = {"TESSEL:netcdf:emptyVariableData",        "Variable data must not be empty."},
+    putVarDataSize    = {"TESSEL:netcdf:putVar:dataSizeMismatch",  "The number of input elements does not match the variable size."},
+    putVar1DataSize   = {"TESSEL:netcdf:putVar1:dataSizeMismatch", "Specifying a single index argument implies that only one data element be provided."};
+inline constexpr Error<unsigned, unsigned> // the product of the counts, the number of elements
+    putVaraDataSize   = {"TESSEL:netcdf:putVara:dataSizeMismatch", "The number of elements implied by the count argument (%u) does not equal the number of data elements (%u)."},
+    putVarsDataSize   = {"TESSEL:netcdf:putVars:dataSizeMismatch", "The number of elements implied by the count argument (%u) does not equal the number of data elements (%u)."};
+inline constexpr Error<const char *> // the short name
+    unhandledFuncstr  = {"TESSEL:netcdf:validate_write_op_datatype:unhandledFuncstr", "Unhandled operation:  \"%s\""};
 
 // The gateway. The two blanks after the colon are meant.
 inline constexpr Error<>
@@ -125,9 +180,20 @@ inline constexpr Error<unsigned>
 inline constexpr Error<const char *> // the variable's name
     ndimsOutOfRange         = {"TESSEL:netcdf:defVar",                                             "The number of dimensions is out of range for %s."};
 
+// Index vectors, whatever the argument is called.
+inline constexpr Error<>
+    indexArgumentHasInf = {"TESSEL:netcdf:indexArgumentHasInf", "Index parameter cannot contain Inf."},
+    indexArgumentHasNaN = {"TESSEL:netcdf:indexArgumentHasNaN", "Index parameter cannot contain NaN."};
+
 // Rows of which the identifier is the rest that follows a name (see raiseNamed).
-inline constexpr Error<const char *> // the short name
-    readBufferFailure       = {":memoryAllocationFailure",                                         "Failed to allocate memory for %s read operation."};
+inline constexpr Error<const char *> // the argument's name, twice
+    argumentIsEmpty        = {"ArgumentIsEmpty",          "%s argument cannot be empty."},
+    argumentHasBadDatatype = {"ArgumentHasBadDatatype",   "%s argument must consist of discrete values between 0 and 2^31-1."};
+inline constexpr Error<const char *> // the entry's short name, twice
+    readBufferFailure      = {":memoryAllocationFailure", "Failed to allocate memory for %s read operation."},
+    writeBufferFailure     = {":memoryAllocationFailure", "Failed to allocate memory for %s write operation."};
+inline constexpr Error<const char *, const char *, const char *> // the short name twice, the class wanted, the class found
+    badWriteDatatype       = {":badDatatype",             "The input datatype for %s must be %s, not %s."};
 
 // clang-format on
 

@@ -4,7 +4,7 @@
 #include "convert/read_buffer.hpp"
 #include "convert/scalar.hpp"
 #include "ops/data/handlers.hpp"
-#include "ops/data/result_shape.hpp"
+#include "ops/data/read_variable.hpp"
 
 #include <netcdf.h>
 
@@ -34,12 +34,10 @@ constexpr TextBlock text = {1, countedIn32Bits};
 
 /// The lengths of a variable's dimensions now, in library order.
 std::vector<std::size_t> currentLengths(int ncid, int varid) {
-    int ndims = 0;
-    check(nc_inq_varndims(ncid, varid, &ndims), catalogue::getVarNumDims);
-    std::vector<int> dimids(static_cast<std::size_t>(ndims));
-    check(nc_inq_vardimid(ncid, varid, dimids.data()), catalogue::getVarDimids);
-    std::vector<std::size_t> lengths(dimids.size());
-    for (std::size_t i = 0; i < dimids.size(); ++i) {
+    const std::size_t ndims = numberOfDimensions(ncid, varid, catalogue::getVarNumDims);
+    const std::vector<int> dimids = dimensionIDs(ncid, varid, ndims, catalogue::getVarDimids);
+    std::vector<std::size_t> lengths(ndims);
+    for (std::size_t i = 0; i < ndims; ++i) {
         check(nc_inq_dimlen(ncid, dimids[i], &lengths[i]), catalogue::getVarDimLen);
     }
     return lengths;

@@ -1,0 +1,60 @@
+// module/ops/data/read_strided.cpp: reading strided blocks.
+#include "call/catalogue.hpp"
+#include "convert/index_vector.hpp"
+#include "convert/memory.hpp"
+#include "convert/read_buffer.hpp"
+#include "convert/scalar.hpp"
+#include "ops/data/handlers.hpp"
+#include "ops/data/read_variable.hpp"
+
+#include <netcdf.h>
+
+#include <vector>
+
+namespace tessel::netcdf {
+namespace {
+
+template <class T>
+using GetVars = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
+                    const std::ptrdiff_t *stride, T *data);
+
+constexpr Family<GetVars> getVars = {
+    39,
+    catalogue::getVarsForeign,
+    {nc_get_vars_double, nc_get_vars_float, nc_get_vars_int, nc_get_vars_short, nc_get_vars_schar,
+                      nc_get_vars_uchar, nc_get_vars_text}
+};
+
+constexpr TextBlock text = {2, countedInFull};
+
+} // namespace
+
+void readVarsHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
+                     const OperationEntry *entry) {
+    checkCount(catalogue::getVars, nrhs, entry);
+    const int ncid = unpackID(prhs[1], "ncid");
+    const int varid = unpackID(prhs[2], "varid");
+    IndexVector start;
+    unpackIndexVector(prhs[3], "start", start);
+    IndexVector count;
+    unpackIndexVector(prhs[4], "count", count);
+    StrideVector stride;
+    unpackStrideVector(prhs[5], "stride", stride);
+    const std::size_t ndims = numberOfDimensions(ncid, varid, catalogue::getVarsNumDims);
+    checkLength(start, ndims, catalogue::getVarsStartLength);
+    checkLength(count, ndims, catalogue::getVarsCountLength);
+    checkLength(stride, ndims, catalogue::getVarsStrideLength);
+    // The ids are of no use here; the inquiry is, as one more thing that can fail with its own
+    // name.
+    dimensionIDs(ncid, varid, ndims, catalogue::getVarsDimids);
+
+    const std::vector<std::size_t> dims = resultShape(count);
+    const int status = withMember(getVars, entry, [&]<class T>(GetVars<T> *get) {
+        return readBlock<T>(plhs[0], dims, text, entry, [&](T *data) {
+            return get(ncid, varid, start.data(), count.data(), stride.data(), data);
+        });
+    });
+    check(status, catalogue::getVars.failure);
+}
+
+} // namespace tessel::netcdf
