@@ -29,7 +29,7 @@ tsArray *packUintScalar(unsigned value) {
 }
 
 tsArray *packUpSizetScalar(std::size_t value) {
-    const std::optional<double> number = checkedCast<double>(value);
+    const auto number = checkedCast<double>(value);
     if (!number) {
         raise(catalogue::sizeNotRepresentable, static_cast<unsigned>(value));
     }

@@ -165,14 +165,14 @@ void unpackDimids(const tsArray *array, std::vector<int> &out) {
     if (tsGetClassID(array) != tsDOUBLE) {
         raise(catalogue::badDimidsType);
     }
-    const std::optional<int> count = checkedCast<int>(tsGetNumberOfElements(array));
+    const auto count = checkedCast<int>(tsGetNumberOfElements(array));
     if (!count) {
         raise(catalogue::numberOfDimensionsOutOfBounds);
     }
     if (*count > NC_MAX_VAR_DIMS) {
         raise(catalogue::tooManyDimensions, NC_MAX_VAR_DIMS);
     }
-    const double *const ids = elements<double>(array);
+    const auto *const ids = elements<double>(array);
     out.resize(static_cast<std::size_t>(*count));
     std::transform(ids, ids + *count, out.rbegin(), truncated<int>);
 }

@@ -21,7 +21,7 @@ void defVarHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[
     const nc_type type = unpack_xtype(prhs[3]);
     std::vector<int> dimids;
     unpackDimids(prhs[4], dimids);
-    const std::optional<int> ndims = checkedCast<int>(dimids.size());
+    const auto ndims = checkedCast<int>(dimids.size());
     if (!ndims) {
         raise(catalogue::ndimsOutOfRange, name.c_str());
     }
