@@ -7,7 +7,7 @@ target_compile_options(tessel_warnings INTERFACE
 
 add_library(tessel_sanitizers INTERFACE)
 if(TESSEL_SANITIZE)
-    set(flags -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
+    set(flags -fsanitize=${TESSEL_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
     target_compile_options(tessel_sanitizers INTERFACE ${flags})
     target_link_options(tessel_sanitizers INTERFACE ${flags})
 endif()

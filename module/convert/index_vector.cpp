@@ -8,7 +8,7 @@ namespace tessel::netcdf {
 namespace {
 
 template <class Wide>
-void unpackVector(const tsArray *array, const char *argName, std::vector<Wide> &out) {
+void unpackVector(const tsArray *array, const char *argName, DimensionVector<Wide> &out) {
     if (tsIsEmpty(array)) {
         raiseNamed(argName, catalogue::argumentIsEmpty, argName);
     }

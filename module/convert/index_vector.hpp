@@ -7,13 +7,19 @@
 
 #include "tessel/array.h"
 
+#include <boost/container/small_vector.hpp>
+
 #include <cstddef>
-#include <vector>
 
 namespace tessel::netcdf {
 
-using IndexVector = std::vector<std::size_t>;
-using StrideVector = std::vector<std::ptrdiff_t>;
+/// A vector with an element a dimension. Nearly all variables have eight or fewer, and then nothing
+/// is allocated.
+template <class T>
+using DimensionVector = boost::container::small_vector<T, 8>;
+
+using IndexVector = DimensionVector<std::size_t>;
+using StrideVector = DimensionVector<std::ptrdiff_t>;
 
 /// Positions or counts of any numeric class. Fractions are truncated toward zero and negative
 /// values wrap around; an infinite or NaN double is refused, a single is not looked at. `out` gets

@@ -67,8 +67,9 @@ template <std::same_as<char> T, class Read>
 int readRow(tsArray *&slot, std::span<const std::size_t> /*dims*/, std::size_t length,
             const OperationEntry *entry, const Read &read) {
     char *const bytes = allocateReadBuffer(length, 2, entry);
-    char none = '\0'; // what the library is given, and the row made of, when there is no buffer
-    char *const text = bytes == nullptr ? &none : bytes;
+    // Whether the host answers a request of no bytes with NULL or not, there is no room in it.
+    char none = '\0';
+    char *const text = length == 0 ? &none : bytes;
     const int status = read(text);
     text[length] = '\0';
     slot = tsCreateString(text);

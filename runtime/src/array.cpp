@@ -38,20 +38,10 @@ constexpr std::array<ReadNumber, tsFUNCTION + 1> readNumber = [] {
     return readers;
 }();
 
-/// What the embedding program gets instead of the standard library's exception.
-template <class Make>
-auto orOutOfMemory(const Make &make) {
-    try {
-        return make();
-    } catch (const std::bad_alloc &) {
-        raise(host_errors::outOfMemory);
-    }
-}
-
 } // namespace
 
-void Array::Destroy::operator()(tsArray *array) const noexcept {
-    delete array;
+void Array::Destroy::operator()(tsArray *owned) const noexcept {
+    delete owned;
 }
 
 Array Array::adopt(tsArray *array) noexcept {
@@ -192,17 +182,11 @@ std::string Array::utf8() const {
 }
 
 const Array &Array::cellAt(std::size_t index) const {
-    if (array->classID != tsCELL && array->classID != tsSTRUCT) {
-        raise(host_errors::badClass);
-    }
-    if (index >= array->extras->cells.size()) {
-        raise(host_errors::badIndex);
-    }
-    return array->extras->cells[index];
+    return placeInCell(*array, index);
 }
 
 void Array::setCell(std::size_t index, Array value) {
-    putIntoCell(*array, index, std::move(value));
+    putIntoCell(*array, placeInCell(*array, index), std::move(value));
 }
 
 const std::vector<std::string> &Array::fields() const {

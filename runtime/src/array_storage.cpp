@@ -6,8 +6,6 @@
 #include "text.hpp"
 
 #include <algorithm>
-#include <cstdint>
-#include <limits>
 #include <optional>
 
 namespace tessel {
@@ -46,8 +44,9 @@ const ClassFacts &factsOf(tsClassID classID) noexcept {
     return classes[index < classes.size() ? index : std::size_t{tsUNKNOWN}];
 }
 
-/// The product of the dimensions, zero where one of them is; nothing when it overflows.
-std::optional<std::size_t> product(Dims dims) noexcept {
+/// The number of elements, zero where a dimension is; nothing when it or the size in bytes is
+/// beyond what there can be.
+std::optional<std::size_t> countElements(Dims dims, std::size_t elementSize) noexcept {
     if (std::find(dims.begin(), dims.end(), 0) != dims.end()) {
         return 0;
     }
@@ -56,6 +55,10 @@ std::optional<std::size_t> product(Dims dims) noexcept {
         if (__builtin_mul_overflow(elements, length, &elements)) {
             return std::nullopt;
         }
+    }
+    std::ptrdiff_t bytes = 0;
+    if (__builtin_mul_overflow(elements, std::max<std::size_t>(elementSize, 1), &bytes)) {
+        return std::nullopt;
     }
     return elements;
 }
@@ -76,12 +79,11 @@ ArrayPointer makeShape(tsClassID classID, Dims dims) {
     if (dims.empty()) {
         raise(host_errors::badDimensions);
     }
-    const std::optional<std::size_t> elements = product(dims);
-    const std::size_t largest = std::numeric_limits<std::ptrdiff_t>::max();
-    if (!elements || *elements > largest / std::max<std::size_t>(elementSize(classID), 1)) {
+    const std::optional<std::size_t> elements = countElements(dims, elementSize(classID));
+    if (!elements) {
         raise(host_errors::dimensionsTooLarge);
     }
-    auto array = std::make_unique<tsArray>();
+    auto array = std::make_unique_for_overwrite<tsArray>(); // small data are not cleared
     array->classID = classID;
     array->elements = *elements;
     array->ndim = std::max<std::size_t>(dims.size(), 2);
@@ -137,19 +139,44 @@ ArrayPointer makeCell(Dims dims) {
     return array;
 }
 
-void putIntoCell(tsArray &cell, std::size_t index, Array &&value) {
+Array &placeInCell(tsArray &cell, std::size_t index) {
     if (cell.classID != tsCELL && cell.classID != tsSTRUCT) {
         raise(host_errors::badClass);
     }
     if (index >= cell.extras->cells.size()) {
         raise(host_errors::badIndex);
     }
-    cell.extras->cells[index] = std::move(value);
+    return cell.extras->cells[index];
+}
+
+void putIntoCell(tsArray &cell, Array &place, Array &&value) noexcept {
+    if (value) {
+        value.get()->holder = &cell;
+    }
+    place = std::move(value);
 }
 
 } // namespace tessel
 
+/// Cells may be nested deeper than the stack is, so what is in them is not destroyed from within
+/// them but taken out, one after the other.
 tsArray::~tsArray() {
+    tessel::Link pending;
+    const auto takeOut = [&pending](const tsArray &from) {
+        if (from.extras) {
+            for (tessel::Array &cell : from.extras->cells) {
+                if (cell) {
+                    cell.release()->insertBefore(pending);
+                }
+            }
+        }
+    };
+    takeOut(*this);
+    while (!pending.alone()) {
+        tsArray &inner = tessel::arrayOf(*pending.next);
+        takeOut(inner);
+        delete &inner; // takes itself out of the ring
+    }
     tessel::freeBlock(block);
     if (extras) {
         tessel::freeBlock(extras->imaginary);

@@ -26,8 +26,8 @@ struct ArrayExtras {
 
 /// A host array. While the call that made it has not handed it out, it is in that call's ring.
 struct tsArray : tessel::Link {
-    tessel::CallFrame *frame =
-        nullptr; ///< the call that owns the array; nullptr: somebody else does
+    tessel::CallFrame *frame = nullptr; ///< the call that owns it; nullptr: somebody else does
+    tsArray *holder = nullptr;          ///< the cell or structure that it is in
     tsClassID classID = tsUNKNOWN;
     std::size_t elements = 0;
     std::size_t ndim = 0;
@@ -41,9 +41,9 @@ struct tsArray : tessel::Link {
     alignas(16) std::array<std::byte, 64> smallData;
 
     tsArray() = default;
+    ~tsArray();
     tsArray(const tsArray &) = delete;
     tsArray &operator=(const tsArray &) = delete;
-    ~tsArray();
 };
 
 namespace tessel {
@@ -69,8 +69,15 @@ ArrayPointer makeCell(Dims dims);
 bool isNumericClass(tsClassID classID) noexcept;
 const char *className(tsClassID classID) noexcept;
 
-/// Puts a value into a cell or structure. Raises "TESSEL:host:badClass" or "TESSEL:host:badIndex",
-/// and then the value is still the caller's.
-void putIntoCell(tsArray &cell, std::size_t index, Array &&value);
+/// The place of a value in a cell or structure. Raises "TESSEL:host:badClass" or
+/// "TESSEL:host:badIndex".
+Array &placeInCell(tsArray &cell, std::size_t index);
+
+/// Puts a value into such a place.
+void putIntoCell(tsArray &cell, Array &place, Array &&value) noexcept;
+
+inline tsArray &arrayOf(Link &link) noexcept {
+    return static_cast<tsArray &>(link);
+}
 
 } // namespace tessel

@@ -18,7 +18,6 @@ namespace {
 
 std::atomic<bool> checkedMode = false;
 
-constexpr std::size_t alignment = 64;
 constexpr std::size_t guardSize = 64;
 constexpr unsigned char guardByte = 0xA7;
 constexpr unsigned char undefinedByte = 0xC5;
@@ -28,14 +27,14 @@ constexpr unsigned char undefinedByte = 0xC5;
 constexpr std::size_t hugePage = std::size_t{2} << 20U;
 
 /// What stands before the data of each block. The front guard is next to the data.
-struct alignas(alignment) Header : Link {
+struct Header : Link {
     std::size_t bytes;
     void *mapping;           ///< the start of the block's own mapping; nullptr for the heap's
     std::size_t mappingSize; ///< its size
     bool guarded;
-    alignas(guardSize) unsigned char frontGuard[guardSize];
+    alignas(std::max_align_t) unsigned char frontGuard[guardSize];
 };
-static_assert(sizeof(Header) % alignment == 0);
+static_assert(sizeof(Header) % alignof(std::max_align_t) == 0);
 
 constexpr std::size_t overhead = sizeof(Header) + guardSize;
 
@@ -58,15 +57,14 @@ Header *mapBlock(std::size_t total) noexcept {
     const std::size_t skip = (hugePage - start % hugePage) % hugePage;
     unsigned char *const aligned = static_cast<unsigned char *>(mapping) + skip;
     madvise(aligned, total, MADV_HUGEPAGE); // advice: without it the block is as good, and slower
-    auto *const header = new (aligned) Header{};
+    auto *const header = new (aligned) Header;
     header->mapping = mapping;
     header->mappingSize = size;
     return header;
 }
 
 Header *heapBlock(std::size_t total, Fill fill) noexcept {
-    const std::size_t size = (total + alignment - 1) / alignment * alignment;
-    void *const memory = std::aligned_alloc(alignment, size);
+    void *const memory = std::malloc(total);
     if (memory == nullptr) {
         return nullptr;
     }

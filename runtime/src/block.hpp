@@ -7,9 +7,9 @@ namespace tessel {
 
 enum class Fill { none, zero };
 
-/// Memory for `bytes` bytes, aligned to 64; nullptr where there is none. Large blocks are mapped so
-/// that the kernel can back them with huge pages. In checked mode the block has guard bytes before
-/// and behind it, and a block without fill holds a pattern.
+/// Memory for `bytes` bytes, aligned for every type; nullptr where there is none. Large blocks are
+/// mapped so that the kernel can back them with huge pages. In checked mode the block has guard
+/// bytes before and behind it, and a block without fill holds a pattern.
 void *allocateBlock(std::size_t bytes, Fill fill) noexcept;
 
 /// Gives a block back.
@@ -22,6 +22,11 @@ bool guardsAreIntact(const void *block) noexcept;
 struct Link {
     Link *previous = this;
     Link *next = this;
+
+    Link() = default;
+    ~Link() = default;
+    Link(const Link &) = delete; // its neighbours know its place
+    Link &operator=(const Link &) = delete;
 
     [[nodiscard]] bool alone() const noexcept { return next == this; }
     void insertBefore(Link &other) noexcept;

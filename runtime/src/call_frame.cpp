@@ -12,10 +12,6 @@ namespace {
 // the host.
 thread_local CallFrame *currentFrame = nullptr;
 
-tsArray &arrayOf(Link &link) noexcept {
-    return static_cast<tsArray &>(link);
-}
-
 std::size_t count(const Link &ring) noexcept {
     std::size_t n = 0;
     for (const Link *at = ring.next; at != &ring; at = at->next) {
@@ -50,6 +46,9 @@ constexpr const char *freeFault = "it freed memory that was not the call's, or f
 
 CallFrame::CallFrame(const CallOptions &options) noexcept
     : failAllocation(options.failAllocation), report(options.report) {
+    if (report != nullptr) {
+        *report = {};
+    }
     currentFrame = this;
 }
 
@@ -57,13 +56,15 @@ CallFrame::~CallFrame() {
     if (report != nullptr) {
         report->allocations = allocations;
     }
-    while (!arrays.alone()) {
-        delete &arrayOf(*arrays.next); // takes itself out of the ring
+    for (Link *at = arrays.next; at != &arrays;) {
+        tsArray *const array = &arrayOf(*at);
+        at = at->next;
+        delete array;
     }
-    while (!blocks.alone()) {
-        Link &link = *blocks.next;
-        link.remove();
-        freeBlock(blockOf(link));
+    for (Link *at = blocks.next; at != &blocks;) {
+        void *const block = blockOf(*at);
+        at = at->next;
+        freeBlock(block);
     }
     currentFrame = nullptr;
 }
@@ -85,8 +86,20 @@ tsArray *CallFrame::own(ArrayPointer array) noexcept {
     return array.release();
 }
 
+/// In checked mode the array is looked for, since a module may hand out one that is no more.
+bool CallFrame::owns(const tsArray *array) const noexcept {
+    if (!isChecked()) {
+        return array->frame == this;
+    }
+    const Link *at = arrays.next;
+    while (at != &arrays && at != array) {
+        at = at->next;
+    }
+    return at != &arrays;
+}
+
 Array CallFrame::give(tsArray *array) {
-    if (array->frame != this) {
+    if (!owns(array)) {
         raise(host_errors::badOwner);
     }
     if (!guardsAreIntact(*array)) {
@@ -97,10 +110,21 @@ Array CallFrame::give(tsArray *array) {
     return Array::adopt(array);
 }
 
+void CallFrame::giveToCell(tsArray &cell, std::size_t index, tsArray *array) {
+    const tsArray *outermost = &cell;
+    while (outermost->holder != nullptr) {
+        outermost = outermost->holder;
+    }
+    if (outermost == array || !owns(outermost)) { // no cell is within itself, and no input changes
+        raise(host_errors::badOwner);
+    }
+    Array &place = placeInCell(cell, index);
+    putIntoCell(cell, place, array == nullptr ? Array() : give(array));
+}
+
 void *CallFrame::allocate(std::size_t bytes, Fill fill) noexcept {
     void *const block = allocateBlock(bytes, fill);
     if (block != nullptr) {
-        new (&linkOf(block)) Link;
         linkOf(block).insertBefore(blocks);
     }
     return block;

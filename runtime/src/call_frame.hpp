@@ -36,6 +36,10 @@ class CallFrame {
     /// Takes an array out of the frame. Error "TESSEL:host:badOwner" if it is not in it.
     Array give(tsArray *array);
 
+    /// Gives an array, or none, to a cell of the frame's. Raises what `give` and `placeInCell` do,
+    /// and then the frame has the array still.
+    void giveToCell(tsArray &cell, std::size_t index, tsArray *array);
+
     /// A block of the frame's own; nullptr where there is no memory.
     void *allocate(std::size_t bytes, Fill fill) noexcept;
 
@@ -55,6 +59,7 @@ class CallFrame {
         std::uint64_t sum;
     };
 
+    [[nodiscard]] bool owns(const tsArray *array) const noexcept;
     void note(const char *what) noexcept;
 
     Link blocks;

@@ -3,6 +3,7 @@
 
 #include "tessel/runtime/error.hpp"
 
+#include <new>
 #include <string>
 #include <string_view>
 
@@ -23,10 +24,12 @@ inline constexpr HostError
     badDimensions      = {"TESSEL:host:badDimensions",      "An array needs at least one dimension."},
     badClass           = {"TESSEL:host:badClass",           "The class of the array is not one that this works with."},
     badIndex           = {"TESSEL:host:badIndex",           "The index is beyond the end of the array."},
-    badOwner           = {"TESSEL:host:badOwner",           "The array is not the call's to give: it is an input, or has been given before."},
+    badOwner           = {"TESSEL:host:badOwner",           "The array is not the call's own: it is an input, or has been given away before."},
     noCall             = {"TESSEL:host:noCall",             "The function is for a module that is being called."},
     nestedCall         = {"TESSEL:host:nestedCall",         "A module cannot be called from within a call."},
-    tooManyOutputs     = {"TESSEL:host:tooManyOutputs",     "A call has at most 16 outputs."},
+    badOutputCount     = {"TESSEL:host:badOutputCount",     "A call has 0 to 16 outputs."},
+    tooManyInputs      = {"TESSEL:host:tooManyInputs",      "The call has too many inputs."},
+    missingInput       = {"TESSEL:host:missingInput",       "An input of the call is not there."},
     foreignException   = {"TESSEL:host:foreignException",   "An exception that is not the host's left the module"},
     violation          = {"TESSEL:host:violation",          "The module broke a promise"},
     moduleNotFound     = {"TESSEL:host:moduleNotFound",     "there is no such file; looked for a shared object that exports tsxFunction"},
@@ -40,8 +43,20 @@ inline constexpr HostError
     throw Error(error.identifier, error.message);
 }
 
+/// What `make` makes, or the host's error instead of the standard library's exception.
+template <class Make>
+auto orOutOfMemory(const Make &make) {
+    try {
+        return make();
+    } catch (const std::bad_alloc &) {
+        raise(host_errors::outOfMemory);
+    }
+}
+
 [[noreturn]] inline void raise(const HostError &error, std::string_view detail) {
-    throw Error(error.identifier, std::string(error.message) + ": " + std::string(detail));
+    throw Error(error.identifier, orOutOfMemory([&] {
+                    return std::string(error.message) + ": " + std::string(detail);
+                }));
 }
 
 } // namespace tessel

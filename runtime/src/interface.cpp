@@ -23,6 +23,26 @@ CallFrame &admitted() {
     return frame;
 }
 
+/// A new array of the call's own.
+template <class Make>
+tsArray *created(const Make &make) {
+    CallFrame &frame = admitted();
+    return frame.own(orOutOfMemory(make));
+}
+
+std::string formatted(const char *format, va_list arguments) {
+    va_list again;
+    va_copy(again, arguments);
+    const int length = std::vsnprintf(nullptr, 0, format, again);
+    va_end(again);
+    if (length < 0) {
+        return format; // which cannot be formatted, and tells more than nothing
+    }
+    std::string text(static_cast<std::size_t>(length), '\0');
+    std::vsnprintf(text.data(), text.size() + 1, format, arguments);
+    return text;
+}
+
 } // namespace
 
 tsClassID tsGetClassID(const tsArray *array) {
@@ -57,41 +77,35 @@ bool tsIsNaN(double value) {
 }
 
 tsArray *tsCreateDoubleScalar(double value) {
-    constexpr std::array<std::size_t, 2> dims = {1, 1};
-    CallFrame &frame = admitted();
-    ArrayPointer array = makeArray(tsDOUBLE, dims, Fill::none);
-    *static_cast<double *>(array->data) = value;
-    return frame.own(std::move(array));
+    return created([&] {
+        constexpr std::array<std::size_t, 2> dims = {1, 1};
+        ArrayPointer array = makeArray(tsDOUBLE, dims, Fill::none);
+        *static_cast<double *>(array->data) = value;
+        return array;
+    });
 }
 
 tsArray *tsCreateString(const char *text) {
-    CallFrame &frame = admitted();
-    return frame.own(makeText(text));
+    return created([&] { return makeText(text); });
 }
 
 tsArray *tsCreateUninitNumericArray(size_t ndim, const size_t *dims, tsClassID classID) {
     if (!isNumericClass(classID)) {
         raise(host_errors::badClass);
     }
-    CallFrame &frame = admitted();
-    return frame.own(makeArray(classID, {dims, ndim}, Fill::none));
+    return created([&] { return makeArray(classID, {dims, ndim}, Fill::none); });
 }
 
 tsArray *tsCreateCharArray(size_t ndim, const size_t *dims) {
-    CallFrame &frame = admitted();
-    return frame.own(makeArray(tsCHAR, {dims, ndim}, Fill::zero));
+    return created([&] { return makeArray(tsCHAR, {dims, ndim}, Fill::zero); });
 }
 
 tsArray *tsCreateCellArray(size_t ndim, const size_t *dims) {
-    CallFrame &frame = admitted();
-    return frame.own(makeCell({dims, ndim}));
+    return created([&] { return makeCell({dims, ndim}); });
 }
 
 void tsSetCell(tsArray *cell, size_t index, tsArray *value) {
-    if (cell == value) {
-        raise(host_errors::badOwner);
-    }
-    putIntoCell(*cell, index, value == nullptr ? Array() : CallFrame::wanted().give(value));
+    CallFrame::wanted().giveToCell(*cell, index, value);
 }
 
 void *tsCalloc(size_t count, size_t size) {
@@ -129,12 +143,7 @@ char *tsArrayToString(const tsArray *array) {
 void tsxErrMsgIdAndTxt(const char *identifier, const char *format, ...) {
     va_list arguments;
     va_start(arguments, format);
-    va_list again;
-    va_copy(again, arguments);
-    const int length = std::vsnprintf(nullptr, 0, format, arguments);
+    const std::string message = orOutOfMemory([&] { return formatted(format, arguments); });
     va_end(arguments);
-    std::string message(length < 0 ? 0 : static_cast<std::size_t>(length), '\0');
-    std::vsnprintf(message.data(), message.size() + 1, format, again);
-    va_end(again);
     throw Error(identifier, message);
 }

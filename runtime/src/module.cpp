@@ -8,7 +8,9 @@
 #include <cxxabi.h>
 #include <dlfcn.h>
 
+#include <algorithm>
 #include <cstdlib>
+#include <limits>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -25,9 +27,13 @@ constexpr const char *moduleFolder = "tessel";
 constexpr const char *pathVariable = "TESSEL_MODULE_PATH";
 
 /// One lock for all calls of the process: what a module stands on may be shared with another one.
-std::mutex &callLock() {
-    static std::mutex lock;
-    return lock;
+/// Loading and unloading take it too, since they run the initialisers of both.
+constinit std::mutex callLock;
+
+/// The lock, unless the thread is within a call and has it already.
+std::unique_lock<std::mutex> serialised() {
+    return CallFrame::current() == nullptr ? std::unique_lock(callLock)
+                                           : std::unique_lock<std::mutex>();
 }
 
 [[noreturn]] void raiseLoadError(const HostError &error, const std::string &name,
@@ -47,6 +53,13 @@ std::filesystem::path ownFile() {
     }
     return info.dli_fname;
 }
+
+/// Its folder, found when the host is loaded: the name that it was loaded by may be relative to the
+/// current folder of that time. Never destroyed, because threads may outlive the end of main.
+const std::filesystem::path &ownFolder = *[] {
+    std::error_code ignored;
+    return new const auto(std::filesystem::absolute(ownFile(), ignored).parent_path());
+}();
 
 /// Makes the host's functions visible to modules also when this library was loaded privately, as by
 /// an interpreter. Where it is linked into the program there is nothing to do, and the call fails.
@@ -69,8 +82,7 @@ std::vector<std::filesystem::path> searchFolders() {
             rest.remove_prefix(std::min(end + 1, rest.size()));
         }
     }
-    const std::filesystem::path own = std::filesystem::absolute(ownFile());
-    folders.push_back(own.parent_path() / moduleFolder);
+    folders.push_back(ownFolder / moduleFolder);
     return folders;
 }
 
@@ -102,6 +114,7 @@ struct Module::Loaded {
             raiseLoadError(host_errors::moduleNotFound, file.string());
         }
         showOwnFunctions();
+        const std::unique_lock lock = serialised();
         handle = dlopen(std::filesystem::absolute(file).c_str(), RTLD_NOW | RTLD_LOCAL);
         if (handle == nullptr) {
             const char *const reason = dlerror();
@@ -113,7 +126,10 @@ struct Module::Loaded {
             raiseLoadError(host_errors::noEntryPoint, file.string());
         }
     }
-    ~Loaded() { dlclose(handle); }
+    ~Loaded() {
+        const std::unique_lock lock = serialised();
+        dlclose(handle);
+    }
     Loaded(const Loaded &) = delete;
     Loaded &operator=(const Loaded &) = delete;
 
@@ -122,19 +138,24 @@ struct Module::Loaded {
     EntryPoint *entryPoint = nullptr;
 };
 
-Module::Module(const std::filesystem::path &file) : loaded(std::make_shared<const Loaded>(file)) {}
+Module::Module(const std::filesystem::path &file)
+    : loaded(orOutOfMemory([&] { return std::make_shared<const Loaded>(file); })) {}
 
 Module Module::find(std::string_view name) {
+    const std::string wanted = std::string(name) + moduleSuffix;
+    if (name.find_first_of(std::string_view("/\0", 2)) != std::string_view::npos) {
+        raiseLoadError(host_errors::moduleNotFound, wanted, "a module's name has no folder in it");
+    }
     std::string searched;
     for (const std::filesystem::path &folder : searchFolders()) {
-        const std::filesystem::path file = folder / (std::string(name) + moduleSuffix);
+        const std::filesystem::path file = folder / wanted;
         std::error_code ignored;
         if (std::filesystem::exists(file, ignored)) {
             return Module(file);
         }
         searched += (searched.empty() ? "searched " : ", ") + folder.string();
     }
-    raiseLoadError(host_errors::moduleNotFound, std::string(name) + moduleSuffix, searched);
+    raiseLoadError(host_errors::moduleNotFound, wanted, searched);
 }
 
 const std::filesystem::path &Module::file() const noexcept {
@@ -145,15 +166,21 @@ Results Module::call(std::span<const tsArray *> inputs, const CallOptions &optio
     if (CallFrame::current() != nullptr) {
         raise(host_errors::nestedCall);
     }
-    if (options.outputs > static_cast<int>(Results::slots)) {
-        raise(host_errors::tooManyOutputs);
+    if (options.outputs < 0 || options.outputs > static_cast<int>(Results::slots)) {
+        raise(host_errors::badOutputCount);
     }
-    const std::lock_guard serialised(callLock());
+    if (inputs.size() > static_cast<std::size_t>(std::numeric_limits<int>::max())) {
+        raise(host_errors::tooManyInputs);
+    }
+    if (std::find(inputs.begin(), inputs.end(), nullptr) != inputs.end()) {
+        raise(host_errors::missingInput);
+    }
+    const std::lock_guard lock(callLock);
     Results results;
     CallFrame frame(options);
-    frame.watch(inputs);
     std::array<tsArray *, Results::slots> slots{};
     const auto run = [&] {
+        frame.watch(inputs);
         loaded->entryPoint(options.outputs, slots.data(), static_cast<int>(inputs.size()),
                            inputs.data());
         for (std::size_t i = 0; i < slots.size(); ++i) {

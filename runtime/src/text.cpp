@@ -1,8 +1,9 @@
 // runtime/src/text.cpp: between UTF-16, which host characters are, and UTF-8.
 #include "text.hpp"
 
+#include <algorithm>
 #include <array>
-#include <cstdint>
+#include <vector>
 
 namespace tessel {
 namespace {
@@ -89,10 +90,20 @@ const Form &formOf(char32_t character) noexcept {
     return forms[i];
 }
 
+/// How many ASCII characters a text begins with. They are the same in both forms, and most texts
+/// have no others.
+template <class Text>
+std::size_t asciiLength(const Text &text) noexcept {
+    const auto isAscii = [](auto unit) { return (unit & ~0x7F) == 0; };
+    const auto end = std::find_if_not(text.begin(), text.end(), isAscii);
+    return static_cast<std::size_t>(end - text.begin());
+}
+
 } // namespace
 
 std::size_t utf16Length(std::string_view utf8) noexcept {
-    std::size_t length = 0;
+    std::size_t length = asciiLength(utf8);
+    utf8.remove_prefix(length);
     while (!utf8.empty()) {
         const Read read = readUtf8(utf8);
         length += read.character >= firstSupplementary ? 2 : 1;
@@ -102,6 +113,9 @@ std::size_t utf16Length(std::string_view utf8) noexcept {
 }
 
 void writeUtf16(std::string_view utf8, tsChar *out) noexcept {
+    const std::size_t ascii = asciiLength(utf8);
+    out = std::copy_n(utf8.begin(), ascii, out);
+    utf8.remove_prefix(ascii);
     while (!utf8.empty()) {
         const Read read = readUtf8(utf8);
         if (read.character >= firstSupplementary) {
@@ -116,7 +130,8 @@ void writeUtf16(std::string_view utf8, tsChar *out) noexcept {
 }
 
 std::size_t utf8Length(std::span<const tsChar> utf16) noexcept {
-    std::size_t length = 0;
+    std::size_t length = asciiLength(utf16);
+    utf16 = utf16.subspan(length);
     while (!utf16.empty()) {
         const Read read = readUtf16(utf16);
         length += formOf(read.character).bytes;
@@ -126,6 +141,10 @@ std::size_t utf8Length(std::span<const tsChar> utf16) noexcept {
 }
 
 void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept {
+    const std::size_t ascii = asciiLength(utf16);
+    out = std::transform(utf16.begin(), utf16.begin() + static_cast<std::ptrdiff_t>(ascii), out,
+                         [](tsChar unit) { return static_cast<char>(unit); });
+    utf16 = utf16.subspan(ascii);
     while (!utf16.empty()) {
         const Read read = readUtf16(utf16);
         const Form &form = formOf(read.character);
@@ -137,6 +156,14 @@ void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept {
         out += form.bytes;
         utf16 = utf16.subspan(read.units);
     }
+}
+
+std::string validUtf8(std::string_view text) {
+    std::vector<tsChar> characters(utf16Length(text));
+    writeUtf16(text, characters.data());
+    std::string valid(utf8Length(characters), '\0');
+    writeUtf8(characters, valid.data());
+    return valid;
 }
 
 } // namespace tessel

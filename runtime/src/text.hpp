@@ -5,6 +5,7 @@
 
 #include <cstddef>
 #include <span>
+#include <string>
 #include <string_view>
 
 namespace tessel {
@@ -22,5 +23,8 @@ std::size_t utf8Length(std::span<const tsChar> utf16) noexcept;
 
 /// Writes them, without a terminator.
 void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept;
+
+/// The text, with every byte that is not part of valid UTF-8 made the character of the same code.
+std::string validUtf8(std::string_view text);
 
 } // namespace tessel

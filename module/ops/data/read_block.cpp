@@ -10,7 +10,6 @@
 #include <netcdf.h>
 
 #include <array>
-#include <vector>
 
 namespace tessel::netcdf {
 namespace {
@@ -71,9 +70,9 @@ void readVaraHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prh
     checkLength(start, ndims, catalogue::getVaraStartLength);
     checkLength(count, ndims, catalogue::getVaraCountLength);
 
-    const std::vector<std::size_t> dims = resultShape(count);
+    const IndexVector dims = resultShape(count);
     const int status = withMember(getVara, entry, [&]<class T>(GetVara<T> *get) {
-        return readBlock<T>(plhs[0], dims, text, entry, [&](T *data) {
+        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, text, entry, [&](T *data) {
             return get(ncid, varid, start.data(), count.data(), data);
         });
     });

@@ -9,8 +9,6 @@
 
 #include <netcdf.h>
 
-#include <vector>
-
 namespace tessel::netcdf {
 namespace {
 
@@ -48,9 +46,9 @@ void readVarsHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prh
     // name.
     dimensionIDs(ncid, varid, ndims, catalogue::getVarsDimids);
 
-    const std::vector<std::size_t> dims = resultShape(count);
+    const IndexVector dims = resultShape(count);
     const int status = withMember(getVars, entry, [&]<class T>(GetVars<T> *get) {
-        return readBlock<T>(plhs[0], dims, text, entry, [&](T *data) {
+        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, text, entry, [&](T *data) {
             return get(ncid, varid, start.data(), count.data(), stride.data(), data);
         });
     });

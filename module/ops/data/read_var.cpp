@@ -9,7 +9,6 @@
 #include <netcdf.h>
 
 #include <cstdint>
-#include <vector>
 
 namespace tessel::netcdf {
 namespace {
@@ -33,10 +32,10 @@ std::size_t countedIn32Bits(std::size_t n) {
 constexpr TextBlock text = {1, countedIn32Bits};
 
 /// The lengths of a variable's dimensions now, in library order.
-std::vector<std::size_t> currentLengths(int ncid, int varid) {
+IndexVector currentLengths(int ncid, int varid) {
     const std::size_t ndims = numberOfDimensions(ncid, varid, catalogue::getVarNumDims);
-    const std::vector<int> dimids = dimensionIDs(ncid, varid, ndims, catalogue::getVarDimids);
-    std::vector<std::size_t> lengths(ndims);
+    const DimensionVector<int> dimids = dimensionIDs(ncid, varid, ndims, catalogue::getVarDimids);
+    IndexVector lengths(ndims);
     for (std::size_t i = 0; i < ndims; ++i) {
         check(nc_inq_dimlen(ncid, dimids[i], &lengths[i]), catalogue::getVarDimLen);
     }
@@ -50,10 +49,10 @@ void readVarHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs
     checkCount(catalogue::getVar, nrhs, entry);
     const int ncid = unpackID(prhs[1], "ncid");
     const int varid = unpackID(prhs[2], "varid");
-    const std::vector<std::size_t> dims = resultShape(currentLengths(ncid, varid));
+    const IndexVector dims = resultShape(currentLengths(ncid, varid));
 
     const int status = withMember(getVar, entry, [&]<class T>(GetVar<T> *get) {
-        return readBlock<T>(plhs[0], dims, text, entry,
+        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, text, entry,
                             [&](T *data) { return get(ncid, varid, data); });
     });
     check(status, catalogue::getVar.failure);

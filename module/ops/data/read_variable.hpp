@@ -3,10 +3,10 @@
 #pragma once
 
 #include "call/failure.hpp"
+#include "convert/index_vector.hpp"
 
 #include <algorithm>
 #include <cstddef>
-#include <vector>
 
 namespace tessel::netcdf {
 
@@ -20,8 +20,8 @@ std::size_t numberOfDimensions(int ncid, int varid, const Failure &failure) {
 
 /// The variable's dimension ids, in library order.
 template <class Failure>
-std::vector<int> dimensionIDs(int ncid, int varid, std::size_t ndims, const Failure &failure) {
-    std::vector<int> dimids(ndims);
+DimensionVector<int> dimensionIDs(int ncid, int varid, std::size_t ndims, const Failure &failure) {
+    DimensionVector<int> dimids(ndims);
     check(nc_inq_vardimid(ncid, varid, dimids.data()), failure);
     return dimids;
 }
@@ -38,8 +38,8 @@ void checkLength(const Vector &vector, std::size_t ndims, const Error<> &mismatc
 /// first): the lengths reversed, and as many ones as make them two. No lengths give 1-by-1, one
 /// length L gives an L-by-1 column, (T, Y, X) gives X-by-Y-by-T. Read in the order in which the
 /// library fills it, such an array holds the block without any element being moved.
-inline std::vector<std::size_t> resultShape(const std::vector<std::size_t> &lengths) {
-    std::vector<std::size_t> dims(std::max<std::size_t>(lengths.size(), 2), 1);
+inline IndexVector resultShape(const IndexVector &lengths) {
+    IndexVector dims(std::max<std::size_t>(lengths.size(), 2), 1);
     std::reverse_copy(lengths.begin(), lengths.end(), dims.begin());
     return dims;
 }

@@ -109,7 +109,7 @@ class Array {
 
   private:
     struct Destroy {
-        void operator()(tsArray *array) const noexcept;
+        void operator()(tsArray *owned) const noexcept;
     };
 
     explicit Array(tsArray *owned) noexcept : array(owned) {}

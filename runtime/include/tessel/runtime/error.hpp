@@ -9,10 +9,15 @@
 namespace tessel {
 
 /// A host error: what a module raised, or what the host itself refused. The host's own identifiers
-/// begin with "TESSEL:host:". Cheap to copy, and copying does not throw.
+/// begin with "TESSEL:host:". Both texts are valid UTF-8: a byte that is not becomes the character
+/// of the same code. Cheap to copy, and neither making nor copying one throws: where there is no
+/// memory for the texts, the error is "TESSEL:host:outOfMemory".
 class Error : public std::exception {
   public:
-    Error(std::string_view identifier, std::string_view message);
+    Error(std::string_view identifier, std::string_view message) noexcept;
+    Error(const Error &) noexcept = default; // and no move, which would leave one without texts
+    Error &operator=(const Error &) noexcept = default;
+    ~Error() override;
 
     /// Colon-separated, made for programs ("TESSEL:netcdf:open:noSuchFileOrDirectory").
     [[nodiscard]] const std::string &identifier() const noexcept { return texts->identifier; }
@@ -28,6 +33,7 @@ class Error : public std::exception {
         std::string identifier;
         std::string message;
     };
+    static const std::shared_ptr<const Texts> &spareTexts;
     std::shared_ptr<const Texts> texts;
 };
 

@@ -63,8 +63,8 @@ class Argument {
 
 /// A loaded module. Copies share it; it is unloaded with the last one.
 ///
-/// Any thread may call any module at any time: all calls of the process into modules run one after
-/// the other, because modules may share a library that is not thread-safe.
+/// Any thread may load, call and unload any module at any time: all of it happens one after the
+/// other in a process, because modules may share a library that is not thread-safe.
 class Module {
   public:
     /// Loads a module file. Error "TESSEL:host:moduleNotFound" when there is no such file,
@@ -75,7 +75,7 @@ class Module {
     /// Loads a module by name ("netcdf"): NAME.tsx in the first folder that has it of those in the
     /// variable TESSEL_MODULE_PATH (colon-separated, absolute) and of the folder "tessel" beside
     /// the library or program that this host is part of. The current folder is not searched. Error
-    /// "TESSEL:host:moduleNotFound" names the folders.
+    /// "TESSEL:host:moduleNotFound" names the folders. A name has no "/" in it.
     static Module find(std::string_view name);
 
     [[nodiscard]] const std::filesystem::path &file() const noexcept;
@@ -83,8 +83,9 @@ class Module {
     /// One call. The inputs are alive until it returns; their data are not copied. Raises Error
     /// with what the module raised, or with the host's own "TESSEL:host:outOfMemory",
     /// "TESSEL:host:foreignException" (an exception of another type left the module),
-    /// "TESSEL:host:nestedCall" (called from within a call), and in checked mode
-    /// "TESSEL:host:violation" (the module broke a promise; the message says which).
+    /// "TESSEL:host:nestedCall" (called from within a call), "TESSEL:host:badOutputCount",
+    /// "TESSEL:host:tooManyInputs", "TESSEL:host:missingInput" (an input is nullptr), and in
+    /// checked mode "TESSEL:host:violation" (the module broke a promise; the message says which).
     Results call(std::span<const tsArray *> inputs, const CallOptions &options = {}) const;
 
     /// One call with arguments as they are at hand: netcdf("open", path, "NOWRITE").

@@ -1,0 +1,101 @@
+// bench/calls.cpp: what a call through the module costs more than the library's own function.
+//
+// The file is made in a temporary folder: a variable of 256 MiB in the 64-bit-offset format.
+#include "pairs.hpp"
+#include "tessel/runtime.hpp"
+
+#include <netcdf.h>
+
+#include <array>
+#include <cstdio>
+#include <vector>
+
+namespace {
+
+using namespace tessel;
+using bench::check;
+using bench::Pair;
+
+constexpr std::size_t largeBytes = std::size_t{256} << 20U;
+constexpr std::size_t largeElements = largeBytes / sizeof(double);
+constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / (1024 * 512)};
+constexpr const char *dimension = "time";
+
+/// The dataset, open for reading.
+class Dataset {
+  public:
+    Dataset() {
+        const std::string file = folder.file("large.nc");
+        int writing = 0;
+        check(nc_create(file.c_str(), NC_64BIT_OFFSET, &writing));
+        std::array<int, 3> dims{};
+        check(nc_def_dim(writing, "lon", hostDims[0], &dims[2]));
+        check(nc_def_dim(writing, "lat", hostDims[1], &dims[1]));
+        check(nc_def_dim(writing, dimension, hostDims[2], dims.data()));
+        check(nc_def_var(writing, "large", NC_DOUBLE, 3, dims.data(), &varid));
+        check(nc_enddef(writing));
+        std::vector<double> values(largeElements);
+        for (std::size_t i = 0; i < values.size(); ++i) {
+            values[i] = static_cast<double>(i);
+        }
+        check(nc_put_var_double(writing, varid, values.data()));
+        check(nc_close(writing));
+        check(nc_open(file.c_str(), NC_NOWRITE, &ncid));
+    }
+    ~Dataset() { nc_close(ncid); }
+    Dataset(const Dataset &) = delete;
+    Dataset &operator=(const Dataset &) = delete;
+
+    int ncid = -1;
+    int varid = -1;
+
+  private:
+    bench::TemporaryFolder folder;
+};
+
+std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
+    const auto direct = [&data] {
+        int dimid = 0;
+        check(nc_inq_dimid(data.ncid, dimension, &dimid));
+        benchmark::DoNotOptimize(dimid);
+    };
+    // The inputs are host arrays already, as they are for a program in the host.
+    const auto arrays = [&netcdf, operation = std::make_shared<Array>(Array::text("inq_dimid")),
+                         ncid = std::make_shared<Array>(Array::scalar(data.ncid)),
+                         name = std::make_shared<Array>(Array::text(dimension))] {
+        std::array<const tsArray *, 3> inputs = {operation->get(), ncid->get(), name->get()};
+        const Results results = netcdf.call(inputs);
+        benchmark::DoNotOptimize(results[0].number());
+    };
+    // The comfortable form, which makes the input arrays as well.
+    const auto values = [&] {
+        const Results results = netcdf("inq_dimid", data.ncid, dimension);
+        benchmark::DoNotOptimize(results[0].number());
+    };
+    // Into an array of the host's, so that the memory is of the same kind.
+    const auto readDirect = [&data] {
+        const Array array = Array::numeric(tsDOUBLE, hostDims);
+        check(nc_get_var_double(data.ncid, data.varid, static_cast<double *>(array.data())));
+        benchmark::DoNotOptimize(array.data());
+    };
+    const auto read = [&] {
+        const Results results = netcdf("get_var_double", data.ncid, data.varid);
+        benchmark::DoNotOptimize(results[0].data());
+    };
+    return {
+        {"inq_dimid, inputs at hand", direct, arrays},
+        {                           "inq_dimid, inputs made",                     direct, values      },
+        { "get_var_double of 256 MiB",                       readDirect,                         read,       true},
+    };
+}
+
+} // namespace
+
+int main(int argc, char **argv) try {
+    const Module netcdf(TESSEL_NETCDF_MODULE);
+    const Dataset data;
+    return bench::measure(argc, argv, "bench_calls", pairsOf(netcdf, data));
+} catch (const std::exception &error) {
+    std::fprintf(stderr, "bench_calls: %s\n", error.what());
+    return 1;
+}

@@ -1,0 +1,338 @@
+// bench/families.cpp: every typed family through the module, beside the library's own functions.
+//
+// One element a call, and blocks of 64 MiB. A block is read into new memory on both sides, of the
+// kind that the host gives out; text is read by the library into bytes.
+#include "pairs.hpp"
+#include "tessel/runtime.hpp"
+
+#include <netcdf.h>
+
+#include <array>
+#include <cstdio>
+#include <string>
+#include <vector>
+
+namespace {
+
+using namespace tessel;
+using bench::check;
+using bench::Pair;
+
+constexpr std::size_t blockBytes = std::size_t{64} << 20U;
+constexpr std::size_t columns = 1024;
+constexpr std::ptrdiff_t step = 2; // of the strided blocks, along the fastest dimension
+
+/// A memory type: what the module calls it, and the library's functions for it.
+template <class T>
+struct Library {
+    const char *suffix;
+    nc_type external;
+    tsClassID hostClass;
+    int (*getVar)(int, int, T *);
+    int (*getVar1)(int, int, const std::size_t *, T *);
+    int (*getVara)(int, int, const std::size_t *, const std::size_t *, T *);
+    int (*getVars)(int, int, const std::size_t *, const std::size_t *, const std::ptrdiff_t *, T *);
+    int (*getAtt)(int, int, const char *, T *);
+    int (*putVar)(int, int, const T *);
+    int (*putVar1)(int, int, const std::size_t *, const T *);
+    int (*putVara)(int, int, const std::size_t *, const std::size_t *, const T *);
+    int (*putVars)(int, int, const std::size_t *, const std::size_t *, const std::ptrdiff_t *,
+                   const T *);
+    int (*putAtt)(int, int, const char *, nc_type, std::size_t, const T *);
+};
+
+constexpr Library<double> doubles = {"double",           NC_DOUBLE,          tsDOUBLE,
+                                     nc_get_var_double,  nc_get_var1_double, nc_get_vara_double,
+                                     nc_get_vars_double, nc_get_att_double,  nc_put_var_double,
+                                     nc_put_var1_double, nc_put_vara_double, nc_put_vars_double,
+                                     nc_put_att_double};
+constexpr Library<float> floats = {
+    "float",           NC_FLOAT,          tsSINGLE,         nc_get_var_float, nc_get_var1_float,
+    nc_get_vara_float, nc_get_vars_float, nc_get_att_float, nc_put_var_float, nc_put_var1_float,
+    nc_put_vara_float, nc_put_vars_float, nc_put_att_float};
+constexpr Library<short> shorts = {
+    "short",           NC_SHORT,          tsINT16,          nc_get_var_short, nc_get_var1_short,
+    nc_get_vara_short, nc_get_vars_short, nc_get_att_short, nc_put_var_short, nc_put_var1_short,
+    nc_put_vara_short, nc_put_vars_short, nc_put_att_short};
+constexpr Library<char> text = {
+    "text",
+    NC_CHAR,
+    tsCHAR,
+    nc_get_var_text,
+    nc_get_var1_text,
+    nc_get_vara_text,
+    nc_get_vars_text,
+    nc_get_att_text,
+    nc_put_var_text,
+    nc_put_var1_text,
+    nc_put_vara_text,
+    nc_put_vars_text,
+    [](int ncid, int varid, const char *name, nc_type, std::size_t n, const char *values) {
+        return nc_put_att_text(ncid, varid, name, n, values);
+    }};
+
+/// The datasets that everything is measured on: one in data mode, and for the attributes, of which
+/// the blocks are large, one that stays in define mode and in memory.
+class Datasets {
+  public:
+    Datasets() {
+        check(nc_create(folder.file("data.nc").c_str(), NC_64BIT_OFFSET, &data));
+        check(nc_set_fill(data, NC_NOFILL, nullptr));
+        check(nc_create(folder.file("attributes.nc").c_str(), NC_64BIT_OFFSET, &attributes));
+    }
+    ~Datasets() {
+        nc_abort(attributes);
+        nc_close(data);
+    }
+    Datasets(const Datasets &) = delete;
+    Datasets &operator=(const Datasets &) = delete;
+
+    int data = -1;
+    int attributes = -1;
+
+  private:
+    bench::TemporaryFolder folder;
+};
+
+/// The pairs of one memory type.
+template <class T>
+class Type {
+  public:
+    Type(const Module &module, const Datasets &sets, const Library<T> &functions)
+        : netcdf(module), datasets(sets), library(functions) {
+        std::array<int, 2> dims{};
+        define("rows", rows, dims[0]);
+        define("columns", columns, dims[1]);
+        check(nc_def_var(data(), named("block").c_str(), library.external, 2, dims.data(), &block));
+        define("wide", columns * step, dims[1]);
+        check(nc_def_var(data(), named("wide").c_str(), library.external, 2, dims.data(), &wide));
+        check(nc_def_var(data(), named("one").c_str(), library.external, 0, nullptr, &one));
+        std::fill_n(values.begin(), values.size(), static_cast<T>('x'));
+        if constexpr (std::is_same_v<T, char>) {
+            hostBlock = Array::text(std::string(values.begin(), values.end()));
+            hostOne = Array::text("x");
+        } else {
+            hostBlock = Array::borrowed(library.hostClass, std::array{columns, rows}, values.data(),
+                                        nullptr);
+            hostOne = Array::borrowed(library.hostClass, std::array<std::size_t, 2>{1, 1},
+                                      values.data(), nullptr);
+        }
+    }
+
+    /// Writes what is going to be read; in data mode.
+    void fill() {
+        check(library.putVar(data(), block, values.data()));
+        check(library.putVar(data(), one, values.data()));
+        for (const std::size_t first : std::array<std::size_t, 2>{0, 1}) {
+            const std::array<std::size_t, 2> start = {0, first};
+            check(library.putVars(data(), wide, start.data(), count.data(), stride.data(),
+                                  values.data()));
+        }
+        putAttributes();
+    }
+
+    void addTo(std::vector<Pair> &pairs) {
+        addElements(pairs);
+        addBlocks(pairs);
+    }
+
+  private:
+    static constexpr std::size_t elements = blockBytes / sizeof(T);
+    static constexpr std::size_t rows = elements / columns;
+    static constexpr std::array<std::size_t, 2> origin = {0, 0};
+    static constexpr std::array<std::size_t, 2> single = {1, 1};
+    static constexpr std::array<std::size_t, 2> count = {rows, columns};
+    static constexpr std::array<std::ptrdiff_t, 2> stride = {1, step};
+
+    [[nodiscard]] int data() const { return datasets.data; }
+    [[nodiscard]] std::string named(const char *what) const {
+        return std::string(what) + "_" + library.suffix;
+    }
+    [[nodiscard]] std::string operation(const char *family) const {
+        return std::string(family) + "_" + library.suffix;
+    }
+
+    void define(const char *what, std::size_t length, int &dimid) const {
+        check(nc_def_dim(data(), named(what).c_str(), length, &dimid));
+    }
+
+    void putAttributes() const {
+        check(library.putAtt(datasets.attributes, NC_GLOBAL, named("block").c_str(),
+                             library.external, elements, values.data()));
+        check(library.putAtt(datasets.attributes, NC_GLOBAL, named("one").c_str(), library.external,
+                             1, values.data()));
+    }
+
+    /// A call of the module with arguments that are made once, as a program's loop would have them.
+    template <class... Arguments>
+    std::function<void()> call(const char *family, const Arguments &...arguments) const {
+        auto held = std::make_shared<std::vector<Array>>();
+        held->push_back(Array::text(operation(family)));
+        (held->push_back(made(arguments)), ...);
+        auto inputs = std::make_shared<std::vector<const tsArray *>>();
+        for (const Array &array : *held) {
+            inputs->push_back(array.get());
+        }
+        return [this, held, inputs] {
+            const Results results = netcdf.call(*inputs);
+            benchmark::DoNotOptimize(&results);
+        };
+    }
+
+    static Array made(int value) { return Array::scalar(value); }
+    static Array made(const std::string &value) { return Array::text(value); }
+    static Array made(const Array &lent) {
+        return Array::borrowed(lent.classID(), lent.dims(), lent.data(), nullptr);
+    }
+    /// A vector of the library's order in the host's.
+    template <class Integer>
+    static Array made(const std::array<Integer, 2> &vector) {
+        return Array::row({static_cast<double>(vector[1]), static_cast<double>(vector[0])});
+    }
+
+    /// New memory of the kind that results have, for the library to fill.
+    template <class Fill>
+    static std::function<void()> intoNew(const Fill &fill) {
+        return [fill] {
+            const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{blockBytes, 1});
+            check(fill(static_cast<T *>(memory.data())));
+        };
+    }
+
+    void addElements(std::vector<Pair> &pairs) {
+        const int put = datasets.attributes;
+        const std::string name = named("one");
+        const auto add = [&](const char *family, std::function<void()> reference,
+                             std::function<void()> module) {
+            pairs.push_back({operation(family) + "/one", std::move(reference), std::move(module)});
+        };
+        const auto intoValue = [](const auto &fill) {
+            return [fill] {
+                T value{};
+                check(fill(&value));
+                benchmark::DoNotOptimize(value);
+            };
+        };
+        const auto from = [](const auto &write) { return [write] { check(write()); }; };
+        const Library<T> &f = library;
+        const T *const value = values.data();
+        const int ncid = data();
+        add("get_var", intoValue([=, this](T *to) { return f.getVar(ncid, one, to); }),
+            call("get_var", ncid, one));
+        add("get_var1",
+            intoValue([=, this](T *to) { return f.getVar1(ncid, block, origin.data(), to); }),
+            call("get_var1", ncid, block, origin));
+        add("get_vara", intoValue([=, this](T *to) {
+                return f.getVara(ncid, block, origin.data(), single.data(), to);
+            }),
+            call("get_vara", ncid, block, origin, single));
+        add("get_vars", intoValue([=, this](T *to) {
+                return f.getVars(ncid, wide, origin.data(), single.data(), stride.data(), to);
+            }),
+            call("get_vars", ncid, wide, origin, single, stride));
+        add("get_att", intoValue([=](T *to) { return f.getAtt(put, NC_GLOBAL, name.c_str(), to); }),
+            call("get_att", put, NC_GLOBAL, name));
+        add("put_var", from([=, this] { return f.putVar(ncid, one, value); }),
+            call("put_var", ncid, one, hostOne));
+        add("put_var1", from([=, this] { return f.putVar1(ncid, block, origin.data(), value); }),
+            call("put_var1", ncid, block, origin, hostOne));
+        add("put_vara",
+            from([=, this] { return f.putVara(ncid, block, origin.data(), single.data(), value); }),
+            call("put_vara", ncid, block, origin, single, hostOne));
+        add("put_vars", from([=, this] {
+                return f.putVars(ncid, wide, origin.data(), single.data(), stride.data(), value);
+            }),
+            call("put_vars", ncid, wide, origin, single, stride, hostOne));
+        add("put_att", from([=, this] {
+                return f.putAtt(put, NC_GLOBAL, name.c_str(), library.external, 1, value);
+            }),
+            putAtt(name, hostOne));
+    }
+
+    void addBlocks(std::vector<Pair> &pairs) {
+        const int put = datasets.attributes;
+        const std::string name = named("block");
+        const auto add = [&](const char *family, std::function<void()> reference,
+                             std::function<void()> module) {
+            pairs.push_back(
+                {operation(family) + "/64MiB", std::move(reference), std::move(module), true});
+        };
+        const Library<T> &f = library;
+        const T *const from = values.data();
+        const int ncid = data();
+        add("get_var", intoNew([=, this](T *to) { return f.getVar(ncid, block, to); }),
+            call("get_var", ncid, block));
+        add("get_vara", intoNew([=, this](T *to) {
+                return f.getVara(ncid, block, origin.data(), count.data(), to);
+            }),
+            call("get_vara", ncid, block, origin, count));
+        add("get_vars", intoNew([=, this](T *to) {
+                return f.getVars(ncid, wide, origin.data(), count.data(), stride.data(), to);
+            }),
+            call("get_vars", ncid, wide, origin, count, stride));
+        add("get_att", intoNew([=](T *to) { return f.getAtt(put, NC_GLOBAL, name.c_str(), to); }),
+            call("get_att", put, NC_GLOBAL, name));
+        add(
+            "put_var", [=, this] { check(f.putVar(ncid, block, from)); },
+            call("put_var", ncid, block, hostBlock));
+        add(
+            "put_vara",
+            [=, this] { check(f.putVara(ncid, block, origin.data(), count.data(), from)); },
+            call("put_vara", ncid, block, origin, count, hostBlock));
+        add(
+            "put_vars",
+            [=, this] {
+                check(f.putVars(ncid, wide, origin.data(), count.data(), stride.data(), from));
+            },
+            call("put_vars", ncid, wide, origin, count, stride, hostBlock));
+        add(
+            "put_att",
+            [=, this] {
+                check(f.putAtt(put, NC_GLOBAL, name.c_str(), library.external, elements, from));
+            },
+            putAtt(name, hostBlock));
+    }
+
+    std::function<void()> putAtt(const std::string &name, const Array &from) const {
+        if constexpr (std::is_same_v<T, char>) {
+            return call("put_att", datasets.attributes, NC_GLOBAL, name, from);
+        } else {
+            return call("put_att", datasets.attributes, NC_GLOBAL, name, library.external, from);
+        }
+    }
+
+    const Module &netcdf;
+    const Datasets &datasets;
+    const Library<T> &library;
+    int block = -1; ///< 64 MiB
+    int wide = -1;  ///< `step` times as much
+    int one = -1;   ///< without dimensions
+    std::vector<T> values = std::vector<T>(elements);
+    Array hostBlock;
+    Array hostOne;
+};
+
+} // namespace
+
+int main(int argc, char **argv) try {
+    const Module netcdf(TESSEL_NETCDF_MODULE);
+    const Datasets datasets;
+    Type<double> ofDoubles(netcdf, datasets, doubles);
+    Type<float> ofFloats(netcdf, datasets, floats);
+    Type<short> ofShorts(netcdf, datasets, shorts);
+    Type<char> ofText(netcdf, datasets, text);
+    check(nc_enddef(datasets.data));
+    std::vector<Pair> pairs;
+    const auto fillAndAdd = [&](auto &type) {
+        type.fill();
+        type.addTo(pairs);
+    };
+    fillAndAdd(ofDoubles);
+    fillAndAdd(ofFloats);
+    fillAndAdd(ofShorts);
+    fillAndAdd(ofText);
+    return bench::measure(argc, argv, "bench_families", pairs);
+} catch (const std::exception &error) {
+    std::fprintf(stderr, "bench_families: %s\n", error.what());
+    return 1;
+}

@@ -1,0 +1,154 @@
+// bench/pairs.cpp: measuring something beside its reference, in one run.
+#include "pairs.hpp"
+
+#include <netcdf.h>
+
+#include <algorithm>
+#include <array>
+#include <cstdio>
+#include <cstdlib>
+#include <fstream>
+#include <map>
+#include <sstream>
+#include <stdexcept>
+
+namespace tessel::bench {
+namespace {
+
+constexpr int repetitions = 25;
+constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
+
+double shortest(const std::vector<double> &all) {
+    return *std::min_element(all.begin(), all.end());
+}
+
+/// The statistics of all benchmarks, in seconds, by "NAME/STATISTIC".
+class Statistics : public benchmark::ConsoleReporter {
+  public:
+    void ReportRuns(const std::vector<Run> &runs) override {
+        ConsoleReporter::ReportRuns(runs);
+        for (const Run &run : runs) {
+            seconds[run.run_name.function_name + "/" + run.aggregate_name] =
+                run.GetAdjustedRealTime() / benchmark::GetTimeUnitMultiplier(run.time_unit);
+        }
+    }
+
+    /// One statistic of a pair: "1.2 us | 1.5 us | +300 ns | 1.250"; empty where it was not
+    /// measured.
+    [[nodiscard]] std::string compared(const Pair &pair, const std::string &statistic) const {
+        const auto reference = seconds.find(pair.name + "/reference/" + statistic);
+        const auto module = seconds.find(pair.name + "/module/" + statistic);
+        if (reference == seconds.end() || module == seconds.end()) {
+            return {};
+        }
+        std::array<char, 120> text{};
+        const double scale = pair.block ? 1e3 : 1e9;
+        std::snprintf(text.data(), text.size(), "%.*f | %.*f | %+.*f | %.3f", pair.block ? 1 : 0,
+                      reference->second * scale, pair.block ? 1 : 0, module->second * scale,
+                      pair.block ? 1 : 0, (module->second - reference->second) * scale,
+                      module->second / reference->second);
+        return text.data();
+    }
+
+  private:
+    std::map<std::string, double> seconds;
+};
+
+void add(const std::string &name, const std::function<void()> &work, bool block) {
+    auto *const registered =
+        benchmark::RegisterBenchmark(name.c_str(), [&work](benchmark::State &state) {
+            for ([[maybe_unused]] auto _ : state) {
+                work();
+            }
+        });
+    registered->Repetitions(repetitions)->ReportAggregatesOnly()->UseRealTime();
+    registered->ComputeStatistics("shortest", shortest);
+    if (block) {
+        registered->Iterations(1)->Unit(benchmark::kMillisecond);
+    } else {
+        registered->MinTime(shortestTime);
+    }
+}
+
+std::string table(const std::vector<Pair> &pairs, const Statistics &statistics) {
+    std::string text = "| operation | unit | library, median | module | difference | ratio | "
+                       "library, shortest | module | difference | ratio |\n"
+                       "|---|---|---|---|---|---|---|---|---|---|\n";
+    for (const Pair &pair : pairs) {
+        const std::string median = statistics.compared(pair, "median");
+        if (!median.empty()) {
+            text += "| " + pair.name + " | " + (pair.block ? "ms" : "ns") + " | " + median + " | " +
+                    statistics.compared(pair, "shortest") + " |\n";
+        }
+    }
+    return text;
+}
+
+/// Puts the text between the marks of the title.
+void write(const std::string &document, const std::string &title, const std::string &text) {
+    std::ifstream in(document);
+    std::stringstream buffer;
+    buffer << in.rdbuf();
+    std::string all = buffer.str();
+    const std::string begin = "<!-- " + title + ": begin -->\n";
+    const std::size_t from = all.find(begin);
+    const std::size_t to = all.find("<!-- " + title + ": end -->");
+    if (from == std::string::npos || to == std::string::npos) {
+        throw std::runtime_error(document + " has no marks for " + title);
+    }
+    all.replace(from + begin.size(), to - from - begin.size(), text);
+    std::ofstream(document) << all;
+}
+
+} // namespace
+
+int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs) {
+    std::vector<char *> arguments(argv, argv + argc);
+    std::string document;
+    const auto option = std::find(arguments.begin(), arguments.end(), std::string("--write"));
+    if (option != arguments.end() && option + 1 != arguments.end()) {
+        document = *(option + 1);
+        arguments.erase(option, option + 2);
+    }
+    std::string interleaving = "--benchmark_enable_random_interleaving=true";
+    arguments.insert(arguments.begin() + 1, interleaving.data()); // the user's own come later
+    int count = static_cast<int>(arguments.size());
+    benchmark::Initialize(&count, arguments.data());
+    if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) {
+        return 1;
+    }
+    for (const Pair &pair : pairs) {
+        add(pair.name + "/reference", pair.reference, pair.block);
+        add(pair.name + "/module", pair.module, pair.block);
+    }
+    Statistics statistics;
+    benchmark::RunSpecifiedBenchmarks(&statistics);
+    benchmark::Shutdown();
+    const std::string text = table(pairs, statistics);
+    std::printf("\n%s", text.c_str());
+    if (!document.empty()) {
+        write(document, title, text);
+    }
+    return 0;
+}
+
+void check(int status) {
+    if (status != NC_NOERR) {
+        throw std::runtime_error(nc_strerror(status));
+    }
+}
+
+TemporaryFolder::TemporaryFolder() {
+    std::string pattern = (std::filesystem::temp_directory_path() / "bench-XXXXXX").string();
+    if (mkdtemp(pattern.data()) == nullptr) {
+        throw std::runtime_error("cannot make a temporary folder");
+    }
+    path = pattern;
+}
+
+TemporaryFolder::~TemporaryFolder() {
+    std::error_code ignored;
+    std::filesystem::remove_all(path, ignored);
+}
+
+} // namespace tessel::bench

@@ -1,0 +1,45 @@
+// bench/pairs.hpp: measuring something beside its reference, in one run.
+#pragma once
+
+#include <benchmark/benchmark.h>
+
+#include <filesystem>
+#include <functional>
+#include <string>
+#include <vector>
+
+namespace tessel::bench {
+
+/// Something done through the module, and the reference that does the same by the library alone.
+struct Pair {
+    std::string name;
+    std::function<void()> reference;
+    std::function<void()> module;
+    bool block = false; ///< takes long enough that one iteration is a measurement
+};
+
+/// Measures the pairs, their repetitions in random order, and prints a table in Markdown of how
+/// they compare. The median is what one run usually sees; the shortest repetition is what a machine
+/// that does other work besides disturbs least. `--write FILE` puts the table into a document as
+/// well, between the marks "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; the rest of the
+/// command line goes to Google Benchmark. Gives back main's status.
+int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
+
+/// Throws the library's text for a status that is not zero.
+void check(int status);
+
+/// A folder that is gone at the end.
+class TemporaryFolder {
+  public:
+    TemporaryFolder();
+    ~TemporaryFolder();
+    TemporaryFolder(const TemporaryFolder &) = delete;
+    TemporaryFolder &operator=(const TemporaryFolder &) = delete;
+
+    [[nodiscard]] std::string file(const char *name) const { return (path / name).string(); }
+
+  private:
+    std::filesystem::path path;
+};
+
+} // namespace tessel::bench

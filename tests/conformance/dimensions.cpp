@@ -1,0 +1,117 @@
+// tests/conformance/dimensions.cpp: defining, finding, inquiring about and renaming dimensions.
+#include "support/conformance.hpp"
+
+#include <limits>
+
+namespace tessel::test {
+namespace {
+
+// clang-format off
+Rows rows() {
+    return {
+        {"a dimension is defined", On::newDataset,
+         {"def_dim", ncid, "lon", 360}, gives({0}), {"+ dimension 0: lon = 360"},
+         {"nc_def_dim(ncid, \"lon\", 360, out)", "tsCreateDoubleScalar(0)"}},
+        {"the next id is given", On::sampleDefine,
+         {"nc_def_dim", ncid, "lon", 360}, gives({6}), {"+ dimension 6: lon = 360"}},
+        {"its length is of any numeric class", On::newDataset,
+         {"def_dim", ncid, "lon", uint8s({255})}, gives({0}), {"+ dimension 0: lon = 255"}},
+        {"a length of zero is unlimited", On::newDataset,
+         {"def_dim", ncid, "time", 0}, gives({0}), {"+ dimension 0: time = 0, unlimited"}},
+        {"a name beyond ASCII", On::newDataset,
+         {"def_dim", ncid, "Größe", 1}, gives({0}), {"+ dimension 0: Größe = 1"}},
+        {"a second unlimited dimension", On::sampleDefine,
+         {"def_dim", ncid, "time", 0},
+         fails("TESSEL:netcdf:defDim:onlyOneUnlimitedDimensionAllowed",
+               R"(Dimension definition operation failed, library error message "NetCDF: NC_UNLIMITED size already in use")"), {},
+         {"nc_def_dim(ncid, \"time\", 0, out)", "nc_strerror(-54)"}},
+        {"a dimension of that name is there", On::sampleDefine,
+         {"def_dim", ncid, "x", 4},
+         fails("TESSEL:netcdf:defDim:nameIsAlreadyInUse",
+               R"(Dimension definition operation failed, library error message "NetCDF: String match to name in use")")},
+        {"a dimension in data mode", On::sample,
+         {"def_dim", ncid, "lon", 4},
+         fails("TESSEL:netcdf:defDim:operationNotAllowedInDataMode",
+               R"(Dimension definition operation failed, library error message "NetCDF: Operation not allowed in data mode")")},
+        {"a name that the library does not allow", On::newDataset,
+         {"def_dim", ncid, "a/b", 4},
+         fails("TESSEL:netcdf:defDim:nameContainsIllegalCharacters",
+               R"(Dimension definition operation failed, library error message "NetCDF: Name contains illegal characters")")},
+        {"the empty name", On::newDataset,
+         {"def_dim", ncid, "", 4},
+         fails("TESSEL:netcdf:defDim:nameContainsIllegalCharacters",
+               R"(Dimension definition operation failed, library error message "NetCDF: Name contains illegal characters")")},
+        {"a length that no file can have", On::newDataset,
+         {"def_dim", ncid, "lon", 1e18},
+         fails("TESSEL:netcdf:defDim:invalidDimensionSize",
+               R"(Dimension definition operation failed, library error message "NetCDF: Invalid dimension size")")},
+        {"a negative length", On::newDataset, {"def_dim", ncid, "lon", -1},
+         refuses("TESSEL:netcdf:negativeSize", "dim_length argument must be positive")},
+        {"an infinite length", On::newDataset, {"def_dim", ncid, "lon", std::numeric_limits<double>::infinity()},
+         refuses("TESSEL:netcdf:sizeArgumentIsInfOrNaN", "dim_length argument must not be Inf or NaN")},
+        {"no length", On::newDataset, {"def_dim", ncid, "lon", empty(tsDOUBLE)},
+         refuses("TESSEL:netcdf:emptySetSizeParameter", "dim_length argument cannot be []")},
+        {"a name that is a number", On::newDataset, {"def_dim", ncid, 1, 4},
+         refuses("TESSEL:netcdf:argumentWasNotChar", "dimension name argument must be character")},
+        {"a bad name and a bad length", On::newDataset, {"def_dim", ncid, 1, -1},
+         refuses("TESSEL:netcdf:argumentWasNotChar", "dimension name argument must be character")},
+
+        {"name and length", On::sample,
+         {"inq_dim", ncid, dimid("twenty")}, gives({"twenty", 20}), {},
+         {"nc_inq_dim(ncid, 5, out, out)", "tsCreateString(\"twenty\")", "tsCreateDoubleScalar(20)"}},
+        {"the unlimited dimension has as many as there are", On::sample,
+         {"nc_inq_dim", ncid, 0}, gives({"t", 2})},
+        {"and none before any was written", On::noRecords,
+         {"inq_dim", ncid, 0}, gives({"t", 0})},
+        {"no such dimension", On::sample,
+         {"inq_dim", ncid, 6},
+         fails("TESSEL:netcdf:inqDim:invalidDimensionIdOrName",
+               R"(Dimension inquiry failed, library error message "NetCDF: Invalid dimension ID or name")"), {},
+         {"nc_inq_dim(ncid, 6, out, out)", "nc_strerror(-46)"}},
+        {"a negative dimension", On::sample,
+         {"inq_dim", ncid, -1},
+         fails("TESSEL:netcdf:inqDim:invalidDimensionIdOrName",
+               R"(Dimension inquiry failed, library error message "NetCDF: Invalid dimension ID or name")")},
+
+        {"a dimension is found", On::sample,
+         {"inq_dimid", ncid, "x"}, gives({2}), {},
+         {"nc_inq_dimid(ncid, \"x\", out)", "tsCreateDoubleScalar(2)"}},
+        {"the first has the id zero", On::sample,
+         {"nc_inq_dimid", ncid, "t"}, gives({0})},
+        {"names are told apart by case", On::sample,
+         {"inq_dimid", ncid, "X"},
+         fails("TESSEL:netcdf:inqDimID:invalidDimensionIdOrName",
+               R"(Dimension ID inquiry failed, library error message "NetCDF: Invalid dimension ID or name")"), {},
+         {"nc_inq_dimid(ncid, \"X\", out)", "nc_strerror(-46)"}},
+
+        {"a dimension is renamed", On::sampleDefine,
+         {"rename_dim", ncid, dimid("ten"), "decade"}, givesNothing(),
+         {"- dimension 4: ten = 10", "- variable 3: char name(y, ten)", "- variable 6: double grid(ten, twenty)",
+          "+ dimension 4: decade = 10", "+ variable 3: char name(y, decade)", "+ variable 6: double grid(decade, twenty)"},
+         {"nc_rename_dim(ncid, 4, \"decade\")"}},
+        {"to a shorter name in data mode", On::sample,
+         {"nc_rename_dim", ncid, int32s({3}), "v"}, givesNothing(),
+         {"- dimension 3: five = 5", "- variable 4: short level(five)", "- variable 5: int count(y, five)", "- variable 8: char label(five)",
+          "- variable 10: double extremes(five)", "+ dimension 3: v = 5", "+ variable 4: short level(v)", "+ variable 5: int count(y, v)",
+          "+ variable 8: char label(v)", "+ variable 10: double extremes(v)"}},
+        {"to a longer name in data mode", On::sample,
+         {"rename_dim", ncid, 3, "fiveandten"},
+         fails("TESSEL:netcdf:renameDim:operationNotAllowedInDataMode",
+               R"(Unable to rename dimension, library error message "NetCDF: Operation not allowed in data mode")"), {},
+         {"nc_rename_dim(ncid, 3, \"fiveandten\")", "nc_strerror(-38)"}},
+        {"to the name of another one", On::sampleDefine,
+         {"rename_dim", ncid, 3, "x"},
+         fails("TESSEL:netcdf:renameDim:nameIsAlreadyInUse",
+               R"(Unable to rename dimension, library error message "NetCDF: String match to name in use")")},
+        {"a dimension that there is not", On::sampleDefine,
+         {"rename_dim", ncid, 9, "z"},
+         fails("TESSEL:netcdf:renameDim:invalidDimensionIdOrName",
+               R"(Unable to rename dimension, library error message "NetCDF: Invalid dimension ID or name")")},
+    };
+}
+// clang-format on
+
+INSTANTIATE_TEST_SUITE_P(Dimensions, Conformance, testing::ValuesIn(rows()), titleOf);
+
+} // namespace
+} // namespace tessel::test

@@ -1,0 +1,230 @@
+// tests/runtime/memory_test.cpp: where the memory comes from, and that it goes back.
+#include "support.hpp"
+
+#include <linux/seccomp.h>
+#include <malloc.h>
+#include <sys/prctl.h>
+#include <sys/resource.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <fstream>
+#include <sstream>
+
+namespace tessel::test {
+namespace {
+
+constexpr std::size_t hugePage = std::size_t{2} << 20U;
+
+/// Runs something in a child process; its exit status, or minus the signal that ended it.
+template <class Run>
+int inChild(const Run &run) {
+    const pid_t child = fork();
+    if (child == 0) {
+        syscall(SYS_exit, run()); // the one way out that is allowed where nearly nothing is
+    }
+    int status = 0;
+    waitpid(child, &status, 0);
+    return WIFEXITED(status) ? WEXITSTATUS(status) : -WTERMSIG(status);
+}
+
+/// The line of flags of the mapping that an address is in.
+std::string mappingFlags(const void *address) {
+    std::ifstream smaps("/proc/self/smaps");
+    const auto wanted = reinterpret_cast<std::uintptr_t>(address);
+    bool found = false;
+    for (std::string line; std::getline(smaps, line);) {
+        std::istringstream fields(line);
+        std::uintptr_t start = 0;
+        std::uintptr_t end = 0;
+        char dash = 0;
+        if (fields >> std::hex >> start >> dash >> end && dash == '-') {
+            found = start <= wanted && wanted < end;
+        } else if (found && line.starts_with("VmFlags:")) {
+            return line + " ";
+        }
+    }
+    return "";
+}
+
+TEST(Memory, LargeArraysAreForHugePages) {
+    if (!std::filesystem::exists("/sys/kernel/mm/transparent_hugepage")) {
+        GTEST_SKIP() << "the kernel has no transparent huge pages";
+    }
+    for (const bool mode : {false, true}) {
+        setChecked(mode);
+        const std::array<std::size_t, 1> large = {8 * hugePage / sizeof(double)};
+        const Array array = Array::numeric(tsDOUBLE, large);
+        const Array small = Array::scalar(1);
+        setChecked(false);
+        EXPECT_NE(mappingFlags(array.data()).find(" hg "), std::string::npos);
+        EXPECT_EQ(mappingFlags(small.data()).find(" hg "), std::string::npos);
+        // The huge pages begin where the block does, not up to one page later.
+        EXPECT_LT(reinterpret_cast<std::uintptr_t>(array.data()) % hugePage, 4096U);
+    }
+}
+
+TEST(Memory, LargeBlocksAreGivenBack) {
+    const std::array<std::size_t, 1> dims = {64 * hugePage / sizeof(double)};
+    const void *where = nullptr;
+    {
+        const Array array = Array::numeric(tsDOUBLE, dims);
+        where = array.data();
+        ASSERT_NE(mappingFlags(where), "");
+    }
+    EXPECT_EQ(mappingFlags(where), "");
+}
+
+TEST(Memory, SizesAroundTheThresholdAreWhole) {
+    for (const bool mode : {false, true}) {
+        setChecked(mode);
+        for (std::size_t bytes = hugePage - 512; bytes <= hugePage + 512; bytes += 8) {
+            const std::array<std::size_t, 1> dims = {bytes};
+            const Array array = Array::logical(dims);
+            const auto all = array.elements<std::uint8_t>();
+            ASSERT_EQ(all.front(), 0);
+            ASSERT_EQ(all.back(), 0);
+            all.front() = 1;
+            all.back() = 1;
+        }
+        setChecked(false);
+    }
+}
+
+/// In a child that may read, write and exit, and is killed by every other system call.
+TEST(Memory, SmallArraysCostNoSystemCall) {
+    if (sanitized) {
+        GTEST_SKIP() << "the sanitizer's allocator is not ours";
+    }
+    const Module good(testModule("good"));
+    const Array scalars = Array::text("scalars");
+    const Array count = Array::scalar(100);
+    const Array text = Array::text("text");
+    std::array<const tsArray *, 2> many = {scalars.get(), count.get()};
+    std::array<const tsArray *, 2> one = {text.get(), text.get()};
+    constexpr int cannotTell = 77;
+    const auto work = [&] {
+        for (int i = 0; i < 1000; ++i) {
+            good.call(many);
+        }
+        for (int i = 0; i < 100'000; ++i) {
+            if (good.call(one).size() != 1) {
+                return 1;
+            }
+        }
+        return 0;
+    };
+    const int ended = inChild([&] {
+        if (work() != 0) { // so that the heap has its size
+            return 1;
+        }
+        return prctl(PR_SET_SECCOMP, SECCOMP_MODE_STRICT) == 0 ? work() : cannotTell;
+    });
+    if (ended == cannotTell) {
+        GTEST_SKIP() << "the kernel cannot forbid system calls";
+    }
+    EXPECT_EQ(ended, 0);
+
+    // And that the test would notice: a large array does call the system.
+    EXPECT_EQ(inChild([] {
+                  prctl(PR_SET_SECCOMP, SECCOMP_MODE_STRICT);
+                  Array::numeric(tsDOUBLE, std::array<std::size_t, 1>{hugePage});
+                  return 0;
+              }),
+              -SIGKILL);
+}
+
+void limitAddresses() {
+    std::size_t pages = 0;
+    std::ifstream("/proc/self/statm") >> pages;
+    const rlim_t limit = pages * static_cast<std::size_t>(sysconf(_SC_PAGESIZE)) + 32 * hugePage;
+    const rlimit both = {limit, limit};
+    setrlimit(RLIMIT_AS, &both);
+}
+
+TEST(Memory, ThatRunsOutIsAnError) {
+    if (sanitized) {
+        GTEST_SKIP() << "the sanitizer needs more addresses than there would be";
+    }
+    const Module good(testModule("good"));
+    struct Row {
+        const char *what;
+        void (*run)(const Module &);
+    };
+    constexpr Row rows[] = {
+        {"large",
+         [](const Module &) {
+             Array::numeric(tsDOUBLE, std::array<std::size_t, 1>{16 * hugePage});
+         }                                                                                                   },
+        {"cells",              [](const Module &) { Array::cell(std::array<std::size_t, 1>{16 * hugePage}); }},
+        {"small, without end",
+         [](const Module &) {
+             std::vector<Array> kept(1'000'000);
+             for (Array &array : kept) {
+                 array = Array::scalar(1);
+             }
+         }                                                                                                   },
+        {"texts, without end",
+         [](const Module &) {
+             std::vector<Array> kept(100'000);
+             for (Array &array : kept) {
+                 array = Array::text(std::string(1000, 'x'));
+             }
+         }                                                                                                   },
+        {"large, by a module",
+         [](const Module &module) { module("make", Array::row({0x1p27}), tsUINT8); }                         },
+        {"cells, by a module",
+         [](const Module &module) { module("make", Array::row({0x1p27}), tsCELL); }                          },
+        {"small, by a module", [](const Module &module) { module("scalars", 1e9); }                          },
+    };
+    for (const Row &row : rows) {
+        SCOPED_TRACE(row.what);
+        EXPECT_EQ(inChild([&] {
+                      limitAddresses();
+                      for (int round = 0; round < 2; ++round) {
+                          try {
+                              row.run(good);
+                              return 1;
+                          } catch (const Error &error) {
+                              if (error.identifier() != "TESSEL:host:outOfMemory") {
+                                  return 2;
+                              }
+                          } catch (...) {
+                              return 3;
+                          }
+                          if (good("add", 1, 2)[0].number() != 3) {
+                              return 4;
+                          }
+                      }
+                      return 0;
+                  }),
+                  0);
+    }
+}
+
+/// Nothing under the sanitizers, which look for what is left by themselves.
+std::size_t heapInUse() {
+    return mallinfo2().uordblks + mallinfo2().hblkhd;
+}
+
+TEST(Memory, IsFlatOverManyCallsWithErrors) {
+    const Module good(testModule("good"));
+    const Module raising(testModule("raising"));
+    const auto work = [&](int calls) {
+        for (int i = 0; i < calls; i += 5) {
+            good("one_of_each");
+            for (const char *action : {"plain", "local", "bad_alloc"}) {
+                EXPECT_NE(identifierOf([&] { raising(action); }), "none");
+            }
+            EXPECT_EQ(identifierOf([&] { good("outputs_then_raise"); }), "test:late");
+        }
+    };
+    work(5000);
+    const std::size_t before = heapInUse();
+    work(100'000);
+    EXPECT_LE(heapInUse(), before + 1024);
+}
+
+} // namespace
+} // namespace tessel::test

@@ -1,0 +1,162 @@
+// tests/runtime/text_test.cpp: host characters and UTF-8.
+#include "support.hpp"
+
+#include <algorithm>
+#include <string_view>
+
+namespace tessel::test {
+namespace {
+
+using namespace std::string_view_literals;
+
+struct Utf8Row {
+    const char *what;
+    std::string_view utf8;
+    std::u16string_view characters;
+};
+
+constexpr Utf8Row fromUtf8[] = {
+    {"nothing",                            ""sv,                     u""sv                              },
+    {"ASCII",                              "abc\x7f"sv,              u"abc\x7f"sv                       },
+    {"NUL",                                "a\0b"sv,                 u"a\0b"sv                          },
+    {"two bytes, first",                   "\xc2\x80"sv,             u"\u0080"sv                        },
+    {"two bytes",                          "\xc3\xa9"sv,             u"\u00e9"sv                        },
+    {"two bytes, last",                    "\xdf\xbf"sv,             u"\u07ff"sv                        },
+    {"three bytes, first",                 "\xe0\xa0\x80"sv,         u"\u0800"sv                        },
+    {"three bytes",                        "\xe6\xb0\xb4"sv,         u"\u6c34"sv                        },
+    {"three bytes, before the surrogates", "\xed\x9f\xbf"sv,         u"\ud7ff"sv                        },
+    {"three bytes, after the surrogates",  "\xee\x80\x80"sv,         u"\ue000"sv                        },
+    {"three bytes, last",                  "\xef\xbf\xbf"sv,         u"\uffff"sv                        },
+    {"four bytes, first",                  "\xf0\x90\x80\x80"sv,     u"\U00010000"sv                    },
+    {"four bytes",                         "\xf0\x9f\x8c\x8a"sv,     u"\U0001f30a"sv                    },
+    {"four bytes, last",                   "\xf4\x8f\xbf\xbf"sv,     u"\U0010ffff"sv                    },
+    {"after ASCII",                        "sea \xe6\xb0\xb4 end"sv, u"sea \u6c34 end"sv                },
+ // What is not valid: each byte becomes the character of its code.
+    {"a byte alone",                       "\xe9"sv,                 u"\u00e9"sv                        },
+    {"a byte among ASCII",                 "caf\xe9!"sv,             u"caf\u00e9!"sv                    },
+    {"a continuation alone",               "\x80"sv,                 u"\u0080"sv                        },
+    {"two bytes cut",                      "\xc3"sv,                 u"\u00c3"sv                        },
+    {"three bytes cut",                    "\xe6\xb0"sv,             u"\u00e6\u00b0"sv                  },
+    {"four bytes cut",                     "\xf0\x9f\x8c"sv,         u"\u00f0\u009f\u008c"sv            },
+    {"two bytes broken",                   "\xc3z"sv,                u"\u00c3z"sv                       },
+    {"three bytes broken",                 "\xe6\xb0z"sv,            u"\u00e6\u00b0z"sv                 },
+    {"broken by a good one",               "\xe6\xc3\xa9"sv,         u"\u00e6\u00e9"sv                  },
+    {"overlong NUL",                       "\xc0\x80"sv,             u"\u00c0\u0080"sv                  },
+    {"overlong two bytes",                 "\xc1\xbf"sv,             u"\u00c1\u00bf"sv                  },
+    {"overlong three bytes",               "\xe0\x9f\xbf"sv,         u"\u00e0\u009f\u00bf"sv            },
+    {"overlong four bytes",                "\xf0\x8f\xbf\xbf"sv,     u"\u00f0\u008f\u00bf\u00bf"sv      },
+    {"first surrogate",                    "\xed\xa0\x80"sv,         u"\u00ed\u00a0\u0080"sv            },
+    {"last surrogate",                     "\xed\xbf\xbf"sv,         u"\u00ed\u00bf\u00bf"sv            },
+    {"beyond the last character",          "\xf4\x90\x80\x80"sv,     u"\u00f4\u0090\u0080\u0080"sv      },
+    {"lead beyond all",                    "\xf5\x80\x80\x80"sv,     u"\u00f5\u0080\u0080\u0080"sv      },
+    {"five bytes",                         "\xf8\x88\x80\x80\x80"sv, u"\u00f8\u0088\u0080\u0080\u0080"sv},
+    {"FE and FF",                          "\xfe\xff"sv,             u"\u00fe\u00ff"sv                  },
+};
+
+constexpr char16_t high = 0xD83C;
+constexpr char16_t low = 0xDF0A;
+constexpr char16_t loneHigh[] = {'a', high};
+constexpr char16_t highThenText[] = {high, 'b'};
+constexpr char16_t loneLow[] = {low, 'c'};
+constexpr char16_t wrongOrder[] = {low, high};
+constexpr char16_t twoHighOneLow[] = {high, high, low};
+
+struct Utf16Row {
+    const char *what;
+    std::u16string_view characters;
+    std::string_view utf8;
+};
+
+constexpr Utf16Row fromUtf16[] = {
+    {"nothing",               u""sv,                               ""sv                            },
+    {"ASCII and NUL",         u"a\0b"sv,                           "a\0b"sv                        },
+    {"one byte, last",        u"\x7f"sv,                           "\x7f"sv                        },
+    {"two bytes",             u"\u0080\u07ff"sv,                   "\xc2\x80\xdf\xbf"sv            },
+    {"three bytes",           u"\u0800\uffff"sv,                   "\xe0\xa0\x80\xef\xbf\xbf"sv    },
+    {"around the surrogates", u"\ud7ff\ue000"sv,                   "\xed\x9f\xbf\xee\x80\x80"sv    },
+    {"pairs",                 u"\U00010000\U0001f30a\U0010ffff"sv,
+     "\xf0\x90\x80\x80\xf0\x9f\x8c\x8a\xf4\x8f\xbf\xbf"sv                                          },
+    {"high at the end",       {loneHigh, 2},                       "a\xef\xbf\xbd"sv               },
+    {"high without low",
+     {highThenText, 2},
+     "\xef\xbf\xbd"
+     "b"sv                                                                                         },
+    {"low alone",
+     {loneLow, 2},
+     "\xef\xbf\xbd"
+     "c"sv                                                                                         },
+    {"wrong order",           {wrongOrder, 2},                     "\xef\xbf\xbd\xef\xbf\xbd"sv    },
+    {"two high, one low",     {twoHighOneLow, 3},                  "\xef\xbf\xbd\xf0\x9f\x8c\x8a"sv},
+};
+
+Array characterRow(std::u16string_view characters) {
+    const std::array<std::size_t, 2> dims = {1, characters.size()};
+    Array made = Array::characters(dims);
+    std::copy(characters.begin(), characters.end(), made.elements<tsChar>().begin());
+    return made;
+}
+
+std::u16string charactersOf(const Array &array) {
+    const std::span<tsChar> characters = array.elements<tsChar>();
+    return {characters.begin(), characters.end()};
+}
+
+TEST(Text, Utf8BecomesHostCharacters) {
+    for (const Utf8Row &row : fromUtf8) {
+        SCOPED_TRACE(row.what);
+        const Array array = Array::text(row.utf8);
+        EXPECT_EQ(array.classID(), tsCHAR);
+        EXPECT_EQ(array.dims().size(), 2U);
+        EXPECT_EQ(array.dims()[0], 1U);
+        EXPECT_EQ(charactersOf(array), row.characters);
+    }
+}
+
+TEST(Text, HostCharactersBecomeUtf8) {
+    for (const Utf16Row &row : fromUtf16) {
+        SCOPED_TRACE(row.what);
+        EXPECT_EQ(characterRow(row.characters).utf8(), row.utf8);
+    }
+}
+
+TEST(Text, EveryCharacterComesBack) {
+    for (char32_t c = 0; c <= 0x10FFFF; ++c) {
+        if (c == 0xD800) {
+            c = 0xE000;
+        }
+        std::u16string units;
+        if (c < 0x10000) {
+            units.push_back(static_cast<char16_t>(c));
+        } else {
+            units.push_back(static_cast<char16_t>(0xD7C0U + (c >> 10U)));
+            units.push_back(static_cast<char16_t>(0xDC00U + (c & 0x3FFU)));
+        }
+        if (charactersOf(Array::text(characterRow(units).utf8())) != units) {
+            FAIL() << "U+" << std::hex << static_cast<unsigned>(c);
+        }
+    }
+}
+
+TEST(Text, TheModulesFunctionsReadAndWriteTheSame) {
+    const Module good(testModule("good"));
+    for (const Utf8Row &row : fromUtf8) {
+        SCOPED_TRACE(row.what);
+        const std::u16string_view upToNul = row.characters.substr(0, row.characters.find(u'\0'));
+        EXPECT_EQ(charactersOf(good("text", Array::text(row.utf8))[0]), upToNul);
+    }
+    for (const Utf16Row &row : fromUtf16) {
+        SCOPED_TRACE(row.what);
+        const std::string_view upToNul = row.utf8.substr(0, row.utf8.find('\0'));
+        EXPECT_EQ(good("text", characterRow(row.characters))[0].utf8(), upToNul);
+    }
+}
+
+TEST(Text, ShapeIsNotText) {
+    constexpr std::array<std::size_t, 2> dims = {2, 2};
+    const Array array = Array::characters(dims);
+    std::copy_n(u"abcd", 4, array.elements<tsChar>().begin());
+    EXPECT_EQ(array.utf8(), "abcd"); // in storage order
+}
+
+} // namespace
+} // namespace tessel::test
