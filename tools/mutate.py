@@ -81,7 +81,7 @@ def rows(file: Path, code: str) -> Iterator[Mutant]:
             yield Mutant("row", file, first.start(), second.end(), second[0] + first[0])
 
 
-STATEMENT = r"^    (?!return|\}|raise|case)[^\n{}]*;\n"
+STATEMENT = r"^    [^\n{}]*\b(?:unpack|check|validate|tsFree|narrow)\w*\([^\n{}]*;\n"
 CHECK = r"^    if \([^\n]*\) \{\n        raise[^;]*;\n    \}\n"
 
 

@@ -80,12 +80,6 @@ Place dimids() {
     return {0, error, error, true};
 }
 
-Outcome wrongClass(const std::string &operation, const Member &member, const std::string &found) {
-    return refuses("TESSEL:netcdf:" + operation + ":badDatatype",
-                   "The input datatype for " + operation + " must be " + member.wanted + ", not " +
-                       found + ".");
-}
-
 Place variableData(const std::string &operation, const Member &member) {
     return {wholes(member.hostClass, {1}), wrongClass(operation, member, "cell"),
             refuses("TESSEL:netcdf:emptyVariableData", "Variable data must not be empty.")};

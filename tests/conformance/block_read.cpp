@@ -6,10 +6,10 @@ namespace tessel::test {
 namespace {
 
 std::string elementFailed(const std::string &why) {
-    return "Single datum retrieval failed, library error message \"" + why + "\"";
+    return libraryFailed("Single datum retrieval failed", why);
 }
 std::string blockFailed(const std::string &why) {
-    return "Contiguous data retrieval failed, library error message \"" + why + "\"";
+    return libraryFailed("Contiguous data retrieval failed", why);
 }
 
 const Outcome indexLength = fails(
@@ -121,10 +121,7 @@ Rows blocks() {
 /// Each numeric member of both families, straight into the result.
 Rows eachMember() {
     Rows list;
-    for (const Member &member : members) {
-        if (member.hostClass == tsCHAR) {
-            continue;
-        }
+    for (const Member &member : numericMembers()) {
         const std::string element = "get_var1_" + member.suffix;
         const std::string block = "get_vara_" + member.suffix;
         list.insert(list.end(), {

@@ -6,10 +6,10 @@ namespace tessel::test {
 namespace {
 
 std::string elementFailed(const std::string &why) {
-    return "Single datum write operation failed, library error message \"" + why + "\"";
+    return libraryFailed("Single datum write operation failed", why);
 }
 std::string blockFailed(const std::string &why) {
-    return "Contiguous data write failed, library error message \"" + why + "\"";
+    return libraryFailed("Contiguous data write failed", why);
 }
 
 Outcome wrongLength(const std::string &identifier, const std::string &which,
@@ -151,10 +151,7 @@ Rows blocks() {
 /// Each numeric member of both families, straight from the input.
 Rows eachMember() {
     Rows list;
-    for (const Member &member : members) {
-        if (member.hostClass == tsCHAR) {
-            continue;
-        }
+    for (const Member &member : numericMembers()) {
         const std::string element = "put_var1_" + member.suffix;
         const std::string block = "put_vara_" + member.suffix;
         list.insert(list.end(), {

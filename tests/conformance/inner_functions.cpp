@@ -14,6 +14,7 @@
 #include "convert/write_data.hpp"
 #include "gateway/lookup.hpp"
 #include "gateway/operation_table.hpp"
+#include "tessel/extension.h"
 
 #include <algorithm>
 #include <array>
@@ -108,6 +109,14 @@ TEST(Lookup, IsAWalkThroughTheTable) {
     }
     expectAsByWalk("");
     expectAsByWalk("\xC3\x96");
+}
+
+/// Fewer than no inputs are too few as well.
+TEST(Gateway, CountsWithSign) {
+    for (const int count : {0, -1, std::numeric_limits<int>::min()}) {
+        EXPECT_EQ(errorOf([&](tsArray *plhs[]) { tsxFunction(0, plhs, count, nullptr); }),
+                  "TESSEL:netcdf:tooFewArguments: Must provide at least one input argument.");
+    }
 }
 
 TEST(Status, OfSuccessAndOfWhatHasNoWord) {

@@ -6,7 +6,7 @@ namespace tessel::test {
 namespace {
 
 std::string failed(const std::string &why) {
-    return "Strided data retrieval failed, library error message \"" + why + "\"";
+    return libraryFailed("Strided data retrieval failed", why);
 }
 
 // What is wrong with the stride is told in the words for the count.
@@ -91,10 +91,7 @@ Rows rows() {
 /// Each numeric member, straight into the result.
 Rows eachMember() {
     Rows list;
-    for (const Member &member : members) {
-        if (member.hostClass == tsCHAR) {
-            continue;
-        }
+    for (const Member &member : numericMembers()) {
         const std::string operation = "get_vars_" + member.suffix;
         list.insert(list.end(), {
             {operation + " of numbers", On::sample, {operation.c_str(), ncid, varid("count"), doubles({1, 0}), doubles({2, 2}), doubles({3, 1})},

@@ -6,7 +6,7 @@ namespace tessel::test {
 namespace {
 
 std::string failed(const std::string &why) {
-    return "Strided data write operation failed, library error message \"" + why + "\"";
+    return libraryFailed("Strided data write operation failed", why);
 }
 
 Outcome wrongLength(const std::string &identifier, const std::string &which,
@@ -102,10 +102,7 @@ Rows rows() {
 /// Each numeric member, straight from the input.
 Rows eachMember() {
     Rows list;
-    for (const Member &member : members) {
-        if (member.hostClass == tsCHAR) {
-            continue;
-        }
+    for (const Member &member : numericMembers()) {
         const std::string operation = "put_vars_" + member.suffix;
         list.insert(list.end(), {
             {operation + " of numbers", On::sample, {operation.c_str(), ncid, varid("level"), 0, 3, 2, wholes(member.hostClass, {7, 8, 9})}, givesNothing(),

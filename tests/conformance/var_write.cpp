@@ -6,7 +6,7 @@ namespace tessel::test {
 namespace {
 
 std::string failed(const std::string &why) {
-    return "Variable write operation failed, library error message \"" + why + "\"";
+    return libraryFailed("Variable write operation failed", why);
 }
 
 const Outcome wrongSize = fails("TESSEL:netcdf:putVar:dataSizeMismatch",
@@ -90,10 +90,7 @@ Rows rows() {
 /// Each numeric member, straight from the input; and into text.
 Rows eachMember() {
     Rows list;
-    for (const Member &member : members) {
-        if (member.hostClass == tsCHAR) {
-            continue;
-        }
+    for (const Member &member : numericMembers()) {
         const std::string operation = "put_var_" + member.suffix;
         list.insert(list.end(), {
             {operation + " of numbers", On::sample, {operation.c_str(), ncid, varid("level"), wholes(member.hostClass, {5, 6, 7, 8, 9})}, givesNothing(),

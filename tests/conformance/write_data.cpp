@@ -1,33 +1,10 @@
 // tests/conformance/write_data.cpp: the data that a write takes, and those that it refuses.
+#include "support/classes.hpp"
 #include "support/conformance.hpp"
 #include "support/members.hpp"
 
 namespace tessel::test {
 namespace {
-
-struct Data {
-    std::string className;
-    Value value;
-};
-
-// clang-format off
-std::vector<Data> oneOfEachClass() {
-    return {
-        {"double", 1},          {"single", singles({1})},   {"int8",  int8s({1})},   {"uint8", uint8s({1})},
-        {"int16", int16s({1})}, {"uint16", uint16s({1})},   {"int32", int32s({1})},  {"uint32", uint32s({1})},
-        {"int64", int64s({1})}, {"uint64", uint64s({1})},   {"char", "1"},           {"logical", logicals({true})},
-        {"cell", cell({1})},    {"struct", structure()},    {"unknown", unknown()},  {"function_handle", function()},
-    };
-}
-
-std::vector<Data> noneOfEachClass() {
-    return {
-        {"double", empty(tsDOUBLE)},       {"single", empty(tsSINGLE, {1, 0})}, {"int8", empty(tsINT8)},       {"uint8", empty(tsUINT8)},
-        {"int16", empty(tsINT16, {0, 3})}, {"uint16", empty(tsUINT16)},         {"int32", empty(tsINT32)},     {"uint32", empty(tsUINT32)},
-        {"int64", empty(tsINT64)},         {"uint64", empty(tsUINT64)},         {"char", ""},                  {"logical", empty(tsLOGICAL)},
-        {"cell", empty(tsCELL)},           {"struct", empty(tsSTRUCT)},         {"unknown", empty(tsUNKNOWN)},
-    };
-}
 
 /// The arguments before the data, by family.
 struct Family {
@@ -36,6 +13,7 @@ struct Family {
     bool takesNone;
 };
 
+// clang-format off
 std::vector<Family> families() {
     return {
         {"put_att_",  {5, 0, "a", 6}, true},
@@ -57,12 +35,6 @@ Values callOf(const Family &family, const Member &member, const Value &data, con
     return call;
 }
 
-Outcome wrongClass(const std::string &operation, const Member &member, const std::string &found) {
-    return refuses("TESSEL:netcdf:" + operation + ":badDatatype",
-                   "The input datatype for " + operation + " must be " + member.wanted + ", not " +
-                       found + ".");
-}
-
 /// Every member refuses every class but its own, and names itself by its short name, also when it
 /// is called by its long one.
 Rows otherClasses() {
@@ -70,7 +42,7 @@ Rows otherClasses() {
     for (const Family &family : families()) {
         for (const Member &member : members) {
             const std::string operation = family.name + member.suffix;
-            for (const Data &data : oneOfEachClass()) {
+            for (const OfClass &data : oneOfEachClass()) {
                 if (data.className != member.className) {
                     list.push_back({operation + " of " + data.className, On::nothing,
                                     callOf(family, member, data.value, "nc_"),
@@ -91,7 +63,7 @@ Rows noData() {
     for (const Family &family : families()) {
         for (const Member &member : members) {
             const std::string operation = family.name + member.suffix;
-            for (const Data &data : noneOfEachClass()) {
+            for (const OfClass &data : noneOfEachClass()) {
                 if (!family.takesNone || data.className != member.className) {
                     list.push_back({operation + " of no " + data.className, On::nothing,
                                     callOf(family, member, data.value, ""),

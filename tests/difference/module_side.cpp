@@ -60,11 +60,9 @@ Array arrayOf(const Value &value) {
 }
 
 Result resultOf(const Array &array) {
-    Result result{
-        array.classID(), {array.dims().begin(), array.dims().end()},
-         {          },
-         {                    }
-    };
+    Result result{};
+    result.classID = array.classID();
+    result.dims.assign(array.dims().begin(), array.dims().end());
     if (array.classID() == tsCELL) {
         for (std::size_t i = 0; i < array.size(); ++i) {
             result.cells.push_back(resultOf(array.cellAt(i)));

@@ -1,9 +1,10 @@
 // tests/support/members.hpp: the seven members that every typed family has.
 #pragma once
 
-#include "tessel/class_id.h"
+#include "support/row.hpp"
 
 #include <array>
+#include <span>
 #include <string>
 
 namespace tessel::test {
@@ -25,5 +26,18 @@ inline const std::array<Member, 7> members = {
     Member{"uchar",  tsUINT8,  "uint8",  "uint8"           },
     Member{"text",   tsCHAR,   "char",   "char"            },
 };
+
+/// All but text.
+inline std::span<const Member> numericMembers() {
+    return std::span(members).first(members.size() - 1);
+}
+
+/// What a write says of data of another class than the member's.
+inline Outcome wrongClass(const std::string &operation, const Member &member,
+                          const std::string &found) {
+    return refuses("TESSEL:netcdf:" + operation + ":badDatatype",
+                   "The input datatype for " + operation + " must be " + member.wanted + ", not " +
+                       found + ".");
+}
 
 } // namespace tessel::test

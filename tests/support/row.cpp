@@ -201,6 +201,10 @@ Outcome refuses(std::string identifier, std::string message) {
     return {Outcome::Kind::refuses, std::move(identifier), std::move(message), {}};
 }
 
+std::string libraryFailed(const std::string &what, const std::string &why) {
+    return what + ", library error message \"" + why + "\"";
+}
+
 Interference answering(std::string function, int status) {
     Interference interference;
     interference.function = std::move(function);

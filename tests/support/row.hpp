@@ -29,6 +29,9 @@ Outcome givesNothing();
 Outcome fails(std::string identifier, std::string message);
 Outcome refuses(std::string identifier, std::string message);
 
+/// The message of most failures of the library: what could not be done, and the library's text.
+std::string libraryFailed(const std::string &what, const std::string &why);
+
 /// What stands between the module and the library or the host in a row.
 struct Interference {
     std::string function;   ///< a library function that is not asked: it answers `status`

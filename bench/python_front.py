@@ -1,0 +1,306 @@
+# bench/python_front.py: what a call from Python costs, beside netCDF4-python.
+"""Measures tessel and netCDF4-python (Debian's python3-netcdf4) in one run, on the same files.
+
+usage: python_front.py [--write DOCUMENT] [--quick]
+
+Each row is one piece of work done by each side. The sides take turns, in another order in each
+repetition. A time is the median of all repetitions; how many times faster one side is, is the
+median of what each repetition says, so that what slows down both does not count. netCDF4-python is
+measured as it comes, with masking and scaling, and without, as its users who want speed run it.
+Before anything is measured, the sides must give the same values and write the same file.
+
+--write puts the table between the marks in the document. --quick does everything once, on small
+data: it shows that the program works, and measures nothing. Run it on a machine that does nothing
+else.
+"""
+
+from __future__ import annotations
+
+import argparse
+import platform
+import random
+import statistics
+import sys
+import tempfile
+import time
+from collections.abc import Callable
+from functools import partial
+from pathlib import Path
+from typing import NamedTuple
+
+import netCDF4
+import numpy as np
+
+import tessel
+
+BEGIN = "<!-- bench/python_front.py: begin -->"
+END = "<!-- bench/python_front.py: end -->"
+FORMAT = "NETCDF3_64BIT_OFFSET"
+TEN = 10
+# Where both sides leave nearly all of the work to the library, two measurements of the same side
+# differ by as much as this, and a difference below it says nothing.
+NOISE = 0.03
+
+Work = Callable[[], object]
+Places = list[tuple[int, int, int]]
+
+
+class Row(NamedTuple):
+    """One piece of work, by each side, and how many times faster ours shall be at least.
+
+    Nothing is expected where the library itself takes most of the time.
+    """
+
+    name: str
+    unit: str
+    expected: float | None
+    tessel: Work
+    netcdf4: Callable[[bool], Work]  # with masking and scaling or without
+    times: int  # how often one measurement does it
+
+
+class Bench:
+    """A file with one variable of double, open on both sides."""
+
+    def __init__(self, folder: Path, length: int, times: int) -> None:
+        self.times = times
+        self.path, self.new = folder / "data.nc", folder / "new.nc"
+        self.nc = tessel.load("netcdf")
+        self.shape = (length, 256, 512)
+        self.data = np.arange(float(np.prod(self.shape))).reshape(self.shape)
+        self.write_netcdf4(True)
+        self.path.unlink(missing_ok=True)
+        self.write_tessel()
+        self.ncid = int(self.nc("open", self.path, "NOWRITE")[0, 0])
+        self.varid = int(self.nc("inq_varid", self.ncid, "v")[0, 0])
+        self.dataset = netCDF4.Dataset(self.path)
+        self.variable = self.dataset["v"]
+        # Ten elements begin at each place. One after the other, they are in the library's buffer
+        # most of the time; anywhere, the library reads from the file for each.
+        rooms = (*self.shape[:-1], self.shape[-1] - TEN)
+        lot = random.Random(1)
+        self.near = [(0, TEN * i // rooms[-1], TEN * i % rooms[-1]) for i in range(times)]
+        self.anywhere = [tuple(lot.randrange(room) for room in rooms) for _ in range(times)]
+
+    def close(self) -> None:
+        self.dataset.close()
+        self.nc("close", self.ncid)
+
+    # One element and ten. The host's order of dimensions is the reverse of the library's.
+
+    def element_tessel(self, places: Places) -> float:
+        nc, ncid, varid = self.nc, self.ncid, self.varid
+        for t, y, x in places:
+            value = nc("get_var1_double", ncid, varid, [x, y, t])
+        return value[0, 0]
+
+    def element_method(self, places: Places) -> float:
+        read, ncid, varid = self.nc.get_var1_double, self.ncid, self.varid
+        for t, y, x in places:
+            value = read(ncid, varid, [x, y, t])
+        return value[0, 0]
+
+    def element_netcdf4(self, places: Places) -> float:
+        variable = self.variable
+        for t, y, x in places:
+            value = variable[t, y, x]
+        return float(value)
+
+    def block_tessel(self, places: Places) -> np.ndarray:
+        nc, ncid, varid = self.nc, self.ncid, self.varid
+        for t, y, x in places:
+            values = nc("get_vara_double", ncid, varid, [x, y, t], [TEN, 1, 1])
+        return values[:, 0, 0]
+
+    def block_method(self, places: Places) -> np.ndarray:
+        read, ncid, varid = self.nc.get_vara_double, self.ncid, self.varid
+        for t, y, x in places:
+            values = read(ncid, varid, [x, y, t], [TEN, 1, 1])
+        return values[:, 0, 0]
+
+    def block_netcdf4(self, places: Places) -> np.ndarray:
+        variable = self.variable
+        for t, y, x in places:
+            values = variable[t, y, x:x + TEN]
+        return np.asarray(values)
+
+    # The whole variable.
+
+    def read_tessel(self) -> np.ndarray:
+        return self.nc("get_var_double", self.ncid, self.varid).T
+
+    def read_netcdf4(self) -> np.ndarray:
+        return self.variable[:]
+
+    def write_tessel(self) -> None:
+        """A new file each time. The transposed array is column-major, and so not copied."""
+        nc = self.nc
+        ncid = nc("create", self.path_of_new(), nc("parameter", "64BIT_OFFSET"))
+        nc("set_fill", ncid, nc("parameter", "NOFILL"))
+        dims = [nc("def_dim", ncid, name, n)[0, 0] for name, n in zip("tyx", self.shape)]
+        varid = nc("def_var", ncid, "v", nc("parameter", "DOUBLE"), dims[::-1])
+        nc("enddef", ncid)
+        nc("put_var_double", ncid, varid, self.data.T)
+        nc("close", ncid)
+
+    def write_netcdf4(self, mask: bool) -> None:
+        with netCDF4.Dataset(self.path_of_new(), "w", format=FORMAT) as dataset:
+            dataset.set_fill_off()
+            for name, n in zip("tyx", self.shape):
+                dataset.createDimension(name, n)
+            variable = dataset.createVariable("v", "f8", ("t", "y", "x"))
+            variable.set_auto_maskandscale(mask)
+            variable[:] = self.data
+
+    def path_of_new(self) -> Path:
+        """Where a new file goes: first the one that is read, then one that comes and goes."""
+        return self.new if self.path.exists() else self.path
+
+    def remove_new(self) -> None:
+        self.new.unlink(missing_ok=True)
+
+    # Opening and closing.
+
+    def open_tessel(self) -> None:
+        for _ in range(self.times):
+            self.nc("close", self.nc("open", self.path, "NOWRITE"))
+
+    def open_netcdf4(self) -> None:
+        for _ in range(self.times):
+            netCDF4.Dataset(self.path).close()
+
+    def masked(self, work: Work) -> Callable[[bool], Work]:
+        """The work of netCDF4-python on the open variable, with masking and scaling or without."""
+        def chosen(mask: bool) -> Work:
+            def run() -> object:
+                self.variable.set_auto_maskandscale(mask)
+                return work()
+            return run
+        return chosen
+
+    def rows(self) -> list[Row]:
+        large = f"{self.data.nbytes >> 20} MiB"
+        small = [
+            Row(f"{what}, {how}, {form}", "µs", expected, partial(ours, places),
+                self.masked(partial(theirs, places)), self.times)
+            for what, theirs, forms in (
+                ("one element", self.element_netcdf4,
+                 {"call": self.element_tessel, "method": self.element_method}),
+                ("ten elements", self.block_netcdf4,
+                 {"call": self.block_tessel, "method": self.block_method}))
+            for how, places, expected in (("one after the other", self.near, 20),
+                                          ("anywhere in the file", self.anywhere, None))
+            for form, ours in forms.items()
+        ]
+        return [
+            *small,
+            Row("open and close", "µs", 1, self.open_tessel,
+                lambda mask: self.open_netcdf4, self.times),
+            Row(f"read {large}", "ms", 1, self.read_tessel,
+                self.masked(self.read_netcdf4), 1),
+            Row(f"write {large} to a new file", "ms", 1, self.write_tessel,
+                lambda mask: lambda: self.write_netcdf4(mask), 1),
+        ]
+
+    def check(self) -> None:
+        """Both sides give what was written, and write the same file."""
+        for row in self.rows():
+            ours = row.tessel()
+            for mask in (True, False):
+                np.testing.assert_array_equal(np.asarray(ours), np.asarray(row.netcdf4(mask)()))
+        np.testing.assert_array_equal(self.read_tessel(), self.data)
+        self.write_tessel()
+        written = self.new.read_bytes()
+        self.remove_new()
+        self.write_netcdf4(False)
+        assert written == self.new.read_bytes(), "the files differ"
+
+
+def seconds(work: Work) -> float:
+    start = time.perf_counter()
+    work()
+    return time.perf_counter() - start
+
+
+class Measured(NamedTuple):
+    """A side of a row: how long it takes to do it once, and how many times faster ours is."""
+
+    time: float
+    ratio: float
+
+
+def measure(row: Row, repetitions: int, before: Work) -> list[Measured]:
+    """Ours, theirs without masking, and theirs with it. `before` comes before each, unmeasured."""
+    sides = [row.tessel, row.netcdf4(False), row.netcdf4(True)]
+    taken: list[list[float]] = [[] for _ in sides]
+    for work in sides:
+        before()
+        work()
+    for _ in range(repetitions):
+        for side in random.sample(range(len(sides)), len(sides)):
+            before()
+            taken[side].append(seconds(sides[side]) / row.times)
+    return [Measured(statistics.median(each),
+                     statistics.median(theirs / ours for theirs, ours in zip(each, taken[0])))
+            for each in taken]
+
+
+def table(bench: Bench, repetitions: int) -> tuple[list[str], bool]:
+    """The rows as Markdown, and whether each is as fast as expected."""
+    scale = {"µs": 1e6, "ms": 1e3}
+    lines = ["| | tessel | netCDF4, no masking | times faster | netCDF4, as it comes "
+             "| times faster | expected |", "|---|---:|---:|---:|---:|---:|---:|"]
+    good = True
+    for row in bench.rows():
+        count = repetitions if row.unit == "µs" else max(repetitions // 3, 1)
+        ours, bare, masked = measure(row, count, bench.remove_new)
+        good = good and bare.ratio >= (row.expected or 0) * (1 - NOISE)
+        show = [f"{side.time * scale[row.unit]:.3g} {row.unit}" for side in (ours, bare, masked)]
+        lines.append(f"| {row.name} | {show[0]} | {show[1]} | {bare.ratio:.3g} | {show[2]} | "
+                     f"{masked.ratio:.3g} | {row.expected or '–'} |")
+    return lines, good
+
+
+def circumstances() -> str:
+    """What was measured with."""
+    return (f"Python {platform.python_version()}, NumPy {np.__version__}, netCDF4-python "
+            f"{netCDF4.__version__}, netCDF library {netCDF4.getlibversion().split()[0]}.")
+
+
+def put_between_marks(document: Path, text: str) -> None:
+    """Replaces what is between the marks; at the end, with marks, when there are none."""
+    old = document.read_text() if document.exists() else ""
+    section = f"{BEGIN}\n{text}\n{END}"
+    if BEGIN in old and END in old:
+        before, rest = old.split(BEGIN, 1)
+        document.write_text(before + section + rest.split(END, 1)[1])
+    else:
+        document.write_text(old.rstrip("\n") + ("\n\n" if old else "") + section + "\n")
+
+
+def main() -> int:
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    parser.add_argument("--write", type=Path, metavar="DOCUMENT",
+                        help="put the table between the marks in this document")
+    parser.add_argument("--quick", action="store_true",
+                        help="do everything once, on small data, and measure nothing")
+    options = parser.parse_args()
+    length, times, repetitions = (2, 10, 1) if options.quick else (256, 1000, 45)
+    with tempfile.TemporaryDirectory() as folder:
+        bench = Bench(Path(folder), length, times)
+        try:
+            bench.check()
+            if options.quick:
+                return 0
+            lines, good = table(bench, repetitions)
+        finally:
+            bench.close()
+    text = "\n".join([*lines, "", circumstances()])
+    print(text)
+    if options.write:
+        put_between_marks(options.write, text)
+    return 0 if good else 1
+
+
+if __name__ == "__main__":
+    sys.exit(main())

@@ -1,0 +1,106 @@
+# python/tessel/__init__.py: the package's public names, and what becomes what.
+"""Modules of the host, called from Python.
+
+    >>> import tessel
+    >>> netcdf = tessel.load("netcdf")
+    >>> ncid = netcdf("open", "sst.nc", "NOWRITE")
+    >>> sst = netcdf("get_var_float", ncid, netcdf("inq_varid", ncid, "SST"))
+
+The module "netcdf" has a method for every operation as well, `netcdf.open("sst.nc", "NOWRITE")`,
+which takes and gives what a Python program expects: see `tessel.netcdf`. What follows is about the
+call itself.
+
+A call names an operation and gives the operation's own arguments. It returns None when the
+operation has no result, the result when it has one, and a tuple when it has several, and raises
+`tessel.Error`, with `.identifier` and `.message`, when the module, the host or a conversion refuses
+(see `tessel.errors`).
+Any number of threads may call; the calls themselves run one after the other, and the interpreter is
+free meanwhile.
+
+Arrays are the host's: at least two dimensions, first dimension fastest. A result takes over the
+host's memory without a copy. An argument whose data are column-major, aligned and in the machine's
+byte order is passed without a copy; every other array is copied once.
+
+===================  ==================================  ==========================================
+class of the host    from the host                       to the host
+===================  ==================================  ==========================================
+double               float64 array                       the same; float; int that is exact as a
+                                                         double; list or tuple of such numbers
+                                                         (1-by-n; empty: 0-by-0)
+single               float32 array                       the same
+int8, int16, int32,  array of that dtype                 the same; int that only 64 bits hold
+int64, uint8,                                            exactly (int64, else uint64)
+uint16, uint32,
+uint64
+complex double       complex128 array (copied)           the same (copied); complex
+complex single       complex64 array (copied)            the same (copied)
+logical              bool array                          the same; bool
+char, 1-by-n         str (0-by-0: "")                    str (""  makes 1-by-0); bytes, one
+                                                         character a byte; os.PathLike
+char, other shapes   array of dtype "<U1" (copied)       the same (copied)
+cell                 object array                        object array; list or tuple of anything
+                                                         but plain numbers (1-by-n)
+struct, 1-by-1       dict                                dict whose keys are str
+struct, other shapes object array of dicts               object array of dicts with equal keys
+function_handle      tessel.Function                     tessel.Function
+unknown              tessel.Unknown                      tessel.Unknown
+===================  ==================================  ==========================================
+
+- A NumPy scalar and an array without dimensions become 1-by-1, an array of one dimension of length
+  n becomes n-by-1. In a list, NumPy's real scalars are plain numbers too; bool is not.
+- None stands for an element of a cell, or a field, that nothing was put into. It is no argument.
+- A str is UTF-16 in the host: a character beyond U+FFFF is two of the host's, and half of such a
+  pair stays what it is in both directions.
+- An object array of nothing but dicts becomes a struct; for a cell of structs, use a list.
+- What has no counterpart is refused and never converted in silence: other dtypes (float16,
+  longdouble, datetime64, "<U2", structured ones), masked arrays, integers beyond 64 bits, integers
+  in a list that no double holds exactly, values nested more than 256 levels deep or in themselves.
+  The identifiers begin with "TESSEL:python:".
+"""
+
+from __future__ import annotations
+
+import os
+from typing import Literal, overload
+
+from tessel import _runtime
+from tessel._runtime import Module
+from tessel.errors import Error
+from tessel.integrity import check
+from tessel.netcdf import Netcdf
+from tessel.terminal import progress_bar
+from tessel.transfer import copy, read
+from tessel.values import Function, Unknown
+
+__all__ = ["Error", "Function", "Module", "Netcdf", "Unknown", "check", "copy", "load",
+           "progress_bar", "read"]
+
+
+@overload
+def load(module: Literal["netcdf"]) -> Netcdf: ...
+@overload
+def load(module: str | os.PathLike[str]) -> Module: ...
+
+
+def load(module: str | os.PathLike[str]) -> Module:
+    """The module of a name ("netcdf"), or in a file (a str with a slash, or a path object).
+
+    A name is looked up in the folders of the variable TESSEL_MODULE_PATH and among the modules that
+    came with this package. A module whose file is called "netcdf.tsx" is a `tessel.Netcdf`, which
+    has a method for every operation.
+    """
+    loaded = _load(module)
+    return Netcdf(loaded) if loaded.file.name == "netcdf.tsx" else loaded
+
+
+def _load(module: str | os.PathLike[str]) -> Module:
+    try:
+        encoded = os.fsencode(module)
+    except (TypeError, ValueError):
+        encoded = b""
+    if not encoded or b"\0" in encoded:
+        raise Error("TESSEL:python:badModuleName",
+                    "A module is given by a name or by the path of its file.")
+    if b"/" in encoded or isinstance(module, os.PathLike):
+        return _runtime.load_file(encoded)
+    return _runtime.find(encoded)

@@ -1,0 +1,85 @@
+# python/tessel/arguments.py: what the methods make of their arguments before the module sees them.
+"""The rules by which a method's arguments become the host's.
+
+- A whole number (an id, a size, a code, a mode) may be anything that Python takes for an index:
+  int, a NumPy integer of any width, an IntEnum.
+- A vector of positions, and a list of dimension ids, may be any iterable of whole numbers.
+- Data: an array of NumPy's, and a scalar of NumPy's, go to the module unchanged, and it accepts
+  exactly the member's class. Python's own numbers have no such class: an int, a float, and a list
+  or tuple of them, nested like the array that `numpy.array` makes of it, become the member's class
+  when that is exact. Where a digit would be lost, the call is refused ("TESSEL:python:notExact")
+  and says how to round on purpose.
+
+Everything else, bool included, goes on as it is, and the module judges it.
+"""
+
+from __future__ import annotations
+
+import operator
+from collections.abc import Iterable
+from typing import Any
+
+import numpy
+
+from tessel.errors import Error
+
+
+def integer(value: Any) -> Any:
+    """An int for whatever is a whole number; else the value itself."""
+    if isinstance(value, bool):
+        return value
+    try:
+        return operator.index(value)
+    except TypeError:
+        return value
+
+
+def vector(value: Any) -> Any:
+    """A list for an iterable that is no array; else the value itself."""
+    if isinstance(value, (numpy.ndarray, str, bytes)) or not isinstance(value, Iterable):
+        return value
+    return [integer(each) for each in value]
+
+
+def identifiers(value: Any) -> Any:
+    """A list of ids, which the host wants as doubles."""
+    if isinstance(value, numpy.ndarray):
+        return value.astype(float) if value.dtype.kind in "iu" else value
+    value = vector(value)
+    return [integer(value)] if not isinstance(value, list) else value
+
+
+def numbers(value: Any, dtype: numpy.dtype[Any], operation: str) -> Any:
+    """An array of exactly this dtype for Python's own numbers; else the value itself."""
+    if type(value) not in (int, float, list, tuple):
+        return value
+    try:
+        objects = numpy.array(value, object)
+    except ValueError:  # lists of different lengths that are no array at all
+        return value
+    flat = [each.item() if isinstance(each, numpy.number) else each
+            for each in objects.ravel().tolist()]
+    if not {type(each) for each in flat} <= {int, float}:
+        return value
+    made = numpy.empty(len(flat), dtype)
+    with numpy.errstate(all="ignore"):
+        for i, each in enumerate(flat):
+            if not _put(made, i, each):
+                raise Error("TESSEL:python:notExact",
+                            f"{each!r} is not exact as {dtype.name}; pass an array of that dtype "
+                            "to have it rounded.", operation)
+    return made.reshape(objects.shape)
+
+
+def _put(made: numpy.ndarray[Any, Any], i: int, value: float) -> bool:
+    """Whether the element could be set to exactly this value."""
+    if made.dtype.kind in "iu":
+        limits = numpy.iinfo(made.dtype)
+        if not limits.min <= value <= limits.max or value != int(value):
+            return False
+        value = int(value)
+    try:
+        made[i] = value
+    except OverflowError:  # an int beyond the largest double
+        return False
+    return bool(made[i].item() == value or value != value)

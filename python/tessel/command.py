@@ -1,0 +1,150 @@
+# python/tessel/command.py: the command line: tessel info, plot, copy, check and ops.
+"""Looks into netCDF files, draws, copies and checks them, and explains the module's operations."""
+
+from __future__ import annotations
+
+import argparse
+import os
+from collections.abc import Callable
+from typing import NoReturn
+
+import tessel
+from tessel import integrity, show, terminal, wording
+from tessel.dataset import Dataset
+from tessel.new_dataset import FORMATS
+
+
+class _Parser(argparse.ArgumentParser):
+    """A parser that shows nothing to the terminal that could steer it."""
+
+    def error(self, message: str) -> NoReturn:
+        super().error(wording.printable(message))
+
+
+def _open(options: argparse.Namespace) -> Dataset:
+    dataset = Dataset(options.file)
+    try:
+        if options.check:
+            integrity.verify(dataset)
+    except BaseException:
+        dataset.close()
+        raise
+    return dataset
+
+
+def _info(options: argparse.Namespace) -> None:
+    with _open(options) as dataset:
+        variable = (dataset.find(options.variable) if options.variable is not None
+                    else dataset.main_variable())
+        show.describe_file(dataset, variable)
+
+
+def _plot(options: argparse.Namespace) -> None:
+    from tessel import picture  # here, because it takes a second that the others need not wait for
+
+    with _open(options) as dataset:
+        variable = dataset.find(options.variable)
+        try:
+            if variable.is_text:
+                raise picture.NothingToDraw("its values are text")
+            kind = picture.draw(dataset, variable, dataset.values(variable), options.output,
+                                dict(options.index))
+        except picture.NothingToDraw as reason:
+            raise tessel.Error("TESSEL:python:nothingToDraw",
+                               f"No picture of {variable.name}: {reason}.") from None
+    print(f"The {kind} is in {wording.printable(options.output)}")
+
+
+def _copy(options: argparse.Namespace) -> None:
+    with tessel.progress_bar(os.path.basename(options.source)) as progress:
+        tessel.copy(options.source, options.target, options.format, overwrite=options.overwrite,
+                    progress=progress, check=options.check)
+
+
+def _check(options: argparse.Namespace) -> None:
+    least = tessel.check(options.file)
+    name = wording.printable(options.file)
+    if least is None:
+        print(f"{name}: nothing to check; the library itself finds cut-off files of this format")
+    else:
+        there = os.path.getsize(options.file)
+        print(f"{name}: complete; it needs {least} bytes and has {there}")
+
+
+def _ops(options: argparse.Namespace) -> None:
+    # Here, because only this needs the whole table.
+    from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS
+
+    if options.name is None:
+        width = max(len(each.short) for each in OPERATIONS)
+        for each in OPERATIONS:
+            print(f"{each.short:{width}}  {each.purpose}")
+        return
+    wanted = options.name.lower()
+    for each in OPERATIONS:
+        if wanted in each.names:
+            arguments = ", ".join(argument.name for argument in each.arguments)
+            print(f"{each.short}({arguments})\n\n{each.documentation(EXAMPLE_BEGINNING)}", end="")
+            return
+    raise tessel.Error("TESSEL:python:unknownOperation",
+                       f"There is no operation {options.name}; tessel ops lists all.")
+
+
+def _position(text: str) -> tuple[str, int]:
+    name, equals, index = text.rpartition("=")
+    if not name or not equals or not index.isdecimal():
+        raise argparse.ArgumentTypeError(f"not NAME=K, with K from 0 on: {text}")
+    return name, int(index)
+
+
+def _add_check(parser: argparse.ArgumentParser) -> None:
+    parser.add_argument("--no-check", dest="check", action="store_false",
+                        help="do not refuse a file that was cut off")
+
+
+def _parser() -> argparse.ArgumentParser:
+    parser = _Parser(prog="tessel", description=__doc__)
+    commands = parser.add_subparsers(metavar="COMMAND", required=True)
+
+    def command(name: str, action: Callable[[argparse.Namespace], None],
+                text: str) -> argparse.ArgumentParser:
+        made = commands.add_parser(name, help=text, description=f"{text[0].upper()}{text[1:]}.")
+        made.set_defaults(action=action)
+        return made
+
+    info = command("info", _info, "print what is in a file, and what a variable's values are like")
+    info.add_argument("file", metavar="FILE", help="the netCDF file")
+    info.add_argument("variable", metavar="VARIABLE", nargs="?",
+                      help="the variable; else the first with the most dimensions")
+    _add_check(info)
+
+    plot = command("plot", _plot, "draw a variable: a map, a section or a line, whatever fits")
+    plot.add_argument("file", metavar="FILE", help="the netCDF file")
+    plot.add_argument("variable", metavar="VARIABLE", help="the variable")
+    plot.add_argument("-o", "--output", metavar="PICTURE", required=True,
+                      help="the file of the picture, whose name ends in .png, .pdf or .svg")
+    plot.add_argument("--index", metavar="NAME=K", type=_position, action="append", default=[],
+                      help="the position along a dimension, counted from 0, instead of the first "
+                           "one with values; can be given for several dimensions")
+    _add_check(plot)
+
+    copy = command("copy", _copy, "copy a file of a classic format, value for value")
+    copy.add_argument("source", metavar="SOURCE", help="the netCDF file")
+    copy.add_argument("target", metavar="TARGET", help="the file to make")
+    copy.add_argument("--format", choices=sorted(FORMATS, reverse=True),
+                      help="the format of the new file; else the same")
+    copy.add_argument("--overwrite", action="store_true", help="replace TARGET if it is there")
+    _add_check(copy)
+
+    check = command("check", _check, "find out whether a file was cut off")
+    check.add_argument("file", metavar="FILE", help="the netCDF file")
+
+    ops = command("ops", _ops, "explain the operations of the module")
+    ops.add_argument("name", metavar="NAME", nargs="?", help="the operation; else all are listed")
+    return parser
+
+
+def main(arguments: list[str] | None = None) -> int:
+    """The command line; returns its exit status."""
+    options = _parser().parse_args(arguments)
+    return terminal.run(lambda: options.action(options))

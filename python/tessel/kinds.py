@@ -1,0 +1,93 @@
+# python/tessel/kinds.py: the kinds of arguments and results, and the arguments that many share.
+"""What the operations' arguments may be and their results are."""
+
+from __future__ import annotations
+
+from tessel.operation import Argument, Kind, ResultKind
+
+IDENTIFIER = Kind(
+    "SupportsIndex", "int", "{name} if type({name}) is int else integer({name})",
+    (("TESSEL:netcdf:emptySetID", "has no elements"),
+     ("TESSEL:netcdf:badIDDatatype", "is no whole number")))
+NAME = Kind(
+    "str", "str", "{name}",
+    (("TESSEL:netcdf:argumentWasNotChar", "is no str"),))
+PATH_NAME = Kind("str | os.PathLike[str]", "str or path object", NAME.conversion, NAME.errors)
+MODE = Kind(
+    "str | SupportsIndex", "str or int",
+    "{name} if type({name}) is str else integer({name})",
+    (("TESSEL:netcdf:emptySetMode", "has no elements"),
+     ("TESSEL:netcdf:badModeDatatype", "is neither a name nor a whole number"),
+     ("TESSEL:netcdf:unrecognizedFileMode", "is no name of a mode")))
+TYPE = Kind(
+    "SupportsIndex", "int", IDENTIFIER.conversion,
+    (("TESSEL:netcdf:unpack_xtype:emptySetDatatype", "has no elements"),
+     ("TESSEL:netcdf:unpack_xtype:badDatatype", "is no number"),
+     ("TESSEL:netcdf:invalidNetcdfDatatype", "is not from 0 to 6")))
+SIZE = Kind(
+    "SupportsIndex", "int", IDENTIFIER.conversion,
+    (("TESSEL:netcdf:emptySetSizeParameter", "has no elements"),
+     ("TESSEL:netcdf:badSizeArgumentDatatype", "is no number"),
+     ("TESSEL:netcdf:sizeArgumentIsInfOrNaN", "is infinite or no number"),
+     ("TESSEL:netcdf:negativeSize", "is negative")))
+ANYTHING = Kind(SIZE.annotation, SIZE.wording, SIZE.conversion, ())
+CODE = Kind(
+    "SupportsIndex", "int", IDENTIFIER.conversion,
+    (("TESSEL:netcdf:unpackIntSingleton:argumentIsEmptySet", "has no elements"),
+     ("TESSEL:netcdf:unpackIntSingleton:badNumericType", "is no number")))
+DIMENSIONS = Kind(
+    "Indices", "sequence of int", "identifiers({name})",
+    (("TESSEL:netcdf:unpackDimids:badDimidsType", "are no numbers"),
+     ("TESSEL:netcdf:ndimsLargerThanNetcdfLimits", "are more than 1024")))
+POSITIONS = Kind(
+    "Indices", "sequence of int", "{name} if type({name}) in PLAIN else vector({name})",
+    (("TESSEL:netcdf:{label}ArgumentIsEmpty", "has no elements"),
+     ("TESSEL:netcdf:{label}ArgumentHasBadDatatype", "has elements that are no numbers"),
+     ("TESSEL:netcdf:indexArgumentHasInf", "has an infinite element"),
+     ("TESSEL:netcdf:indexArgumentHasNaN", "has an element that is no number")))
+
+
+def data_kind(dtype: str, operation: str) -> Kind:
+    """Data to write: an array of the dtype, or Python's numbers that are exact in it; text without
+    a dtype."""
+    if not dtype:
+        return Kind("str | bytes | NDArray[numpy.str_]", "str, bytes or array of characters",
+                    "{name}", ())
+    return Kind(f"Numbers | NDArray[numpy.{dtype}]", f"array of {dtype}, or numbers exact in it",
+                f"{{name}} if type({{name}}) is ndarray else "
+                f"numbers({{name}}, dtypes['{dtype}'], '{operation}')", ())
+
+
+NUMBER = ResultKind("int", "int", "int({value}.item())")
+TEXT = ResultKind("str", "str", "{value}")
+CONSTANT = ResultKind("Any", "int or float", "constant({value})")  # as a union, of use to nobody
+NAMES = ResultKind("list[str]", "list of str", "{value}.ravel().tolist()")
+DIMENSION_LIST = ResultKind("tuple[int, ...]", "tuple of int", "tuple(map(int, {value}.flat))")
+
+
+def data_result(dtype: str, row: bool) -> ResultKind:
+    """Data that were read; text without a dtype, which with `row` is a row for certain."""
+    if dtype:
+        return ResultKind(f"NDArray[numpy.{dtype}]", f"array of {dtype}", "{value}")
+    if row:
+        return TEXT
+    return ResultKind("str | NDArray[numpy.str_]", "str or array of characters", "{value}")
+
+
+NCID = Argument("ncid", IDENTIFIER, "The dataset.")
+VARID = Argument("varid", IDENTIFIER, "The variable; for attributes, -1 is the dataset itself.")
+DIMID = Argument("dimid", IDENTIFIER, "The dimension.")
+ATTRIBUTE = Argument("name", NAME, "The attribute's name.", "attribute")
+XTYPE = Argument("xtype", TYPE, """The external type: param("NC_BYTE"), "NC_CHAR", "NC_SHORT",
+    "NC_INT", "NC_FLOAT" or "NC_DOUBLE".""", "datatype")
+INDEX = Argument("index", POSITIONS, """The position in each dimension, from 0, first dimension
+    fastest.""", "start")
+START = Argument("start", POSITIONS, """Where the block begins in each dimension, from 0, first
+    dimension fastest.""")
+COUNT = Argument("count", POSITIONS, """How many elements in each dimension, first dimension
+    fastest.""")
+STRIDE = Argument("stride", POSITIONS, """The step in each dimension, first dimension fastest; 1
+    takes every element.""")
+
+NOT_OPEN = ("notNetcdfID", "ncid is no open dataset")
+NO_VARIABLE = ("variableNotFound", "the dataset has no such variable")

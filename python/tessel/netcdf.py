@@ -1,0 +1,184 @@
+# python/tessel/netcdf.py: the module "netcdf" with a method for every operation.
+"""The methods of the module "netcdf", made of the table in `tessel.operations`.
+
+    >>> import tessel
+    >>> nc = tessel.load("netcdf")
+    >>> ncid = nc.create("new.nc", "CLOBBER")
+    >>> x = nc.def_dim(ncid, "x", 3)
+    >>> varid = nc.def_var(ncid, "length", nc.param("NC_DOUBLE"), [x])
+    >>> nc.enddef(ncid)
+    >>> nc.put_var_double(ncid, varid, [1.5, 2.5, 3.5])
+    >>> nc.inq_var(ncid, varid)
+    InqVar(name='length', xtype=6, dimids=(0,), natts=0)
+    >>> nc.get_vara_double(ncid, varid, start=[1], count=[2])
+    array([[2.5],
+           [3.5]])
+    >>> nc.close(ncid)
+
+Every operation has a method under its short and its long name (`nc.open`, `nc.nc_open`), with the
+library's names for the parameters: without the p of a pointer, and `data` for what is written. Ids,
+counts and sizes are int, names are str, lists of dimensions are tuples, several results are a named
+tuple, and data are the host's arrays, without a copy. What an argument may be is in
+`tessel.arguments`.
+
+The call form, `nc("open", "new.nc", "NOWRITE")`, gives the host's arrays as they are.
+"""
+
+from __future__ import annotations
+
+import os
+from collections import namedtuple
+from collections.abc import Sequence
+from types import FunctionType
+from typing import Any, NamedTuple, SupportsIndex, Union
+
+import numpy
+from numpy import ndarray
+from numpy.typing import NDArray
+
+from tessel._runtime import Module
+from tessel.arguments import identifiers, integer, numbers, vector
+from tessel.operation import Operation
+from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS, find
+
+Indices = Union[SupportsIndex, Sequence[SupportsIndex], NDArray[Any]]
+"""Positions, counts, strides, dimensions."""
+
+Numbers = Union[float, Sequence[Any]]
+"""Data as Python's own numbers."""
+
+
+class Opened(NamedTuple):
+    """What is remembered of an open dataset, for the notes of errors."""
+
+    path: str
+
+
+# By id, for the whole process, as the ids are. An id that others have closed and opened again may
+# lead to the path that it had here.
+_opened: dict[int, Opened] = {}
+
+
+def path_of(ncid: int) -> str | None:
+    """The path with which an open dataset was opened here."""
+    found = _opened.get(ncid)
+    return found.path if found else None
+
+
+def _remember(path: Any, result: Any) -> Any:
+    """The result of an operation that opens."""
+    ncid = result if isinstance(result, int) else result.ncid
+    _opened[ncid] = Opened(_text(path))
+    return result
+
+
+def _known(ncid: Any) -> Opened | None:
+    """What is remembered of a dataset, whatever its id is given as."""
+    return _opened.get(_id(ncid))
+
+
+def _forget(ncid: Any, known: Opened | None, result: None) -> None:
+    """For an operation that ended a dataset, of which this was known before."""
+    if known is not None and _known(ncid) is known:  # not another one of the same id by now
+        _opened.pop(_id(ncid), None)
+
+
+def _text(path: Any) -> str:
+    return os.fsdecode(path) if isinstance(path, (str, bytes, os.PathLike)) else repr(path)
+
+
+def _constant(value: ndarray[Any, Any]) -> int | float:
+    number = float(value.item())
+    return int(number) if abs(number) < 2**53 else number
+
+
+_LIVES = {name: each for each in OPERATIONS if each.opens or each.ends for name in each.names}
+
+
+class Netcdf(Module):
+    """The module "netcdf". Every operation is a method; see `help(tessel.netcdf)`."""
+
+    def __call__(self, *arguments: Any) -> Any:
+        """Call an operation by name: the host's arrays in and out, unchanged."""
+        name = arguments[0] if arguments else None
+        if type(name) is not str or name.lower() not in _LIVES:
+            return _call(self, *arguments)
+        if _LIVES[name.lower()].opens:
+            result = _call(self, *arguments)
+            ncid = result[-1] if isinstance(result, tuple) else result
+            _remember(arguments[1], int(ncid.item()))
+            return result
+        ncid = arguments[1] if len(arguments) > 1 else None
+        _forget(ncid, _known(ncid), _call(self, *arguments))
+        return None
+
+
+def _id(value: Any) -> int:
+    """An id as the module reads it: the first element."""
+    try:
+        return int(numpy.asarray(value).flat[0])
+    except (ValueError, TypeError, IndexError, OverflowError):
+        return -1
+
+
+_call = Module.__call__
+
+_SCOPE: dict[str, Any] = {
+    "Any": Any, "Indices": Indices, "NDArray": NDArray, "Numbers": Numbers,
+    "PLAIN": (list, tuple, ndarray), "SupportsIndex": SupportsIndex, "__name__": __name__,
+    "call": _call, "constant": _constant,
+    "dtypes": {name: numpy.dtype(name) for name in
+               ("float64", "float32", "int32", "int16", "int8", "uint8")},
+    "forget": _forget, "identifiers": identifiers, "integer": integer, "known": _known,
+    "ndarray": ndarray, "numbers": numbers, "numpy": numpy, "os": os, "remember": _remember,
+    "vector": vector,
+}
+
+
+def _source(operation: Operation) -> str:
+    """The method as source text."""
+    given = "".join(f", {each.kind.conversion.format(name=each.name)}"
+                    for each in operation.arguments)
+    value = f"call(self, '{operation.short}'{given})"
+    lines = []
+    if len(operation.results) > 1:
+        names = ", ".join(f"r{i}" for i in range(len(operation.results)))
+        lines.append(f"    {names} = {value}")
+        made = ", ".join(each.kind.conversion.format(value=f"r{i}")
+                         for i, each in enumerate(operation.results))
+        value = f"{operation.several}({made})"
+    elif operation.results:
+        value = operation.results[0].kind.conversion.format(value=value)
+    if operation.opens:
+        value = f"remember(path, {value})"
+    elif operation.ends:
+        value = f"forget(ncid, known(ncid), {value})"
+    lines.append(f"    return {value}")
+    return "\n".join([f"def {operation.short}({operation.parameters}) -> {operation.returns}:",
+                      *lines, ""])
+
+
+def _add_methods() -> None:
+    """Gives the class its methods and this module the classes of several results."""
+    for each in OPERATIONS:
+        if each.several:
+            made = namedtuple(each.several,  # type: ignore[misc]
+                              [result.name for result in each.results], module=__name__)
+            made.__doc__ = f"The results of `{each.short}`."
+            globals()[each.several] = _SCOPE[each.several] = made
+    source = "from __future__ import annotations\n" + "\n".join(map(_source, OPERATIONS))
+    exec(compile(source, "<the methods of tessel.netcdf.Netcdf>", "exec"), _SCOPE)
+    for each in OPERATIONS:
+        written = _SCOPE.pop(each.short)
+        text = each.documentation(EXAMPLE_BEGINNING)
+        for name in each.names:
+            code = written.__code__.replace(co_name=name, co_qualname=f"Netcdf.{name}")
+            method = FunctionType(code, _SCOPE, name)
+            method.__doc__ = text
+            method.__module__ = __name__
+            method.__qualname__ = f"Netcdf.{name}"
+            method.__annotations__ = written.__annotations__
+            setattr(Netcdf, name, method)
+
+
+_add_methods()

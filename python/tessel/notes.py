@@ -1,0 +1,200 @@
+# python/tessel/notes.py: what an error's message cannot say: the call, the file, the variable.
+"""The note of an error: what was called, on what.
+
+The message is the module's and stays so. The note is attached to the exception (`__notes__`), and
+Python shows it below the message. All of it is found out when the error is there: nothing of this
+runs when a call succeeds, and nothing here can fail a call in another way.
+"""
+
+from __future__ import annotations
+
+import os
+import threading
+from collections.abc import Callable, Iterator
+from contextlib import suppress
+from typing import Any
+
+import numpy
+
+from tessel import beginning, operations
+from tessel.errors import Error
+from tessel.operation import Operation
+
+_LONGEST = 60
+_MOST = 12
+
+_busy = threading.local()
+"""Set while this thread makes a note, which asks the module and may meet errors itself."""
+
+
+def explain(error: Error, module: Any, arguments: tuple[Any, ...]) -> None:
+    """Adds to an error what it was that failed."""
+    if getattr(_busy, "now", False):
+        return
+    _busy.now = True
+    try:
+        with suppress(Exception):
+            lines = list(_lines(error, module, arguments))
+            if lines:
+                error.add_note("\n".join(lines))
+    finally:
+        _busy.now = False
+
+
+def _lines(error: Error, module: Any, arguments: tuple[Any, ...]) -> Iterator[str]:
+    if not arguments or not isinstance(arguments[0], str):
+        return
+    from tessel.netcdf import Netcdf  # not earlier: it needs the extension that calls this
+
+    name, *given = arguments
+    row = operations.find(name) if isinstance(module, Netcdf) else None
+    error.operation = row.short if row else name
+    yield f"in {_call(error.operation, row, given)}"
+    if row is not None:
+        values = dict(zip((each.name for each in row.arguments), given))
+        if "path" in values:
+            yield from _file(error, row, values["path"])
+        else:
+            yield from _Subject(module, error, values).lines()
+
+
+def _call(name: str, row: Operation | None, given: list[Any]) -> str:
+    """The call as one might write it."""
+    names = [f"{each.name}=" for each in row.arguments] if row else []
+    names += [""] * (len(given) - len(names))
+    return f"{name}({', '.join(map(str.__add__, names, map(shortened, given)))})"
+
+
+def shortened(value: Any) -> str:
+    """A value as Python writes it, on one line, and not all of it if it is long."""
+    if isinstance(value, numpy.ndarray):
+        if value.dtype.kind in "biuf" and value.size == 1:
+            return str(value.item())
+        what = f"{value.dtype.name} array of shape {value.shape}"
+        return f"<{what}: {value.ravel().tolist()}>" if 0 < value.size <= 4 else f"<{what}>"
+    if isinstance(value, (str, bytes)):
+        return repr(value if len(value) <= _LONGEST else value[:_LONGEST]) + (
+            f"... ({len(value)} characters)" if len(value) > _LONGEST else "")
+    if isinstance(value, (list, tuple)) and len(value) > _MOST:
+        return f"<{type(value).__name__} of {len(value)}>"
+    text = repr(value)
+    return text if len(text) <= _LONGEST else text[:_LONGEST] + "..."
+
+
+def _file(error: Error, row: Operation, path: Any) -> Iterator[str]:
+    """About an operation that opens or creates."""
+    if not isinstance(path, (str, bytes, os.PathLike)):
+        return
+    given = os.fspath(path)
+    if isinstance(error, OSError):
+        error.filename = given
+    if "\0" in os.fsdecode(given) or "://" in os.fsdecode(given):
+        return
+    absolute = os.path.abspath(os.fsdecode(given))
+    yield f"file: {absolute}"
+    if error.word == "noSuchFileOrDirectory":
+        folder = os.path.dirname(absolute)
+        while not os.path.lexists(folder):
+            absolute, folder = folder, os.path.dirname(folder)
+        if absolute != os.path.abspath(os.fsdecode(given)):
+            yield f"there is no folder {absolute}"
+        elif os.path.islink(absolute):
+            yield f"it is a link to {os.readlink(absolute)}, which is not there"
+    elif os.path.isdir(absolute):
+        yield "it is a folder"
+    elif row.short in ("open", "_open") and os.path.isfile(absolute):
+        yield f"it {beginning.described(absolute)}"
+
+
+class _Subject:
+    """The dataset, variable, dimension that a call names, as the module knows them."""
+
+    def __init__(self, module: Any, error: Error, values: dict[str, Any]) -> None:
+        self._module = module
+        self._error = error
+        self._values = values
+
+    def lines(self) -> Iterator[str]:
+        """A line for each that is there."""
+        pairs = [("ncid", "varid"), ("ncid_in", "varid_in"), ("ncid_out", "varid_out")]
+        for ncid_name, varid_name in pairs:
+            ncid = self._number(ncid_name)
+            if ncid is None:
+                continue
+            yield self._dataset(ncid_name, ncid)
+            varid = self._number(varid_name)
+            if varid is not None:
+                yield from self._ask(self._variable, varid_name, ncid, varid)
+        ncid = self._number("ncid")
+        if ncid is not None:
+            yield from self._dimensions(ncid)
+            yield from self._known(ncid)
+
+    def _number(self, name: str) -> int | None:
+        with suppress(Exception):
+            return int(numpy.asarray(self._values[name]).flat[0].real)
+        return None
+
+    @staticmethod
+    def _ask(about: Callable[..., str], *arguments: Any) -> Iterator[str]:
+        """What an inquiry tells; nothing if it is refused as well."""
+        with suppress(Exception):
+            yield about(*arguments)
+
+    def _dataset(self, name: str, ncid: int) -> str:
+        from tessel.netcdf import path_of
+
+        path = path_of(ncid)
+        if path is None:
+            return f"{name} {ncid}: no dataset that was opened here is known by this id"
+        return f"{name} {ncid}: opened as {path!r}"
+
+    def _variable(self, name: str, ncid: int, varid: int) -> str:
+        if varid == -1:
+            return f"{name} -1: the dataset itself"
+        found = self._module.inq_var(ncid, varid)
+        dimensions = ", ".join(self._dimension(ncid, dimid) for dimid in found.dimids)
+        shape = f"({dimensions})" if dimensions else ", a single value"
+        kind = _TYPES.get(found.xtype, f"type {found.xtype}")
+        return f"{name} {varid}: {kind} {found.name}{shape}"
+
+    def _dimension(self, ncid: int, dimid: int) -> str:
+        name, length = self._module.inq_dim(ncid, dimid)
+        unlimited = " unlimited" if self._module.inq(ncid).unlimdimid == dimid else ""
+        return f"{name}={length}{unlimited}"
+
+    def _dimensions(self, ncid: int) -> Iterator[str]:
+        """The dimensions that the call names."""
+        dimids = self._values.get("dimids", self._values.get("dimid"))
+        if dimids is not None:
+            for dimid in map(int, numpy.asarray(dimids).flat[:_MOST]):
+                for text in self._ask(self._dimension, ncid, dimid):
+                    yield f"dimid {dimid}: {text}"
+
+    def _known(self, ncid: int) -> Iterator[str]:
+        """What there is instead of what was not found."""
+        word = self._error.word
+        with suppress(Exception):
+            inq = self._module.inq(ncid)
+            if word == "variableNotFound":
+                yield _list("variables", inq.nvars,
+                            lambda i: str(self._module.inq_var(ncid, i).name))
+            elif word == "invalidDimensionIdOrName":
+                yield _list("dimensions", inq.ndims, lambda i: self._dimension(ncid, i))
+            elif word == "attributeNotFound":
+                varid = self._number("varid")
+                count = inq.natts if varid == -1 else self._module.inq_var(ncid, varid).natts
+                yield _list("attributes", count,
+                            lambda i: str(self._module.inq_attname(ncid, varid, i)))
+
+
+_TYPES = {1: "byte", 2: "char", 3: "short", 4: "int", 5: "float", 6: "double"}
+
+
+def _list(what: str, count: int, name: Callable[[int], str]) -> str:
+    """Some of the names, and how many more there are."""
+    if not count:
+        return f"there are no {what}"
+    names = ", ".join(map(name, range(min(count, _MOST))))
+    more = f" and {count - _MOST} more" if count > _MOST else ""
+    return f"{what}: {names}{more}"

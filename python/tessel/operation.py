@@ -1,0 +1,154 @@
+# python/tessel/operation.py: what one operation of the module is, and how that reads.
+"""The columns of the table of operations: arguments, results and errors of an operation."""
+
+from __future__ import annotations
+
+import textwrap
+from collections.abc import Iterable
+from dataclasses import dataclass
+from functools import cache
+
+from tessel.errors import built_in_of, word_of
+
+Errors = tuple[tuple[str, str], ...]
+"""Pairs of an identifier (or the end of one) and what causes it."""
+
+
+@dataclass(frozen=True)
+class Kind:
+    """What an argument may be."""
+
+    annotation: str
+    """The type, as signatures and stubs write it."""
+
+    wording: str
+    """The type, as documents write it."""
+
+    conversion: str
+    """The expression that a method hands on; {name} is the argument's name."""
+
+    errors: Errors
+    """What the module raises for a bad one; {label} is the module's name for the argument."""
+
+
+@dataclass(frozen=True)
+class Argument:
+    """An argument of an operation."""
+
+    name: str
+    kind: Kind
+    meaning: str
+    label: str = ""
+    """The module's name for it in errors, where that is not `name`."""
+
+
+@dataclass(frozen=True)
+class ResultKind:
+    """What a result is."""
+
+    annotation: str
+    wording: str
+    conversion: str
+    """The expression that makes it of {value}, what the call form gives."""
+
+
+@dataclass(frozen=True)
+class Result:
+    """A result of an operation."""
+
+    name: str
+    kind: ResultKind
+    meaning: str
+
+
+@dataclass(frozen=True)
+class Operation:
+    """One operation of the module."""
+
+    short: str
+    long: str
+    purpose: str
+    arguments: tuple[Argument, ...]
+    results: tuple[Result, ...]
+    errors: Errors
+    """Identifiers and causes, without those of the arguments."""
+
+    example: str
+    """Lines for Python's doctest, to be run after operations.EXAMPLE_BEGINNING."""
+
+    notes: str = ""
+    several: str = ""
+    """The name of the class of the results, where there are several."""
+
+    opens: bool = False
+    """Whether it gives a new dataset."""
+
+    ends: bool = False
+    """Whether the dataset is gone when it has succeeded."""
+
+    @property
+    def names(self) -> tuple[str, ...]:
+        """The names that it has, each once."""
+        return (self.short,) if self.short == self.long else (self.short, self.long)
+
+    @property
+    def returns(self) -> str:
+        """The annotation of what the method returns."""
+        if not self.results:
+            return "None"
+        return self.several or self.results[0].kind.annotation
+
+    @property
+    def parameters(self) -> str:
+        """The parameters as a signature has them."""
+        return ", ".join(["self", *(f"{each.name}: {each.kind.annotation}"
+                                    for each in self.arguments)])
+
+    @property
+    def all_errors(self) -> Errors:
+        """Identifiers and causes; first the number of arguments, then the arguments, then what
+        the operation looks for itself and what the library refuses."""
+        blamed: dict[tuple[str, str], list[str]] = {}
+        for argument in self.arguments:
+            for identifier, cause in argument.kind.errors:
+                full = identifier.format(label=argument.label or argument.name)
+                blamed.setdefault((full, cause), []).append(argument.name)
+        arguments = ((identifier, f"{' or '.join(dict.fromkeys(names))} {cause}")
+                     for (identifier, cause), names in blamed.items())
+        return *self.errors[:1], *arguments, *self.errors[1:]
+
+    def documentation(self, beginning: str) -> str:
+        """The docstring of the method."""
+        sections = [self.purpose]
+        if self.notes:
+            sections.append(_filled(self.notes))
+        if self.arguments:
+            sections.append(_section("Parameters", (
+                f"{each.name} : {each.kind.wording}\n{_filled(each.meaning, 4)}"
+                for each in self.arguments)))
+        if self.results:
+            sections.append(_section("Returns", (
+                f"{each.name} : {each.kind.wording}\n{_filled(each.meaning, 4)}"
+                for each in self.results)))
+        if self.errors:
+            sections.append(_section("Raises", ["tessel.Error\n" + "\n".join(
+                _filled(f"{_shown(identifier)}: {cause}", 4, 8)
+                for identifier, cause in self.all_errors)]))
+        sections.append(_section("Examples", [beginning + self.example.strip()]))
+        return "\n\n".join(sections) + "\n"
+
+
+def _shown(identifier: str) -> str:
+    built_in = built_in_of(word_of(identifier))
+    return f"{identifier} ({built_in.__name__})" if built_in else identifier
+
+
+def _section(title: str, entries: Iterable[str]) -> str:
+    return "\n".join([title, "-" * len(title), *entries])
+
+
+@cache
+def _filled(text: str, indent: int = 0, hanging: int | None = None) -> str:
+    return textwrap.fill(" ".join(text.split()), 92, initial_indent=" " * indent,
+                         subsequent_indent=" " * (indent if hanging is None else hanging),
+                         break_long_words=False, break_on_hyphens=False)

@@ -1,0 +1,108 @@
+# python/tessel/terminal.py: what commands have in common on a terminal: errors, and progress.
+"""Runs a command so that whatever fails is one line, and shows how far long work is."""
+
+from __future__ import annotations
+
+import os
+import signal
+import sys
+import time
+from collections.abc import Callable
+from types import TracebackType
+from typing import TextIO
+
+import tessel
+from tessel import wording
+
+_BAR = 40
+_EVERY = 0.1  # seconds
+
+
+def _message(error: Exception) -> str:
+    if isinstance(error, tessel.Error):
+        file = getattr(error, "filename", None)
+        return f"{error.message}: {file}" if file and str(file) not in error.message \
+            else error.message
+    if isinstance(error, MemoryError):
+        return "There is not enough memory."
+    if isinstance(error, OSError) and error.strerror and error.filename:
+        return f"{error.strerror}: {os.fsdecode(error.filename)}"
+    return str(error)
+
+
+def run(command: Callable[[], None]) -> int:
+    """Runs a command and returns its exit status: 0, or 1 when it failed, which one line on the
+    standard error says. Ctrl-C ends the process as it ends others."""
+    for stream in (sys.stdout, sys.stderr):  # never fail over a character that a terminal lacks
+        stream.reconfigure(errors="backslashreplace")
+    try:
+        command()
+        sys.stdout.flush()
+        return 0
+    except BrokenPipeError:  # whoever read has seen enough
+        os.dup2(os.open(os.devnull, os.O_WRONLY), sys.stdout.fileno())
+        return 0
+    except KeyboardInterrupt:
+        signal.signal(signal.SIGINT, signal.SIG_DFL)
+        os.kill(os.getpid(), signal.SIGINT)
+        return 128 + signal.SIGINT
+    except (tessel.Error, OSError, MemoryError) as error:
+        message = _message(error)
+    try:
+        sys.stdout.flush()
+    except OSError:  # it is what failed
+        os.dup2(os.open(os.devnull, os.O_WRONLY), sys.stdout.fileno())
+    print(wording.printable(message), file=sys.stderr)
+    return 1
+
+
+class ProgressBar:
+    """Shows how far long work is: a line that is drawn anew, on a terminal only. It is what
+    `progress` takes in `tessel.read` and `tessel.copy`."""
+
+    def __init__(self, title: str, stream: TextIO) -> None:
+        self._title = f"{wording.printable(title)} " if title else ""
+        self._stream = stream
+        self._shown = stream.isatty()
+        self._next = 0.0
+        self._open = False
+
+    def __call__(self, done: int, total: int) -> None:
+        """`done` of `total` bytes are done."""
+        now = time.monotonic()
+        if not self._shown or (now < self._next and done < total):
+            return
+        self._next = now + _EVERY
+        share = done / total if total else 1.0
+        bar = "#" * int(_BAR * share)
+        self._stream.write(f"\r{self._title}[{bar:{_BAR}}] {100 * share:3.0f} % "
+                           f"of {wording.size(total)}")
+        self._open = True
+        if done >= total:
+            self.end()
+        self._stream.flush()
+
+    def end(self) -> None:
+        """Ends the line, if one was begun."""
+        if self._open:
+            self._stream.write("\n")
+            self._open = False
+
+    def __enter__(self) -> ProgressBar:
+        return self
+
+    def __exit__(self, kind: type[BaseException] | None, error: BaseException | None,
+                 traceback: TracebackType | None) -> None:
+        self.end()
+
+
+def progress_bar(title: str = "", stream: TextIO | None = None) -> ProgressBar:
+    """A progress bar on a terminal, and nothing in a pipe or a file.
+
+        >>> with tessel.progress_bar("copying") as progress:
+        ...     tessel.copy("sst.nc", "copy.nc", progress=progress)
+
+    Without `with`, a line that is cut short by an error is left as it is. `stream` is the standard
+    error unless given.
+    """
+    return ProgressBar(title, sys.stderr if stream is None else stream)

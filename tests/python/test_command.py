@@ -1,0 +1,336 @@
+# tests/python/test_command.py: the command line.
+"""tessel info, plot, copy, check and ops: what they print, where, and how they fail."""
+
+from __future__ import annotations
+
+import os
+import pty
+import re
+import subprocess
+import sys
+from pathlib import Path
+
+import numpy as np
+import pytest
+import tessel
+from made_files import EVERYTHING, MIB, generate, sparse
+from matplotlib import image
+from tessel import command, picture
+from tessel.dataset import Dataset
+
+FIELD = """
+dimensions: time = UNLIMITED ; z = 3 ; y = 4 ; x = 5 ;
+variables:
+    double time(time) ; time:units = "days since 2001-01-01" ;
+    float z(z) ; z:units = "m" ; z:positive = "down" ;
+    float y(y) ; y:units = "degrees_north" ;
+    float x(x) ; x:units = "degrees_east" ;
+    float t(time, z, y, x) ; t:units = "degC" ; t:long_name = "temperature" ;
+        t:_FillValue = -1.f ;
+    float tz(time, z) ; float zy(z, y) ; float yz(y, z) ; float lonlat(x, y) ; float s(time) ;
+    float profile(z) ; char word(x) ; float nothing(x) ;
+data:
+    time = 0, 31 ; z = 0, 10, 50 ; y = -30, -10, 10, 30 ; x = 0, 10, 20, 30, 40 ;
+"""
+
+
+def ramp(name: str, count: int) -> str:
+    return f"{name} = {', '.join(map(str, range(count)))} ;\n"
+
+
+@pytest.fixture(name="field")
+def field_fixture(tmp_path) -> str:
+    values = ", ".join("-1" if i % 7 == 0 else str(i) for i in range(120))
+    return generate(tmp_path / "field.nc", FIELD + f"t = {values} ;\n" + ramp("tz", 6)
+                    + ramp("zy", 12) + ramp("yz", 12) + ramp("lonlat", 20) + ramp("s", 2)
+                    + ramp("profile", 3) + 'word = "abc" ;')
+
+
+def run(capsys, *arguments: object) -> tuple[int, str, str]:
+    """Exit status, output and errors of a command."""
+    try:
+        status = command.main(list(map(str, arguments)))
+    except SystemExit as left:
+        status = left.code
+    output = capsys.readouterr()
+    return status, output.out, output.err
+
+
+def one_line(result: tuple[int, str, str]) -> str:
+    """The line that a command failed with."""
+    status, output, errors = result
+    assert (status, output) == (1, "")
+    assert errors.endswith("\n")
+    assert errors.count("\n") == 1
+    return errors[:-1]
+
+
+# info
+
+def test_info(capsys, field):
+    status, output, errors = run(capsys, "info", field)
+    assert (status, errors) == (0, "")
+    for expected in (field, "float t(time, z, y, x)", "t: temperature",
+                     "120 (time 2 × z 3 × y 4 × x 5)", "range    1 to 118 degC",
+                     "time  2  unlimited  1 January 2001 to 1 February 2001"):
+        assert re.sub(" +", " ", expected) in re.sub(" +", " ", output)
+    assert "profile\n" in run(capsys, "info", field, "profile")[1]
+    assert '"abc"' in run(capsys, "info", field, "word")[1]
+    assert "  none" in run(capsys, "info", generate(Path(field).with_name("no.nc"), ""))[1]
+
+
+# plot
+
+@pytest.mark.parametrize(("arguments", "kind", "horizontal", "vertical", "downwards"), [
+    (["t"], "map", "x (degrees_east)", "y (degrees_north)", False),
+    (["t", "--index", "x=2"], "section", "y (degrees_north)", "z (m)", True),
+    (["t", "--index", "y=1"], "section", "x (degrees_east)", "z (m)", True),
+    (["t", "--index", "x=2", "--index", "y=1"], "section", "time", "z (m)", True),
+    (["t", "--index", "y=1", "--index", "z=0"], "section", "x (degrees_east)", "time", False),
+    (["t", "--index", "x=1", "--index", "z=0"], "section", "time", "y (degrees_north)", False),
+    (["t", "--index", "x=2", "--index", "y=1", "--index", "time=1"], "line", "degC", "z (m)", True),
+    (["tz"], "section", "time", "z (m)", True),
+    (["zy"], "section", "y (degrees_north)", "z (m)", True),
+    (["yz"], "section", "y (degrees_north)", "z (m)", True),
+    (["lonlat"], "map", "x (degrees_east)", "y (degrees_north)", False),
+    (["s"], "line", "time", "s", False),
+    (["profile"], "line", "profile", "z (m)", True),
+])
+def test_plot(capsys, monkeypatch, field, tmp_path, arguments, kind, horizontal, vertical,
+              downwards):
+    drawn = []
+
+    class Figure(picture.Figure):
+        """Remembers what was drawn."""
+
+        def savefig(self, *where, **how):
+            drawn.append(self)
+            return super().savefig(*where, **how)
+
+    monkeypatch.setattr(picture, "Figure", Figure)
+    target = tmp_path / "picture.png"
+    status, output, errors = run(capsys, "plot", field, *arguments, "-o", target)
+    assert (status, output, errors) == (0, f"The {kind} is in {target}\n", "")
+    axes = drawn[0].axes[0]
+    assert (axes.get_xlabel(), axes.get_ylabel()) == (horizontal, vertical)
+    assert axes.yaxis_inverted() == downwards
+    pixels = image.imread(target)
+    assert pixels.shape[0] > 200 and len(np.unique(pixels.reshape(-1, 4), axis=0)) > 10
+
+
+def test_plot_draws_the_chosen_values_and_masks_missing_ones(monkeypatch, field, tmp_path):
+    drawn = {}
+    monkeypatch.setattr(picture, "_area", lambda figure, axes, variable, part:
+                        drawn.setdefault("part", part) and "section")
+    with Dataset(field) as dataset:
+        variable = dataset.find("t")
+        values = dataset.values(variable)
+        picture.draw(dataset, variable, values, str(tmp_path / "a.png"), {"z": 2, "time": 1})
+    np.testing.assert_array_equal(drawn["part"].values, values[1, 2])
+    assert drawn["part"].values.mask.sum() == values[1, 2].mask.sum() > 0
+    assert drawn["part"].at == ["1 February 2001", "z 50 m"]
+
+
+@pytest.mark.parametrize("ending", ["pdf", "svg", "PNG"])
+def test_other_formats_of_pictures(capsys, field, tmp_path, ending):
+    target = tmp_path / f"picture.{ending}"
+    assert run(capsys, "plot", field, "t", "-o", target)[0] == 0
+    start = {"pdf": b"%PDF", "svg": b"<?xml", "PNG": b"\x89PNG"}[ending]
+    assert target.read_bytes().startswith(start)
+    assert sorted(os.listdir(tmp_path)) == ["field.nc", target.name]
+
+
+@pytest.mark.parametrize(("arguments", "line"), [
+    (["word"], "No picture of word: its values are text."),
+    (["nothing"], "No picture of nothing: all its values are missing."),
+    (["t", "--index", "w=1"], "t has no dimension w."),
+    (["t", "--index", "x=5"], "x has 5 positions, and none is 5; the first is 0."),
+    (["s", "--index", "time=0"], "No picture of s: it is a single value."),
+])
+def test_nothing_to_plot(capsys, field, tmp_path, arguments, line):
+    assert one_line(run(capsys, "plot", field, *arguments, "-o", tmp_path / "a.png")) == line
+    assert os.listdir(tmp_path) == ["field.nc"]
+
+
+def test_pictures_that_cannot_be_written(capsys, field, tmp_path):
+    for target in ("a", "a.nc", "missing/a.png"):
+        assert target in one_line(run(capsys, "plot", field, "t", "-o", tmp_path / target))
+    assert os.listdir(tmp_path) == ["field.nc"]
+
+
+# copy
+
+def test_copy(capsys, tmp_path):
+    source = generate(tmp_path / "source.nc", EVERYTHING)
+    target = tmp_path / "target.nc"
+    assert run(capsys, "copy", source, target, "--format", "64bit-offset") == (0, "", "")
+    assert target.read_bytes()[:4] == b"CDF\2"
+    assert one_line(run(capsys, "copy", source, target)) == f"The target exists already: {target}"
+    assert run(capsys, "copy", source, target, "--overwrite", "--format", "classic") == (0, "", "")
+    assert target.read_bytes()[:4] == b"CDF\1"
+
+
+def on_a_terminal(*arguments: object) -> tuple[int, str]:
+    """Exit status and standard error of the command line with a terminal there."""
+    ours, theirs = pty.openpty()
+    with subprocess.Popen([sys.executable, "-m", "tessel", *map(str, arguments)],
+                          stdout=subprocess.DEVNULL, stderr=theirs) as process:
+        os.close(theirs)
+        seen = b""
+        while True:
+            try:
+                part = os.read(ours, 4096)
+            except OSError:  # the other end is closed
+                break
+            if not part:
+                break
+            seen += part
+    os.close(ours)
+    return process.returncode, seen.decode()
+
+
+def test_progress_bar(tmp_path):
+    source = sparse(tmp_path / "source.nc", 40 * MIB)
+    status, seen = on_a_terminal("copy", source, tmp_path / "target.nc")
+    assert status == 0
+    steps = seen.split("\r")
+    assert len(steps) > 2
+    assert steps[0] == ""
+    assert steps[-2] == f"source.nc [{'#' * 40}] 100 % of 40 MiB"
+    assert steps[-1] == "\n"
+    shares = [int(re.fullmatch(r"source\.nc \[(#*) *\] +(\d+) % of 40 MiB", each)[2])
+              for each in steps[1:-1]]
+    assert shares == sorted(shares)
+    status, seen = on_a_terminal("copy", source, "/proc/target.nc")
+    assert status == 1
+    assert "%" not in seen
+
+
+def test_an_error_begins_a_line_of_its_own(tmp_path, monkeypatch, capsys):
+    source = sparse(tmp_path / "source.nc", MIB)
+    monkeypatch.setattr(sys.stderr, "isatty", lambda: True)
+    stop = iter([False, True])
+
+    def placed(*_):
+        if next(stop):
+            raise OSError(28, "No space left on device", "target.nc")
+
+    monkeypatch.setattr("tessel.transfer._read_block", placed)
+    assert command.main(["copy", source, str(tmp_path / "target.nc")]) == 1
+    assert capsys.readouterr().err.startswith("\rsource.nc [")
+
+
+# check
+
+def test_check(capsys, tmp_path):
+    path = generate(tmp_path / "f.nc", EVERYTHING)
+    size = os.path.getsize(path)
+    status, output, errors = run(capsys, "check", path)
+    assert (status, errors) == (0, "")
+    assert re.fullmatch(rf"{path}: complete; it needs \d+ bytes and has {size}\n", output)
+    os.truncate(path, size - 10)
+    for arguments in (["check"], ["info"], ["plot", "-o", tmp_path / "a.png"], ["copy"]):
+        more = {"plot": ["r3"], "copy": [tmp_path / "copy.nc"]}.get(arguments[0], [])
+        assert one_line(run(capsys, arguments[0], path, *more, *arguments[1:])) == (
+            f"The file is cut off: it has {size - 10} bytes, and what is in it needs "
+            f"{re.search('needs ([0-9]+)', output)[1]}: {path}")
+        if arguments[0] != "check":
+            assert run(capsys, arguments[0], path, *more, *arguments[1:], "--no-check")[0] == 0
+    other = generate(tmp_path / "g.nc", EVERYTHING, "netCDF-4")
+    assert run(capsys, "check", other)[1].startswith(f"{other}: nothing to check; ")
+
+
+# ops
+
+def test_ops(capsys):
+    status, output, errors = run(capsys, "ops")
+    assert (status, errors) == (0, "")
+    lines = output.splitlines()
+    assert len(lines) == 102
+    assert re.fullmatch(r"get_vara_double +\S.*", [x for x in lines if "get_vara_double" in x][0])
+    listed = {line.split()[0] for line in lines}
+    assert {"open", "param", "get_constant_names", "put_vars_text"} <= listed
+
+    output = run(capsys, "ops", "get_vara_double")[1]
+    assert output.startswith("get_vara_double(ncid, varid, start, count)\n\n")
+    assert "TESSEL:netcdf:getVara:" in output
+    for spelling in ("nc_get_vara_double", "NC_GET_VARA_DOUBLE"):
+        assert run(capsys, "ops", spelling)[1] == output
+    assert one_line(run(capsys, "ops", "frob")) == \
+        "There is no operation frob; tessel ops lists all."
+
+
+# In general
+
+@pytest.mark.parametrize("arguments", [["--help"], *([each, "--help"] for each in
+                                                     ("info", "plot", "copy", "check", "ops"))])
+def test_help(capsys, arguments):
+    status, output, errors = run(capsys, *arguments)
+    assert (status, errors) == (0, "")
+    assert output.startswith(f"usage: {' '.join(['tessel', *arguments[:-1]])} ")
+
+
+@pytest.mark.parametrize("arguments", [
+    [], ["frob"], ["info"], ["info", "a", "b", "c"], ["plot", "a", "b"], ["copy", "a"], ["check"],
+    ["copy", "a", "b", "--format", "netCDF-4"], ["plot", "a", "b", "-o", "c", "--index", "x"],
+    ["plot", "a", "b", "-o", "c", "--index", "x=-1"], ["ops", "a", "b"],
+    ["info", "\033[31m", "a", "b"]])
+def test_wrong_usage(capsys, arguments):
+    status, output, errors = run(capsys, *arguments)
+    assert (status, output) == (2, "")
+    assert errors.startswith("usage: tessel")
+    assert "\033" not in errors
+
+
+@pytest.mark.parametrize("name", ["missing.nc", "\033[31mred\a.nc"])
+def test_missing_files(capsys, tmp_path, name):
+    for arguments in (["info", name], ["check", name], ["copy", name, tmp_path / "a.nc"],
+                      ["plot", name, "v", "-o", "a.png"]):
+        line = one_line(run(capsys, *arguments))
+        assert "No such file or directory" in line
+        assert "\033" not in line and "\a" not in line
+
+
+def test_what_is_in_a_file_cannot_steer_a_terminal(capsys, tmp_path):
+    path = Path(generate(tmp_path / "evil.nc", """dimensions: dddd = 2 ;
+        variables: float vvvv(dddd) ; vvvv:aaaa = "bbbb" ; vvvv:units = "uuuu" ;
+            char tttt(dddd) ;
+        data: vvvv = 1, 2 ; tttt = "xx" ;"""))
+    data = path.read_bytes()
+    for text in (b"dddd", b"vvvv", b"aaaa", b"bbbb", b"uuuu", b"tttt"):
+        data = data.replace(text, b"\033[" + text[:1] + b"\a")
+    evil = path.with_name("\033[2Jevil\r.nc")
+    evil.write_bytes(data)
+    target = tmp_path / "\033[31m.png"
+    for arguments in (["info", evil], ["info", evil, "\033[t\a"], ["check", evil],
+                      ["plot", evil, "\033[v\a", "-o", target],
+                      ["plot", evil, "\033[t\a", "-o", target],
+                      ["plot", evil, "\033[v\a", "-o", target, "--index", "\033[d\a=7"],
+                      ["copy", evil, tmp_path / "copy.nc"], ["ops", "\033[x"]):
+        _, output, errors = run(capsys, *arguments)
+        assert output or errors
+        assert not re.search(r"[\x00-\x09\x0b-\x1f\x7f]", output + errors)
+
+
+def test_a_reader_that_has_seen_enough(field):
+    with subprocess.Popen([sys.executable, "-m", "tessel", "ops", "open"],
+                          stdout=subprocess.PIPE, stderr=subprocess.PIPE) as process:
+        process.stdout.close()
+        assert process.stderr.read() == b""
+    assert process.returncode == 0
+
+
+def test_the_program_looks_into_no_current_folder(field, tmp_path):
+    program = Path(tessel.__file__).parents[2] / "bin" / "tessel"
+    folder = tmp_path / "folder"
+    folder.mkdir()
+    for name in ("tessel.py", "numpy.py", "argparse.py"):
+        (folder / name).write_text("raise SystemExit('taken from the current folder')\n")
+    link = tmp_path / "linked"
+    link.symlink_to(program)
+    environment = {name: value for name, value in os.environ.items() if name != "PYTHONPATH"}
+    for each in (program, link):
+        done = subprocess.run([each, "info", field], cwd=folder, env=environment,
+                              capture_output=True, text=True, check=False)
+        assert (done.returncode, done.stderr) == (0, "")
+        assert "float t(time, z, y, x)" in done.stdout

@@ -1,0 +1,496 @@
+# tests/python/test_transfer.py: reading and copying in blocks, and what is left when that fails.
+"""tessel.read and tessel.copy: right values, bounded memory, exact progress, no half a file."""
+
+from __future__ import annotations
+
+import itertools
+import math
+import os
+import signal
+import subprocess
+import sys
+import textwrap
+from pathlib import Path
+
+import numpy as np
+import pytest
+import tessel
+from made_files import EVERYTHING, MIB, NOFILL, OFFSET64, generate, netcdf, open_descriptors, sparse
+from tessel.dataset import Dataset
+from tessel.transfer import blocks
+
+BLOCK_SIZES = [1, 7, 40, 100, 1000, 16 * MIB]
+FORMATS = {"classic": "classic", "64bit-offset": "64-bit offset"}
+
+
+@pytest.fixture(name="everything", params=["classic", "64-bit offset"])
+def everything_fixture(request, tmp_path) -> str:
+    return generate(tmp_path / "everything.nc", EVERYTHING, request.param)
+
+
+def same(one: object, other: object) -> bool:
+    """Whether two results of the module are equal in everything, NaN and zeros' signs included."""
+    if isinstance(one, str) or isinstance(other, str):
+        return one == other
+    return (one.dtype, one.shape, one.tobytes("F")) == (other.dtype, other.shape,
+                                                        other.tobytes("F"))
+
+
+def dump(path: str | Path) -> str:
+    """All of a file as text."""
+    return subprocess.run(["ncdump", "-n", "name", "-p", "9,17", path], capture_output=True,
+                          check=True).stdout.decode("latin-1")
+
+
+def names_in(path: str) -> list[str]:
+    with Dataset(path) as dataset:
+        return list(dataset.variables)
+
+
+def identifier_of(call) -> str:
+    with pytest.raises(tessel.Error) as raised:
+        call()
+    return raised.value.identifier
+
+
+# Blocks
+
+@pytest.mark.parametrize("shape", [(), (1,), (7,), (2, 3), (3, 1, 4), (1, 1, 5), (4, 3, 2, 2), (0,),
+                                   (3, 0, 2)])
+@pytest.mark.parametrize("most", [1, 2, 3, 5, 6, 12, 100])
+def test_blocks_cover_everything_once_and_in_order(shape, most):
+    places = np.arange(math.prod(shape)).reshape(shape)
+    seen = []
+    for start, count in blocks(shape, most):
+        assert 0 < math.prod(count) <= most
+        seen += places[tuple(slice(a, a + n) for a, n in zip(start, count))].ravel().tolist()
+    assert seen == list(range(math.prod(shape)))
+
+
+def test_a_block_is_never_smaller_than_a_value():
+    assert list(blocks((2,), 0)) == [([0], [1]), ([1], [1])]
+
+
+# Reading
+
+@pytest.mark.parametrize("block_bytes", BLOCK_SIZES)
+def test_read_is_what_the_module_reads(everything, block_bytes):
+    ncid = netcdf("open", everything, "NOWRITE")
+    for name in names_in(everything):
+        varid = netcdf("inq_varid", ncid, name)
+        member = {1: "schar", 2: "text", 3: "short", 4: "int", 5: "float", 6: "double"}[
+            int(netcdf("inq_var", ncid, varid)[1][0, 0])]
+        expected = netcdf(f"get_var_{member}", ncid, varid)
+        assert same(tessel.read(everything, name, block_bytes=block_bytes), expected), name
+    netcdf("close", ncid)
+
+
+@pytest.mark.parametrize("block_bytes", [1, 30, 16 * MIB])
+def test_selections(everything, block_bytes):
+    whole = tessel.read(everything, "r3")
+    text = tessel.read(everything, "rtext")
+    assert whole.shape == (5, 3, 3)
+    for start in itertools.product(range(5), range(3), range(3)):
+        rest = whole[tuple(slice(each, None) for each in start)]
+        assert same(tessel.read(everything, "r3", start, block_bytes=block_bytes), rest)
+    for start, count in [((1, 0, 2), (3, 2, 1)), ((0, 1, 0), (5, 1, 3)), ((4, 2, 2), (1, 1, 1)),
+                         ((5, 3, 3), (0, 0, 0)), ((0, 0, 0), (5, 0, 3))]:
+        where = tuple(slice(a, a + n) for a, n in zip(start, count))
+        for name, values in (("r3", whole), ("rtext", text)):
+            assert same(tessel.read(everything, name, start, count, block_bytes=block_bytes),
+                        values[where])
+
+
+def test_selections_of_text_that_are_one_row(everything):
+    expected = "".join(tessel.read(everything, "text")[1, :])
+    for block_bytes in BLOCK_SIZES:
+        assert tessel.read(everything, "text", (1, 0), (1, 3), block_bytes=block_bytes) == expected
+
+
+@pytest.mark.parametrize(("start", "count", "word"), [
+    ((0, 0), None, "badStartLength"),
+    ((0, 0, 0), (1, 1), "badCountLength"),
+    (None, (1,), "badCountLength"),
+    ((0, 0, 1), (5, 3, 3), "indexExceedsDimensionBound"),
+    ((6, 0, 0), None, "indexExceedsDimensionBound"),
+    ((-1, 0, 0), (1, 1, 1), "indexExceedsDimensionBound"),
+    ((0, 0, 0), (1, -1, 1), "indexExceedsDimensionBound"),
+    (None, (10**12, 10**12, 10**12), "indexExceedsDimensionBound"),
+])
+def test_bad_selections(everything, start, count, word):
+    assert identifier_of(lambda: tessel.read(everything, "r3", start, count)) == \
+        f"TESSEL:python:{word}"
+
+
+def test_places_are_integers(everything):
+    with pytest.raises(TypeError):
+        tessel.read(everything, "r3", (0.5, 0, 0))
+
+
+def test_read_errors_are_the_modules(everything, tmp_path):
+    assert identifier_of(lambda: tessel.read(everything, "missing")) == \
+        "TESSEL:netcdf:inqVarID:variableNotFound"
+    assert identifier_of(lambda: tessel.read(tmp_path / "missing.nc", "a")) == \
+        "TESSEL:netcdf:open:noSuchFileOrDirectory"
+    assert identifier_of(lambda: tessel.read(everything, "r3", block_bytes=0)) == \
+        "TESSEL:python:badBlockSize"
+
+
+@pytest.mark.parametrize("block_bytes", [50, 16 * MIB])
+def test_read_into_an_array(everything, tmp_path, block_bytes):
+    expected = tessel.read(everything, "r3")
+    out = np.memmap(tmp_path / "out", float, "w+", shape=expected.shape, order="F")
+    assert tessel.read(everything, "r3", out=out, block_bytes=block_bytes) is out
+    assert same(np.asarray(out), expected)
+    library_order = np.zeros(expected.shape[::-1])
+    tessel.read(everything, "r3", out=library_order.T, block_bytes=block_bytes)
+    assert same(library_order.T, expected)
+    text = np.zeros((5, 1), "U1")
+    tessel.read(everything, "word", out=text)
+    assert text.tobytes().decode("utf-32-le") == "a b\0\0"
+    assert identifier_of(lambda: tessel.read(everything, "r3", out=np.empty((5, 3)))) == \
+        "TESSEL:python:badShape"
+    assert identifier_of(lambda: tessel.read(everything, "r3", out=np.empty((5, 3, 3), "f4"))) == \
+        "TESSEL:python:unsupportedDtype"
+
+
+def test_types_beyond_the_classic_ones(tmp_path):
+    path = generate(tmp_path / "new.nc", """dimensions: x = 3 ;
+        variables: int64 a(x) ; uint64 b(x) ; uint c(x) ; ushort d(x) ; ubyte e(x) ; string f(x) ;
+        data: a = -9007199254740991, 0, 9007199254740991 ; b = 1, 2, 9007199254740993 ;
+            c = 1, 2, 4294967295 ; d = 1, 2, 65535 ; e = 1, 2, 255 ; f = "a", "b", "c" ;""",
+                    "netCDF-4")
+    for block_bytes in (8, 16 * MIB):
+        read = {name: tessel.read(path, name, block_bytes=block_bytes) for name in "acde"}
+        assert {name: (str(each.dtype), each.ravel().tolist()) for name, each in read.items()} == {
+            "a": ("float64", [-(2**53 - 1), 0, 2**53 - 1]), "c": ("float64", [1, 2, 2**32 - 1]),
+            "d": ("int32", [1, 2, 65535]), "e": ("uint8", [1, 2, 255])}
+        assert identifier_of(lambda: tessel.read(path, "b", block_bytes=block_bytes)) == \
+            "TESSEL:python:notExact"
+        assert identifier_of(lambda: tessel.read(path, "f", block_bytes=block_bytes)) == \
+            "TESSEL:netcdf:getVara:attemptToConvertBetweenTextAndNumbers"
+
+
+@pytest.mark.parametrize(("block_bytes", "calls"), [
+    (16 * MIB, [0, 360]), (360, [0, 360]), (359, [0, 240, 360]), (120, [0, 120, 240, 360]),
+    (80, [0, 80, 120, 200, 240, 320, 360]), (8, list(range(0, 361, 8)))])
+def test_progress_of_reading(everything, block_bytes, calls):
+    told = []
+    tessel.read(everything, "r3", block_bytes=block_bytes,
+                progress=lambda done, total: told.append((done, total)))
+    assert told == [(done, 360) for done in calls]
+
+
+# Copying
+
+@pytest.mark.parametrize("target_format", FORMATS)
+@pytest.mark.parametrize("block_bytes", BLOCK_SIZES)
+def test_copy_is_equal(everything, tmp_path, target_format, block_bytes):
+    target = tmp_path / "copy.nc"
+    tessel.copy(everything, target, target_format, block_bytes=block_bytes)
+    assert dump(target) == dump(everything)
+    for name in names_in(everything):
+        assert same(tessel.read(target, name), tessel.read(everything, name)), name
+    kind = subprocess.run(["ncdump", "-k", target], capture_output=True, check=True, text=True)
+    assert kind.stdout.strip() == FORMATS[target_format]
+    assert tessel.check(target) <= target.stat().st_size <= tessel.check(target) + 3
+
+
+def test_copy_keeps_the_format_unless_told_otherwise(everything, tmp_path):
+    target = tmp_path / "copy.nc"
+    tessel.copy(everything, target)
+    assert target.read_bytes()[:4] == Path(everything).read_bytes()[:4]
+    back, again = tmp_path / "back.nc", tmp_path / "again.nc"
+    tessel.copy(target, back, "64bit-offset")
+    tessel.copy(back, again, "classic")
+    tessel.copy(everything, target, "classic", overwrite=True)
+    assert again.read_bytes() == target.read_bytes()
+
+
+@pytest.mark.parametrize("cdl", [
+    "", "dimensions: x = 3 ;", "dimensions: r = UNLIMITED ; variables: int a(r) ;",
+    'variables: double s ; :note = "none" ; data: s = 5 ;',
+    "dimensions: r = UNLIMITED ; variables: byte a(r) ; data: a = 1, 2, 3, 4, 5 ;",
+    "dimensions: x = 3 ; r = UNLIMITED ; variables: short a(r, x) ; data: a = 1, 2, 3, 4, 5, 6 ;",
+    "dimensions: größe = 2 ; variables: int überall(größe) ; überall:maß = 1 ; "
+    "data: überall = 1, 2 ;"])
+@pytest.mark.parametrize("target_format", FORMATS)
+def test_copy_of_small_schemas(tmp_path, cdl, target_format):
+    source = generate(tmp_path / "small.nc", cdl.encode().decode("latin-1"))
+    target = tmp_path / "copy.nc"
+    tessel.copy(source, target, target_format)
+    assert dump(target) == dump(source)
+
+
+def test_copy_of_real_files(tmp_path):
+    folder = Path(subprocess.run(["dpkg", "-L", "ferret-datasets"], capture_output=True, check=True,
+                                 text=True).stdout.split("/coads_climatology.cdf")[0].split()[-1])
+    for name in ("coads_climatology.cdf", "ocean_atlas_subset.nc"):
+        there, back = tmp_path / "there.nc", tmp_path / "back.nc"
+        tessel.copy(folder / name, there, "64bit-offset", block_bytes=MIB)
+        tessel.copy(there, back, "classic", block_bytes=100000)
+        assert back.read_bytes() == (folder / name).read_bytes()
+        there.unlink()
+        back.unlink()
+
+
+def test_progress_of_copying(everything, tmp_path):
+    total = sum({"float": 4, "byte": 1, "char": 1, "double": 8, "short": 2, "int": 4}[kind] * many
+                for kind, many in [("float", 15), ("byte", 15), ("char", 15), ("double", 1),
+                                   ("short", 3), ("char", 5), ("char", 1), ("char", 45),
+                                   ("int", 5), ("double", 45)])
+    for number, block_bytes in enumerate(BLOCK_SIZES):
+        told = []
+        tessel.copy(everything, tmp_path / f"{number}.nc", block_bytes=block_bytes,
+                    progress=lambda done, all: told.append((done, all)))
+        assert {each[1] for each in told} == {total}
+        done = [each[0] for each in told]
+        assert (done[0], done[-1]) == (0, total)
+        assert done == sorted(set(done))
+
+
+def test_the_default_format_is_not_touched(everything, tmp_path):
+    before = netcdf("set_default_format", 2)
+    try:
+        tessel.copy(everything, tmp_path / "copy.nc", "classic")
+        assert (tmp_path / "copy.nc").read_bytes()[:4] == b"CDF\1"
+        assert netcdf("set_default_format", 2)[0, 0] == 2
+    finally:
+        netcdf("set_default_format", before)
+
+
+def test_what_the_format_cannot_hold(tmp_path):
+    source = tmp_path / "large.nc"
+    ncid = netcdf("create", source, OFFSET64)
+    netcdf("set_fill", ncid, NOFILL)
+    dimid = netcdf("def_dim", ncid, "x", 3 * 2**28)
+    for name in ("a", "b"):
+        netcdf("def_var", ncid, name, 4, dimid)
+    netcdf("enddef", ncid)
+    netcdf("put_var1_int", ncid, 1, 3.0 * 2**28 - 1, np.array([1], np.int32))
+    netcdf("close", ncid)
+    assert source.stat().st_size > 6 * 2**30 > source.stat().st_blocks * 512
+    before = open_descriptors()
+    assert identifier_of(lambda: tessel.copy(source, tmp_path / "classic.nc", "classic")) == \
+        "TESSEL:netcdf:endDef:formatSizeConstraintsViolated"
+    assert os.listdir(tmp_path) == ["large.nc"]
+    assert open_descriptors() == before
+
+
+def test_types_that_the_format_lacks(tmp_path):
+    source = generate(tmp_path / "wide.nc", """dimensions: x = 2 ; variables: ubyte a(x) ;
+        data: a = 1, 2 ;""", "cdf5")
+    assert identifier_of(lambda: tessel.copy(source, tmp_path / "copy.nc", "classic")) == \
+        "TESSEL:netcdf:invalidNetcdfDatatype"
+    assert identifier_of(lambda: tessel.copy(source, tmp_path / "copy.nc")) == \
+        "TESSEL:python:badFormat"
+    assert os.listdir(tmp_path) == ["wide.nc"]
+
+
+def test_other_sources_and_formats_are_refused(everything, tmp_path):
+    source = generate(tmp_path / "new.nc", EVERYTHING, "netCDF-4")
+    assert identifier_of(lambda: tessel.copy(source, tmp_path / "copy.nc")) == \
+        "TESSEL:python:notAClassicFile"
+    assert identifier_of(lambda: tessel.copy(everything, tmp_path / "copy.nc", "netCDF-4")) == \
+        "TESSEL:python:badFormat"
+    assert identifier_of(lambda: tessel.copy(tmp_path / "no.nc", tmp_path / "copy.nc")) == \
+        "TESSEL:netcdf:open:noSuchFileOrDirectory"
+    assert sorted(os.listdir(tmp_path)) == ["everything.nc", "new.nc"]
+
+
+# Targets
+
+def test_a_target_is_kept_unless_told_otherwise(everything, tmp_path):
+    target = tmp_path / "copy.nc"
+    target.write_text("kept")
+    assert identifier_of(lambda: tessel.copy(everything, target)) == "TESSEL:python:fileExists"
+    assert target.read_text() == "kept"
+    tessel.copy(everything, target, overwrite=True)
+    assert dump(target) == dump(everything)
+    assert sorted(os.listdir(tmp_path)) == ["copy.nc", "everything.nc"]
+
+
+def test_a_target_that_appears_meanwhile_is_kept(everything, tmp_path):
+    target = tmp_path / "copy.nc"
+    assert identifier_of(lambda: tessel.copy(
+        everything, target, progress=lambda *_: target.write_text("kept"))) == \
+        "TESSEL:python:fileExists"
+    assert target.read_text() == "kept"
+    assert sorted(os.listdir(tmp_path)) == ["copy.nc", "everything.nc"]
+
+
+@pytest.mark.parametrize("way", ["same name", "other spelling", "symbolic link", "hard link"])
+@pytest.mark.parametrize("overwrite", [False, True])
+def test_the_source_is_no_target(everything, tmp_path, way, overwrite):
+    other = tmp_path / "other.nc"
+    if way == "symbolic link":
+        other.symlink_to(everything)
+    elif way == "hard link":
+        other.hardlink_to(everything)
+    target = {"same name": everything,
+              "other spelling": f"{tmp_path}/../{tmp_path.name}/./everything.nc"}.get(way, other)
+    content = Path(everything).read_bytes()
+    assert identifier_of(lambda: tessel.copy(everything, target, overwrite=overwrite)) == \
+        "TESSEL:python:sameFile"
+    assert Path(everything).read_bytes() == content
+
+
+def test_a_link_stays_one(everything, tmp_path):
+    folder = tmp_path / "folder"
+    folder.mkdir()
+    real, link = folder / "real.nc", tmp_path / "link.nc"
+    real.write_text("old")
+    link.symlink_to(real)
+    assert identifier_of(lambda: tessel.copy(everything, link)) == "TESSEL:python:fileExists"
+    tessel.copy(everything, link, overwrite=True)
+    assert link.is_symlink()
+    assert dump(real) == dump(everything)
+    real.unlink()
+    assert identifier_of(lambda: tessel.copy(everything, link)) == "TESSEL:python:fileExists"
+    assert os.listdir(folder) == []
+
+
+def test_a_target_that_is_no_file(everything, tmp_path):
+    folder, pipe = tmp_path / "folder", tmp_path / "pipe"
+    folder.mkdir()
+    os.mkfifo(pipe)
+    for target in (folder, pipe, "/dev/null"):
+        assert identifier_of(lambda t=target: tessel.copy(everything, t, overwrite=True)) == \
+            "TESSEL:python:notARegularFile"
+
+
+def test_folders_that_take_no_file(everything, tmp_path):
+    assert identifier_of(lambda: tessel.copy(everything, tmp_path / "missing" / "copy.nc")) == \
+        "TESSEL:netcdf:create:noSuchFileOrDirectory"
+    closed = tmp_path / "closed"
+    closed.mkdir(0o555)
+    if os.geteuid():  # nothing is closed to root
+        assert identifier_of(lambda: tessel.copy(everything, closed / "copy.nc")) == \
+            "TESSEL:netcdf:create:permissionDenied"
+    assert os.listdir(closed) == []
+    with pytest.raises(tessel.Error):
+        tessel.copy(everything, "/proc/copy.nc")
+
+
+def test_permissions_are_those_of_any_new_file(everything, tmp_path):
+    before = os.umask(0o027)
+    try:
+        tessel.copy(everything, tmp_path / "copy.nc")
+    finally:
+        os.umask(before)
+    assert (tmp_path / "copy.nc").stat().st_mode & 0o777 == 0o640
+
+
+@pytest.mark.parametrize("error", [KeyboardInterrupt, ZeroDivisionError])
+@pytest.mark.parametrize("at", [0, 1, 5, -1])
+def test_nothing_is_left_when_progress_raises(everything, tmp_path, error, at):
+    told = []
+    tessel.copy(everything, tmp_path / "whole.nc", block_bytes=100,
+                progress=lambda done, _: told.append(done))
+    stop = told[at]
+    before = open_descriptors()
+
+    def interrupt(done, _):
+        if done == stop:
+            raise error
+
+    with pytest.raises(error):
+        tessel.copy(everything, tmp_path / "copy.nc", block_bytes=100, progress=interrupt)
+    stop = 0
+    with pytest.raises(error):
+        tessel.read(everything, "r3", block_bytes=100, progress=interrupt)
+    assert open_descriptors() == before
+    assert sorted(os.listdir(tmp_path)) == ["everything.nc", "whole.nc"]
+
+
+# In processes of their own
+
+def child(program: str, *arguments: object, **more: object) -> subprocess.Popen:
+    return subprocess.Popen([sys.executable, "-c", textwrap.dedent(program),
+                             *map(str, arguments)], stdout=subprocess.PIPE, stderr=subprocess.PIPE,
+                            text=True, **more)
+
+
+@pytest.mark.parametrize("command", ["copy", "command line", "read"])
+def test_interrupt(tmp_path, command):
+    source = sparse(tmp_path / "large.nc", 2**31)
+    target = tmp_path / "copy.nc"
+    program = {
+        "copy": """
+            import sys, tessel
+            tessel.copy(sys.argv[1], sys.argv[2], progress=lambda *each: print(*each, flush=True))
+            """,
+        "read": """
+            import sys, numpy, tessel
+            out = numpy.memmap(sys.argv[2] + ".part", "i4", "w+", shape=(1024, 2**19), order="F")
+            tessel.read(sys.argv[1], "big", out=out,
+                        progress=lambda *each: print(*each, flush=True))
+            """,
+        "command line": """
+            import sys
+            from tessel import command, terminal
+            terminal.ProgressBar.__call__ = lambda self, *each: print(*each, flush=True)
+            sys.exit(command.main(["copy", *sys.argv[1:]]))
+            """}[command]
+    with child(program, source, target) as process:
+        for line in process.stdout:  # begun, and not yet done
+            done, total = map(int, line.split())
+            if done > 0:
+                break
+        assert 0 < done < total == 2**31
+        process.send_signal(signal.SIGINT)
+        output, errors = process.communicate(timeout=60)
+        assert process.returncode == -signal.SIGINT
+        last = int((output.split("\n")[-2] if output else line).split()[0])
+        assert last < total
+    assert ("KeyboardInterrupt" in errors) == (command != "command line")
+    assert [each for each in os.listdir(tmp_path) if "tessel" in each or each == "copy.nc"] == []
+
+
+def test_disk_full(tmp_path):
+    source = sparse(tmp_path / "source.nc", 4 * MIB)
+    program = """
+        import os, resource, sys, tessel
+        limit = int(sys.argv[3])
+        resource.setrlimit(resource.RLIMIT_FSIZE, (limit, limit))
+        files = lambda: len(os.listdir("/proc/self/fd"))
+        before = files()
+        for _ in range(3):
+            try:
+                tessel.copy(sys.argv[1], sys.argv[2], block_bytes=100000)
+            except tessel.Error as error:
+                print(error.identifier, files() - before, sorted(os.listdir(sys.argv[4])))
+        """
+    for limit in (100, 300000, 4 * MIB - 10, 4 * MIB):
+        with child(program, source, tmp_path / "copy.nc", limit, tmp_path) as process:
+            output, errors = process.communicate(timeout=60)
+        assert errors == ""
+        assert process.returncode == 0
+        for line in output.splitlines() or [""]:
+            identifier, more, left = line.split(" ", 2)
+            assert identifier.endswith(":fileTooLarge")
+            assert (more, left) == ("0", "['source.nc']")
+        assert len(output.splitlines()) == 3
+
+
+def test_memory_is_bounded(tmp_path):
+    size = 2**30
+    source = sparse(tmp_path / "large.nc", size)
+    program = """
+        import pathlib, re, sys, tessel
+        def most():  # the most memory that this process has ever had, in KiB
+            status = pathlib.Path("/proc/self/status").read_text()
+            return int(re.search(r"VmHWM:\\s*(\\d+)", status)[1])
+        begun = most()
+        tessel.copy(sys.argv[1], sys.argv[2], block_bytes=16 * 2**20)
+        print(most() - begun)
+        """
+    target = tmp_path / "copy.nc"
+    with child(program, source, target) as process:
+        output, errors = process.communicate(timeout=300)
+    assert (errors, process.returncode) == ("", 0)
+    assert 16 * MIB <= int(output) * 1024 < 40 * MIB
+    assert target.stat().st_size == Path(source).stat().st_size
+    last = tessel.read(target, "big", (1022, size // 4096 - 1))
+    assert last.ravel().tolist() == [0, 1]
+    target.unlink()
