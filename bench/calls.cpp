@@ -84,8 +84,8 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
     };
     return {
         {"inq_dimid, inputs at hand", direct, arrays},
-        {                           "inq_dimid, inputs made",                     direct, values      },
-        { "get_var_double of 256 MiB",                       readDirect,                         read,       true},
+        {"inq_dimid, inputs made", direct, values},
+        {"get_var_double of 256 MiB", readDirect, read, true},
     };
 }
 

@@ -23,10 +23,10 @@ struct ModeName {
 };
 
 constexpr std::array modeNames = {
-    ModeName{"CLOBBER",   NC_CLOBBER  },
+    ModeName{"CLOBBER", NC_CLOBBER},
     ModeName{"NOCLOBBER", NC_NOCLOBBER},
-    ModeName{"WRITE",     NC_WRITE    },
-    ModeName{"NOWRITE",   NC_NOWRITE  },
+    ModeName{"WRITE", NC_WRITE},
+    ModeName{"NOWRITE", NC_NOWRITE},
 };
 
 /// The first element of a double or int32 array as an int.

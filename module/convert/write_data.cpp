@@ -28,10 +28,7 @@ struct Required {
 
 /// By the member's place in its family.
 constexpr auto required = []<class... T>(TypeList<T...>) {
-    return std::array{
-        Required{memory<T>::hostClass, memory<T>::description}
-        ...
-    };
+    return std::array{Required{memory<T>::hostClass, memory<T>::description}...};
 }(MemoryTypes{});
 
 } // namespace

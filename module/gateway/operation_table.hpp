@@ -14,7 +14,7 @@ namespace tessel::netcdf {
 
 /// The rows in stored order, which is neither that of the names nor that of the ids.
 inline constexpr auto operationTable = std::to_array<OperationEntry>({
-  // clang-format off
+    // clang-format off
     {  0, "nc_abort",              "abort",              abortHandler},
     {  1, "nc_close",              "close",              closeHandler},
     {  2, "nc_copy_att",           "copy_att",           copyAttHandler},
@@ -117,7 +117,7 @@ inline constexpr auto operationTable = std::to_array<OperationEntry>({
     { 99, "nc_set_fill",           "set_fill",           setFillHandler},
     {100, "nc_strerror",           "strerror",           strerrorHandler},
     {101, "nc_sync",               "sync",               syncHandler},
-  // clang-format on
+    // clang-format on
 });
 
 static_assert(operationTable.size() == 102);

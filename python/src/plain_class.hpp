@@ -23,17 +23,17 @@ struct PlainClass {
 using NumPy = pybind11::detail::npy_api;
 
 inline constexpr std::array plainClasses = {
-    PlainClass{tsLOGICAL, 'b', 1, NumPy::NPY_BOOL_  },
-    PlainClass{tsDOUBLE,  'f', 8, NumPy::NPY_DOUBLE_},
-    PlainClass{tsSINGLE,  'f', 4, NumPy::NPY_FLOAT_ },
-    PlainClass{tsINT8,    'i', 1, NumPy::NPY_INT8_  },
-    PlainClass{tsUINT8,   'u', 1, NumPy::NPY_UINT8_ },
-    PlainClass{tsINT16,   'i', 2, NumPy::NPY_INT16_ },
-    PlainClass{tsUINT16,  'u', 2, NumPy::NPY_UINT16_},
-    PlainClass{tsINT32,   'i', 4, NumPy::NPY_INT32_ },
-    PlainClass{tsUINT32,  'u', 4, NumPy::NPY_UINT32_},
-    PlainClass{tsINT64,   'i', 8, NumPy::NPY_INT64_ },
-    PlainClass{tsUINT64,  'u', 8, NumPy::NPY_UINT64_},
+    PlainClass{tsLOGICAL, 'b', 1, NumPy::NPY_BOOL_},
+    PlainClass{tsDOUBLE, 'f', 8, NumPy::NPY_DOUBLE_},
+    PlainClass{tsSINGLE, 'f', 4, NumPy::NPY_FLOAT_},
+    PlainClass{tsINT8, 'i', 1, NumPy::NPY_INT8_},
+    PlainClass{tsUINT8, 'u', 1, NumPy::NPY_UINT8_},
+    PlainClass{tsINT16, 'i', 2, NumPy::NPY_INT16_},
+    PlainClass{tsUINT16, 'u', 2, NumPy::NPY_UINT16_},
+    PlainClass{tsINT32, 'i', 4, NumPy::NPY_INT32_},
+    PlainClass{tsUINT32, 'u', 4, NumPy::NPY_UINT32_},
+    PlainClass{tsINT64, 'i', 8, NumPy::NPY_INT64_},
+    PlainClass{tsUINT64, 'u', 8, NumPy::NPY_UINT64_},
 };
 
 /// The row of a dtype; nullptr for a dtype that no class holds as it is.

@@ -18,26 +18,24 @@ struct ClassFacts {
 };
 
 /// By class id.
-constexpr std::array<ClassFacts, tsFUNCTION + 1> classes = {
-    {
-     {"unknown", 0, false},
-     {"cell", 0, false},
-     {"struct", 0, false},
-     {"logical", 1, false},
-     {"char", sizeof(tsChar), false},
-     {"double", 8, true},
-     {"single", 4, true},
-     {"int8", 1, true},
-     {"uint8", 1, true},
-     {"int16", 2, true},
-     {"uint16", 2, true},
-     {"int32", 4, true},
-     {"uint32", 4, true},
-     {"int64", 8, true},
-     {"uint64", 8, true},
-     {"function_handle", 0, false},
-     }
-};
+constexpr std::array<ClassFacts, tsFUNCTION + 1> classes = {{
+    {"unknown", 0, false},
+    {"cell", 0, false},
+    {"struct", 0, false},
+    {"logical", 1, false},
+    {"char", sizeof(tsChar), false},
+    {"double", 8, true},
+    {"single", 4, true},
+    {"int8", 1, true},
+    {"uint8", 1, true},
+    {"int16", 2, true},
+    {"uint16", 2, true},
+    {"int32", 4, true},
+    {"uint32", 4, true},
+    {"int64", 8, true},
+    {"uint64", 8, true},
+    {"function_handle", 0, false},
+}};
 
 const ClassFacts &factsOf(tsClassID classID) noexcept {
     const auto index = static_cast<std::size_t>(classID);

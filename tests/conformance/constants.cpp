@@ -58,16 +58,11 @@ Rows values() {
             names.emplace_back(constant.shortName);
         }
         for (const std::string &name : names) {
-            list.push_back({
-                name, On::nothing, {"param", name.c_str()},
-                  gives({constant.value      }
-                  )
-            });
-            list.push_back({
-                lower(name), On::nothing, {"param", lower(name).c_str()},
-                  gives({constant.value      }
-                  )
-            });
+            list.push_back({name, On::nothing, {"param", name.c_str()}, gives({constant.value})});
+            list.push_back({lower(name),
+                            On::nothing,
+                            {"param", lower(name).c_str()},
+                            gives({constant.value})});
         }
     }
     return list;

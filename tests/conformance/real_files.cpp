@@ -149,11 +149,8 @@ void compareVariable(int ncid, int varid, const Vector &lengths, const Direct<T>
             return;
         }
     }
-    Compared<T>{
-        direct, status, values, {1, 1},
-           "Single datum retrieval failed"
-    }
-        .with("get_var1_", ncid, varid, hostVector(third));
+    Compared<T>{direct, status, values, {1, 1}, "Single datum retrieval failed"}.with(
+        "get_var1_", ncid, varid, hostVector(third));
 }
 
 template <class T>
@@ -169,13 +166,11 @@ void compareAttribute(int ncid, int varid, const std::string &name, std::size_t 
         }
     }
     values.resize(length);
-    Compared<T>{
-        direct,
-        status,
-        values,
-        {length == 0 ? 0U : 1U, length},
-        "Attribute retrieval operation failed"
-    }
+    Compared<T>{direct,
+                status,
+                values,
+                {length == 0 ? 0U : 1U, length},
+                "Attribute retrieval operation failed"}
         .with("get_att_", ncid, varid, name);
 }
 

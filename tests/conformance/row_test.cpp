@@ -20,29 +20,21 @@ constexpr const char *message =
     R"(Unable to sync netCDF file, library error message "NetCDF: Not a valid ID")";
 
 Row defining() {
-    return {
-        "a dimension is defined",
-        On::sampleDefine,
-        {"def_dim",                             ncid, "lon", 360},
-        gives({6                                 }
-        ),
-        {"+ dimension 6: lon = 360"   },
-        {"nc_def_dim(ncid, \"lon\", 360, out)", "tsCreateDoubleScalar(6)"                                     }
-    };
+    return {"a dimension is defined",
+            On::sampleDefine,
+            {"def_dim", ncid, "lon", 360},
+            gives({6}),
+            {"+ dimension 6: lon = 360"},
+            {"nc_def_dim(ncid, \"lon\", 360, out)", "tsCreateDoubleScalar(6)"}};
 }
 Row failing() {
-    return {
-        "no dataset", On::nothing, {"sync", 5},
-          fails(identifier, message)
-    };
+    return {"no dataset", On::nothing, {"sync", 5}, fails(identifier, message)};
 }
 Row refusing() {
-    return {
-        "no id",
-        On::nothing,
-        {"sync", empty(tsDOUBLE)},
-        refuses("TESSEL:netcdf:emptySetID", "ncid argument cannot be []")
-    };
+    return {"no id",
+            On::nothing,
+            {"sync", empty(tsDOUBLE)},
+            refuses("TESSEL:netcdf:emptySetID", "ncid argument cannot be []")};
 }
 
 Row with(Row row, Outcome outcome) {

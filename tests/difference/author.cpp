@@ -12,69 +12,27 @@
 namespace difference {
 
 const std::vector<Author::Weight> Author::withoutDataset = {
-    {Verb::create,           50},
-    {Verb::createTuned,      20},
-    {Verb::open,             12},
-    {Verb::openTuned,        12},
-    {Verb::setDefaultFormat, 8 },
-    {Verb::inqLibvers,       2 },
-    {Verb::strerror,         3 },
-    {Verb::parameter,        3 },
-    {Verb::constantNames,    1 },
+    {Verb::create, 50},    {Verb::createTuned, 20},     {Verb::open, 12},
+    {Verb::openTuned, 12}, {Verb::setDefaultFormat, 8}, {Verb::inqLibvers, 2},
+    {Verb::strerror, 3},   {Verb::parameter, 3},        {Verb::constantNames, 1},
 };
 
 const std::vector<Author::Weight> Author::inDefineMode = {
-    {Verb::defDim,      20},
-    {Verb::defVar,      30},
-    {Verb::putAtt,      30},
-    {Verb::getAtt,      10},
-    {Verb::enddef,      34},
-    {Verb::enddefTuned, 14},
-    {Verb::renameDim,   5 },
-    {Verb::renameVar,   5 },
-    {Verb::renameAtt,   6 },
-    {Verb::delAtt,      6 },
-    {Verb::copyAtt,     8 },
-    {Verb::setFill,     6 },
-    {Verb::inqDim,      3 },
-    {Verb::inqVar,      3 },
-    {Verb::inqAtt,      3 },
-    {Verb::inqAttid,    3 },
-    {Verb::inqAttname,  3 },
-    {Verb::abort,       2 },
-    {Verb::close,       2 },
-    {Verb::create,      3 },
+    {Verb::defDim, 20},    {Verb::defVar, 30},      {Verb::putAtt, 30},   {Verb::getAtt, 10},
+    {Verb::enddef, 34},    {Verb::enddefTuned, 14}, {Verb::renameDim, 5}, {Verb::renameVar, 5},
+    {Verb::renameAtt, 6},  {Verb::delAtt, 6},       {Verb::copyAtt, 8},   {Verb::setFill, 6},
+    {Verb::inqDim, 3},     {Verb::inqVar, 3},       {Verb::inqAtt, 3},    {Verb::inqAttid, 3},
+    {Verb::inqAttname, 3}, {Verb::abort, 2},        {Verb::close, 2},     {Verb::create, 3},
 };
 
 const std::vector<Author::Weight> Author::inDataMode = {
-    {Verb::putVar,     40},
-    {Verb::putVar1,    36},
-    {Verb::putVara,    44},
-    {Verb::putVars,    44},
-    {Verb::getVar,     34},
-    {Verb::getVar1,    34},
-    {Verb::getVara,    40},
-    {Verb::getVars,    40},
-    {Verb::getAtt,     40},
-    {Verb::putAtt,     8 },
-    {Verb::inq,        5 },
-    {Verb::inqDim,     5 },
-    {Verb::inqDimid,   5 },
-    {Verb::inqVar,     5 },
-    {Verb::inqVarid,   5 },
-    {Verb::inqAtt,     5 },
-    {Verb::inqAttid,   5 },
-    {Verb::inqAttname, 5 },
-    {Verb::renameDim,  3 },
-    {Verb::renameVar,  3 },
-    {Verb::renameAtt,  3 },
-    {Verb::redef,      14},
-    {Verb::sync,       6 },
-    {Verb::setFill,    5 },
-    {Verb::close,      9 },
-    {Verb::abort,      3 },
-    {Verb::create,     5 },
-    {Verb::open,       3 },
+    {Verb::putVar, 40},   {Verb::putVar1, 36},   {Verb::putVara, 44},  {Verb::putVars, 44},
+    {Verb::getVar, 34},   {Verb::getVar1, 34},   {Verb::getVara, 40},  {Verb::getVars, 40},
+    {Verb::getAtt, 40},   {Verb::putAtt, 8},     {Verb::inq, 5},       {Verb::inqDim, 5},
+    {Verb::inqDimid, 5},  {Verb::inqVar, 5},     {Verb::inqVarid, 5},  {Verb::inqAtt, 5},
+    {Verb::inqAttid, 5},  {Verb::inqAttname, 5}, {Verb::renameDim, 3}, {Verb::renameVar, 3},
+    {Verb::renameAtt, 3}, {Verb::redef, 14},     {Verb::sync, 6},      {Verb::setFill, 5},
+    {Verb::close, 9},     {Verb::abort, 3},      {Verb::create, 5},    {Verb::open, 3},
 };
 
 Program Author::program() {
@@ -285,15 +243,9 @@ std::vector<Value> Author::opening(Verb verb) {
             bool keeps;
         };
         static const std::vector<Mode> modes = {
-            {text("clobber"),    false},
-            {text("NC_CLOBBER"), false},
-            {num(0),             false},
-            {num(512),           false},
-            {num(512),           false},
-            {num(2048),          false},
-            {num(2560),          false},
-            {text("noclobber"),  true },
-            {num(516),           true },
+            {text("clobber"), false}, {text("NC_CLOBBER"), false}, {num(0), false},
+            {num(512), false},        {num(512), false},           {num(2048), false},
+            {num(2560), false},       {text("noclobber"), true},   {num(516), true},
         };
         const Mode &mode = chance.oneOf(modes);
         inputs.push_back(chance.percent(2) ? num(544) : mode.value); // 544 is two formats at once

@@ -20,16 +20,16 @@ struct Range {
     double high;
 };
 constexpr std::array ranges = {
-    Range{tsINT8,    -128,        127       },
-    Range{tsUINT8,   0,           255       },
-    Range{tsINT16,   -32768,      32767     },
-    Range{tsUINT16,  0,           65535     },
-    Range{tsINT32,   -2147483648, 2147483647},
-    Range{tsUINT32,  0,           4294967295},
-    Range{tsINT64,   -0x1p63,     0x1p62    },
-    Range{tsUINT64,  0,           0x1p63    },
-    Range{tsCHAR,    0,           65535     },
-    Range{tsLOGICAL, 0,           1         },
+    Range{tsINT8, -128, 127},
+    Range{tsUINT8, 0, 255},
+    Range{tsINT16, -32768, 32767},
+    Range{tsUINT16, 0, 65535},
+    Range{tsINT32, -2147483648, 2147483647},
+    Range{tsUINT32, 0, 4294967295},
+    Range{tsINT64, -0x1p63, 0x1p62},
+    Range{tsUINT64, 0, 0x1p63},
+    Range{tsCHAR, 0, 65535},
+    Range{tsLOGICAL, 0, 1},
 };
 
 constexpr std::array extremes = {0.0,     1.0,     -1.0,         127.0,        128.0,    255.0,

@@ -91,11 +91,7 @@ static_assert(constants.size() == 69);
 } // namespace
 
 Results constantNames(const Call & /*call*/) {
-    Result cell{
-        tsCELL, {constants.size(), 1},
-         {      },
-         {                                 }
-    };
+    Result cell{tsCELL, {constants.size(), 1}, {}, {}};
     std::transform(constants.begin(), constants.end(), std::back_inserter(cell.cells),
                    [](const Constant &constant) { return string(constant.name); });
     return {cell};

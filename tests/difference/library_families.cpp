@@ -246,10 +246,7 @@ Results getVar1(const Call &call) {
 Results putVar1(const Call &call) {
     const Variable at(call);
     const std::vector<std::size_t> index = readPositions(call[2], "start");
-    return writePart(call, at, call[3],
-                     {
-                         {index.size(), "badStartLength"}
-    },
+    return writePart(call, at, call[3], {{index.size(), "badStartLength"}},
                      [&]<class T>(const Functions<T> &functions, const T *data) {
                          return functions.putVar1(at.ncid, at.varid, index.data(), data);
                      });
@@ -274,16 +271,12 @@ Results putVara(const Call &call) {
     const Variable at(call);
     const std::vector<std::size_t> start = readPositions(call[2], "start");
     const std::vector<std::size_t> count = readPositions(call[3], "count");
-    return writePart(call, at, call[4],
-                     {
-                         {start.size(), "badStartLength"},
-                         {count.size(), "badCountLength"}
-    },
-                     [&]<class T>(const Functions<T> &functions, const T *data) {
-                         call.want(product(count) == call[4].elements.size(), "dataSizeMismatch");
-                         return functions.putVara(at.ncid, at.varid, start.data(), count.data(),
-                                                  data);
-                     });
+    return writePart(
+        call, at, call[4], {{start.size(), "badStartLength"}, {count.size(), "badCountLength"}},
+        [&]<class T>(const Functions<T> &functions, const T *data) {
+            call.want(product(count) == call[4].elements.size(), "dataSizeMismatch");
+            return functions.putVara(at.ncid, at.varid, start.data(), count.data(), data);
+        });
 }
 
 Results getVars(const Call &call) {
@@ -310,11 +303,9 @@ Results putVars(const Call &call) {
     const std::vector<std::size_t> count = readPositions(call[3], "count");
     const std::vector<std::ptrdiff_t> stride = readStrides(call[4]);
     return writePart(call, at, call[5],
-                     {
-                         {start.size(),  "badStartLength" },
-                         {count.size(),  "badCountLength" },
-                         {stride.size(), "badStrideLength"}
-    },
+                     {{start.size(), "badStartLength"},
+                      {count.size(), "badCountLength"},
+                      {stride.size(), "badStrideLength"}},
                      [&]<class T>(const Functions<T> &functions, const T *data) {
                          call.want(product(count) == call[5].elements.size(), "dataSizeMismatch");
                          return functions.putVars(at.ncid, at.varid, start.data(), count.data(),

@@ -328,10 +328,7 @@ Result numbers(const std::vector<double> &values, std::vector<std::size_t> dims)
 
 Result string(std::string_view bytes) {
     const std::vector<std::uint16_t> units = toUtf16(bytes);
-    return {
-        tsCHAR, {1,                          units.size()},
-         bytesOf(units), {                          }
-    };
+    return {tsCHAR, {1, units.size()}, bytesOf(units), {}};
 }
 
 Side librarySide(Deviation deviation) {

@@ -241,12 +241,12 @@ struct Planted {
     std::size_t mostSteps;
 };
 constexpr std::array plantings = {
-    Planted{"two values that change places",      Deviation::swappedValues,    5},
-    Planted{"dimensions that are not turned",     Deviation::dimensionsAsIs,   4},
-    Planted{"text that is read without its sign", Deviation::unsignedText,     6},
-    Planted{"another word for a status",          Deviation::otherWord,        4},
-    Planted{"checks in another order",            Deviation::laterChecks,      1},
-    Planted{"a file without its last byte",       Deviation::forgottenPadding, 2},
+    Planted{"two values that change places", Deviation::swappedValues, 5},
+    Planted{"dimensions that are not turned", Deviation::dimensionsAsIs, 4},
+    Planted{"text that is read without its sign", Deviation::unsignedText, 6},
+    Planted{"another word for a status", Deviation::otherWord, 4},
+    Planted{"checks in another order", Deviation::laterChecks, 1},
+    Planted{"a file without its last byte", Deviation::forgottenPadding, 2},
 };
 
 int selfTest(const Options &options) {

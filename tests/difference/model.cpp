@@ -22,46 +22,46 @@ struct StatusWord {
 };
 
 constexpr std::array statusWords = {
-    StatusWord{NC_ETRUNC,       "corruptedFile"                        },
-    StatusWord{NC_EDIMSIZE,     "invalidDimensionSize"                 },
-    StatusWord{NC_EVARSIZE,     "formatSizeConstraintsViolated"        },
-    StatusWord{NC_ENOMEM,       "memoryAllocationFailure"              },
-    StatusWord{NC_ERANGE,       "mathResultNotRepresentable"           },
-    StatusWord{NC_EBADNAME,     "nameContainsIllegalCharacters"        },
-    StatusWord{NC_ESTRIDE,      "illegalStride"                        },
-    StatusWord{NC_EEDGE,        "startPlusCountExceedsDimensionBound"  },
-    StatusWord{NC_ECHAR,        "attemptToConvertBetweenTextAndNumbers"},
-    StatusWord{NC_ENORECVARS,   "recordOperationWithoutRecordVars"     },
-    StatusWord{NC_EUNLIMIT,     "onlyOneUnlimitedDimensionAllowed"     },
-    StatusWord{NC_EMAXNAME,     "maximumNameLengthExceeded"            },
-    StatusWord{NC_ESTS,         "inFortranStringTooShort"              },
-    StatusWord{NC_ENOTNC,       "notANetcdfFile"                       },
-    StatusWord{NC_EGLOBAL,      "actionProhibitedOnGlobalVarid"        },
-    StatusWord{NC_ENOTVAR,      "variableNotFound"                     },
-    StatusWord{NC_EMAXVARS,     "maximumNumberOfVariablesExceeded"     },
-    StatusWord{NC_EUNLIMPOS,    "unlimitedDimensionInTheWrongIndex"    },
-    StatusWord{NC_EBADDIM,      "invalidDimensionIdOrName"             },
-    StatusWord{NC_EBADTYPE,     "invalidDataType"                      },
-    StatusWord{NC_EMAXATTS,     "maximumNumberOfAttributesExceeded"    },
-    StatusWord{NC_ENOTATT,      "attributeNotFound"                    },
-    StatusWord{NC_ENAMEINUSE,   "nameIsAlreadyInUse"                   },
-    StatusWord{NC_EMAXDIMS,     "libraryMaxDimsExceeded"               },
-    StatusWord{NC_EINVALCOORDS, "indexExceedsDimensionBound"           },
-    StatusWord{NC_EINDEFINE,    "operationNotAllowedInDefineMode"      },
-    StatusWord{NC_ENOTINDEFINE, "operationNotAllowedInDataMode"        },
-    StatusWord{NC_EPERM,        "writeToReadOnly"                      },
-    StatusWord{NC_EINVAL,       "invalidArgument"                      },
-    StatusWord{NC_EEXIST,       "netcdfFileExistsAndNoClobber"         },
-    StatusWord{NC_ENFILE,       "tooManyNetcdfFilesOpen"               },
-    StatusWord{NC_EBADID,       "notNetcdfID"                          },
- // What the system says, under the numbers that programs know.
-    StatusWord{1,               "operationNotPermitted"                },
-    StatusWord{2,               "noSuchFileOrDirectory"                },
-    StatusWord{13,              "permissionDenied"                     },
-    StatusWord{17,              "fileExists"                           },
-    StatusWord{20,              "notADirectory"                        },
-    StatusWord{21,              "isDirectory"                          },
-    StatusWord{22,              "invalidArgument"                      },
+    StatusWord{NC_ETRUNC, "corruptedFile"},
+    StatusWord{NC_EDIMSIZE, "invalidDimensionSize"},
+    StatusWord{NC_EVARSIZE, "formatSizeConstraintsViolated"},
+    StatusWord{NC_ENOMEM, "memoryAllocationFailure"},
+    StatusWord{NC_ERANGE, "mathResultNotRepresentable"},
+    StatusWord{NC_EBADNAME, "nameContainsIllegalCharacters"},
+    StatusWord{NC_ESTRIDE, "illegalStride"},
+    StatusWord{NC_EEDGE, "startPlusCountExceedsDimensionBound"},
+    StatusWord{NC_ECHAR, "attemptToConvertBetweenTextAndNumbers"},
+    StatusWord{NC_ENORECVARS, "recordOperationWithoutRecordVars"},
+    StatusWord{NC_EUNLIMIT, "onlyOneUnlimitedDimensionAllowed"},
+    StatusWord{NC_EMAXNAME, "maximumNameLengthExceeded"},
+    StatusWord{NC_ESTS, "inFortranStringTooShort"},
+    StatusWord{NC_ENOTNC, "notANetcdfFile"},
+    StatusWord{NC_EGLOBAL, "actionProhibitedOnGlobalVarid"},
+    StatusWord{NC_ENOTVAR, "variableNotFound"},
+    StatusWord{NC_EMAXVARS, "maximumNumberOfVariablesExceeded"},
+    StatusWord{NC_EUNLIMPOS, "unlimitedDimensionInTheWrongIndex"},
+    StatusWord{NC_EBADDIM, "invalidDimensionIdOrName"},
+    StatusWord{NC_EBADTYPE, "invalidDataType"},
+    StatusWord{NC_EMAXATTS, "maximumNumberOfAttributesExceeded"},
+    StatusWord{NC_ENOTATT, "attributeNotFound"},
+    StatusWord{NC_ENAMEINUSE, "nameIsAlreadyInUse"},
+    StatusWord{NC_EMAXDIMS, "libraryMaxDimsExceeded"},
+    StatusWord{NC_EINVALCOORDS, "indexExceedsDimensionBound"},
+    StatusWord{NC_EINDEFINE, "operationNotAllowedInDefineMode"},
+    StatusWord{NC_ENOTINDEFINE, "operationNotAllowedInDataMode"},
+    StatusWord{NC_EPERM, "writeToReadOnly"},
+    StatusWord{NC_EINVAL, "invalidArgument"},
+    StatusWord{NC_EEXIST, "netcdfFileExistsAndNoClobber"},
+    StatusWord{NC_ENFILE, "tooManyNetcdfFilesOpen"},
+    StatusWord{NC_EBADID, "notNetcdfID"},
+    // What the system says, under the numbers that programs know.
+    StatusWord{1, "operationNotPermitted"},
+    StatusWord{2, "noSuchFileOrDirectory"},
+    StatusWord{13, "permissionDenied"},
+    StatusWord{17, "fileExists"},
+    StatusWord{20, "notADirectory"},
+    StatusWord{21, "isDirectory"},
+    StatusWord{22, "invalidArgument"},
 };
 
 double first(const Value &value) {
@@ -163,12 +163,10 @@ int readMode(const Value &value) {
     for (char &c : name) {
         c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
     }
-    static const std::map<std::string, int> modes = {
-        {"CLOBBER",   NC_CLOBBER  },
-        {"NOCLOBBER", NC_NOCLOBBER},
-        {"WRITE",     NC_WRITE    },
-        {"NOWRITE",   NC_NOWRITE  }
-    };
+    static const std::map<std::string, int> modes = {{"CLOBBER", NC_CLOBBER},
+                                                     {"NOCLOBBER", NC_NOCLOBBER},
+                                                     {"WRITE", NC_WRITE},
+                                                     {"NOWRITE", NC_NOWRITE}};
     const auto found = modes.find(name.rfind("NC_", 0) == 0 ? name.substr(3) : name);
     if (found == modes.end()) {
         throw Refusal{prefix + "unrecognizedFileMode", NC_NOERR, "\"" + name + "\""};

@@ -22,18 +22,12 @@ struct ClassRow {
 };
 
 constexpr std::array classRows = {
-    ClassRow{tsDOUBLE,  fill<double>       },
-    ClassRow{tsSINGLE,  fill<float>        },
-    ClassRow{tsINT8,    fill<std::int8_t>  },
-    ClassRow{tsUINT8,   fill<std::uint8_t> },
-    ClassRow{tsINT16,   fill<std::int16_t> },
-    ClassRow{tsUINT16,  fill<std::uint16_t>},
-    ClassRow{tsINT32,   fill<std::int32_t> },
-    ClassRow{tsUINT32,  fill<std::uint32_t>},
-    ClassRow{tsINT64,   fill<std::int64_t> },
-    ClassRow{tsUINT64,  fill<std::uint64_t>},
-    ClassRow{tsCHAR,    fill<tsChar>       },
-    ClassRow{tsLOGICAL, fill<bool>         },
+    ClassRow{tsDOUBLE, fill<double>},      ClassRow{tsSINGLE, fill<float>},
+    ClassRow{tsINT8, fill<std::int8_t>},   ClassRow{tsUINT8, fill<std::uint8_t>},
+    ClassRow{tsINT16, fill<std::int16_t>}, ClassRow{tsUINT16, fill<std::uint16_t>},
+    ClassRow{tsINT32, fill<std::int32_t>}, ClassRow{tsUINT32, fill<std::uint32_t>},
+    ClassRow{tsINT64, fill<std::int64_t>}, ClassRow{tsUINT64, fill<std::uint64_t>},
+    ClassRow{tsCHAR, fill<tsChar>},        ClassRow{tsLOGICAL, fill<bool>},
 };
 
 Array emptyArray(const Value &value) {

@@ -62,13 +62,9 @@ struct Member {
     tsClassID classID;
 };
 inline constexpr std::array members = {
-    Member{"double", tsDOUBLE},
-    Member{"float",  tsSINGLE},
-    Member{"int",    tsINT32 },
-    Member{"short",  tsINT16 },
-    Member{"schar",  tsINT8  },
-    Member{"uchar",  tsUINT8 },
-    Member{"text",   tsCHAR  },
+    Member{"double", tsDOUBLE}, Member{"float", tsSINGLE}, Member{"int", tsINT32},
+    Member{"short", tsINT16},   Member{"schar", tsINT8},   Member{"uchar", tsUINT8},
+    Member{"text", tsCHAR},
 };
 constexpr std::size_t textMember = 6;
 

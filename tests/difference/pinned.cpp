@@ -10,7 +10,8 @@ namespace difference {
 const std::vector<Pinned> &pinnedPrograms() {
     static const std::vector<Pinned> list = {
         {"records of two variables, by block and by stride",
-         12, {
+         12,
+         {
              {"create", {file(0), num(512)}},
              {"def_dim", {dataset(0), text("time"), num(0)}},
              {"def_dim", {dataset(0), text("x"), num(3)}},
@@ -28,7 +29,8 @@ const std::vector<Pinned> &pinnedPrograms() {
              {"get_var_short", {dataset(0), num(1)}},
          }},
         {"text with every kind of byte, and its way back",
-         9,  {
+         9,
+         {
              {"nc_create", {file(1), text("noclobber")}},
              {"def_dim", {dataset(1), text("n"), num(4)}},
              {"def_var", {dataset(1), of(tsCHAR, {233, 8364}), num(2), num(0)}},
@@ -39,9 +41,10 @@ const std::vector<Pinned> &pinnedPrograms() {
              {"get_var1_text", {dataset(1), num(0), num(3)}},
              {"get_att_text", {dataset(1), num(-1), text("t")}},
              {"get_att_double", {dataset(1), num(-1), text("t")}},
-         } },
+         }},
         {"checks come in their order",
-         4,  {
+         4,
+         {
              {"create", {file(0), num(0)}},
              {"def_dim", {dataset(0), text("x"), num(2)}},
              {"def_var", {dataset(0), text("v"), num(6), num(0)}},
@@ -53,15 +56,17 @@ const std::vector<Pinned> &pinnedPrograms() {
              {"put_var_int", {dataset(0), num(9), row({1, 2})}},
              {"put_vara_int", {dataset(0), num(NAN), num(INFINITY), row({}), row({})}},
              {"get_vara_double", {dataset(0), num(0), num(0), num(-1)}},
-         } },
+         }},
         {"an integer that is read as half a double",
-         2,  {
+         2,
+         {
              {"set_default_format", {of(tsINT32, {0, 1073741824})}},
              {"set_default_format", {of(tsINT32, {9, 1, 1})}},
              {"create", {file(0), num(0)}},
-         } },
+         }},
         {"empty attributes and empty reads",
-         9,  {
+         9,
+         {
              {"_create", {file(2), num(0), num(512), num(1)}},
              {"def_dim", {dataset(2), text("t"), num(0)}},
              {"def_var", {dataset(2), text("v"), num(4), num(0)}},
@@ -71,7 +76,7 @@ const std::vector<Pinned> &pinnedPrograms() {
              {"get_var_int", {dataset(2), num(0)}},
              {"get_att_text", {dataset(2), num(0), text("e")}},
              {"get_att_short", {dataset(2), num(0), text("f")}},
-         } },
+         }},
     };
     return list;
 }

@@ -43,21 +43,14 @@ struct ClassRow {
     bool numeric;
 };
 constexpr ClassRow classRows[] = {
-    {"unknown", 0, unknownOf,    tsUNKNOWN, false},
-    {"cell",    0, cellOf,       tsCELL,    false},
-    {"struct",  0, structureOf,  tsSTRUCT,  false},
-    {"logical", 1, logicalOf,    tsLOGICAL, false},
-    {"char",    2, charactersOf, tsCHAR,    false},
-    {"double",  8, numericOf,    tsDOUBLE,  true },
-    {"single",  4, numericOf,    tsSINGLE,  true },
-    {"int8",    1, numericOf,    tsINT8,    true },
-    {"uint8",   1, numericOf,    tsUINT8,   true },
-    {"int16",   2, numericOf,    tsINT16,   true },
-    {"uint16",  2, numericOf,    tsUINT16,  true },
-    {"int32",   4, numericOf,    tsINT32,   true },
-    {"uint32",  4, numericOf,    tsUINT32,  true },
-    {"int64",   8, numericOf,    tsINT64,   true },
-    {"uint64",  8, numericOf,    tsUINT64,  true },
+    {"unknown", 0, unknownOf, tsUNKNOWN, false}, {"cell", 0, cellOf, tsCELL, false},
+    {"struct", 0, structureOf, tsSTRUCT, false}, {"logical", 1, logicalOf, tsLOGICAL, false},
+    {"char", 2, charactersOf, tsCHAR, false},    {"double", 8, numericOf, tsDOUBLE, true},
+    {"single", 4, numericOf, tsSINGLE, true},    {"int8", 1, numericOf, tsINT8, true},
+    {"uint8", 1, numericOf, tsUINT8, true},      {"int16", 2, numericOf, tsINT16, true},
+    {"uint16", 2, numericOf, tsUINT16, true},    {"int32", 4, numericOf, tsINT32, true},
+    {"uint32", 4, numericOf, tsUINT32, true},    {"int64", 8, numericOf, tsINT64, true},
+    {"uint64", 8, numericOf, tsUINT64, true},
 };
 
 /// Dimensions asked for, and those that the array has.
@@ -66,17 +59,17 @@ struct ShapeRow {
     DimsVector had;
 };
 const ShapeRow shapes[] = {
-    {{0},             {0, 1}         },
-    {{1},             {1, 1}         },
-    {{5},             {5, 1}         },
-    {{1, 1},          {1, 1}         },
-    {{3, 4},          {3, 4}         },
-    {{0, 7},          {0, 7}         },
-    {{2, 3, 4},       {2, 3, 4}      },
-    {{3, 1, 1, 1},    {3, 1, 1, 1}   }, // ones at the end stay
+    {{0}, {0, 1}},
+    {{1}, {1, 1}},
+    {{5}, {5, 1}},
+    {{1, 1}, {1, 1}},
+    {{3, 4}, {3, 4}},
+    {{0, 7}, {0, 7}},
+    {{2, 3, 4}, {2, 3, 4}},
+    {{3, 1, 1, 1}, {3, 1, 1, 1}}, // ones at the end stay
     {{2, 1, 2, 1, 2}, {2, 1, 2, 1, 2}},
-    {DimsVector(40,   1),              DimsVector(40, 1)},
-    {{1UL << 40U, 1UL << 40U, 0},             {1UL << 40U, 1UL << 40U, 0}                           },
+    {DimsVector(40, 1), DimsVector(40, 1)},
+    {{1UL << 40U, 1UL << 40U, 0}, {1UL << 40U, 1UL << 40U, 0}},
 };
 
 class ArrayModes : public testing::TestWithParam<bool> {
@@ -131,14 +124,8 @@ TEST_P(ArrayModes, DimensionsThatCannotBe) {
     for (const ClassRow &row : classRows) {
         SCOPED_TRACE(row.name);
         EXPECT_EQ(identifierOf([&] { row.make(row.classID, {}); }), "TESSEL:host:badDimensions");
-        const DimsVector tooMany[] = {
-            {most        },
-            {     most,        most},
-            {     half,        half},
-            {     3,        half, half},
-            { most,         2},
-            {   most / 2 + 1, 1}
-        };
+        const DimsVector tooMany[] = {{most},          {most, most}, {half, half},
+                                      {3, half, half}, {most, 2},    {most / 2 + 1, 1}};
         for (const DimsVector &dims : tooMany) {
             EXPECT_EQ(identifierOf([&] { row.make(row.classID, dims); }),
                       "TESSEL:host:dimensionsTooLarge");
@@ -171,11 +158,7 @@ TEST_P(ArrayModes, MemoryThatIsNotThere) {
 }
 
 TEST_P(ArrayModes, Complex) {
-    constexpr std::array<std::size_t, 2> sizes[] = {
-        {1,   1  },
-        {0,   3  },
-        {500, 700}
-    };
+    constexpr std::array<std::size_t, 2> sizes[] = {{1, 1}, {0, 3}, {500, 700}};
     for (const auto &dims : sizes) {
         const Array array = Array::numeric(tsDOUBLE, dims, true);
         ASSERT_NE(array.imaginary(), nullptr);

@@ -70,11 +70,8 @@ TEST_P(Calls, ManyInputs) {
 
 TEST_P(Calls, InputsThatAreNotThere) {
     const Array name = Array::text("count_inputs");
-    for (std::vector<const tsArray *> inputs : {
-             std::vector<const tsArray *>{nullptr    },
-               { name.get(),    nullptr},
-               { nullptr, name.get()}
-    }) {
+    for (std::vector<const tsArray *> inputs :
+         {std::vector<const tsArray *>{nullptr}, {name.get(), nullptr}, {nullptr, name.get()}}) {
         const std::optional<Error> error = raisedBy([&] { good.call(inputs); });
         EXPECT_EQ(error->identifier(), "TESSEL:host:missingInput");
         EXPECT_EQ(error->message(), "An input of the call is not there.");
@@ -127,15 +124,15 @@ TEST_P(Calls, Calloc) {
     };
     constexpr std::uint64_t most = std::numeric_limits<std::uint64_t>::max();
     constexpr Row rows[] = {
-        {1,                       1,                       true },
-        {3,                       7,                       true },
-        {1000,                    1000,                    true },
-        {5'000'000,               1,                       true },
-        {most,                    1,                       false},
-        {most,                    2,                       false},
+        {1, 1, true},
+        {3, 7, true},
+        {1000, 1000, true},
+        {5'000'000, 1, true},
+        {most, 1, false},
+        {most, 2, false},
         {std::uint64_t{1} << 32U, std::uint64_t{1} << 32U, false},
-        {std::uint64_t{1} << 60U, 1,                       false},
-        {most / 2,                1,                       false},
+        {std::uint64_t{1} << 60U, 1, false},
+        {most / 2, 1, false},
     };
     constexpr std::array<std::size_t, 2> one = {1, 1};
     for (const Row &row : rows) {
@@ -156,17 +153,17 @@ TEST_P(Calls, Raises) {
         int destroyed;
     };
     constexpr Row rows[] = {
-        {"int",            "TESSEL:host:foreignException",
-         "An exception that is not the host's left the module.",                                     1},
-        {"runtime_error",  "TESSEL:host:foreignException",
-         "An exception that is not the host's left the module: the library is unhappy",              1},
-        {"bad_alloc",      "TESSEL:host:outOfMemory",      "Out of memory.",                         1},
-        {"local",          "TESSEL:host:foreignException",
-         "An exception that is not the host's left the module: bytes \xc3\xbf and \xc3\xa9",         1},
-        {"plain",          "test:plain",                   "Plain.",                                 1},
-        {"latin1",         "test:\xc3\xa9",                "caf\xc3\xa9 and caf\xc3\xa9",            0},
-        {"format",         "test:format",                  "-3 of 16, 12.35% \"100% %s\" x",         0},
-        {"no such action", "test:noSuchAction",            "There is no action \"no such action\".", 0},
+        {"int", "TESSEL:host:foreignException",
+         "An exception that is not the host's left the module.", 1},
+        {"runtime_error", "TESSEL:host:foreignException",
+         "An exception that is not the host's left the module: the library is unhappy", 1},
+        {"bad_alloc", "TESSEL:host:outOfMemory", "Out of memory.", 1},
+        {"local", "TESSEL:host:foreignException",
+         "An exception that is not the host's left the module: bytes \xc3\xbf and \xc3\xa9", 1},
+        {"plain", "test:plain", "Plain.", 1},
+        {"latin1", "test:\xc3\xa9", "caf\xc3\xa9 and caf\xc3\xa9", 0},
+        {"format", "test:format", "-3 of 16, 12.35% \"100% %s\" x", 0},
+        {"no such action", "test:noSuchAction", "There is no action \"no such action\".", 0},
     };
     raising("take_destroyed");
     for (const Row &row : rows) {
@@ -186,11 +183,8 @@ TEST_P(Calls, RaisesWhatAUserTyped) {
         const char *text;
     };
     constexpr Row rows[] = {
-        {"a:b",       "100% %s %n %d"},
-        {"",          "no identifier"},
-        {"%s:%d",     "%"            },
-        {"über:水", "größe 🌊" },
-        {"a:b",       ""             },
+        {"a:b", "100% %s %n %d"}, {"", "no identifier"}, {"%s:%d", "%"},
+        {"über:水", "größe 🌊"},   {"a:b", ""},
     };
     for (const Row &row : rows) {
         const std::optional<Error> error =

@@ -156,27 +156,27 @@ TEST(Memory, ThatRunsOutIsAnError) {
         {"large",
          [](const Module &) {
              Array::numeric(tsDOUBLE, std::array<std::size_t, 1>{16 * hugePage});
-         }                                                                                                   },
-        {"cells",              [](const Module &) { Array::cell(std::array<std::size_t, 1>{16 * hugePage}); }},
+         }},
+        {"cells", [](const Module &) { Array::cell(std::array<std::size_t, 1>{16 * hugePage}); }},
         {"small, without end",
          [](const Module &) {
              std::vector<Array> kept(1'000'000);
              for (Array &array : kept) {
                  array = Array::scalar(1);
              }
-         }                                                                                                   },
+         }},
         {"texts, without end",
          [](const Module &) {
              std::vector<Array> kept(100'000);
              for (Array &array : kept) {
                  array = Array::text(std::string(1000, 'x'));
              }
-         }                                                                                                   },
+         }},
         {"large, by a module",
-         [](const Module &module) { module("make", Array::row({0x1p27}), tsUINT8); }                         },
+         [](const Module &module) { module("make", Array::row({0x1p27}), tsUINT8); }},
         {"cells, by a module",
-         [](const Module &module) { module("make", Array::row({0x1p27}), tsCELL); }                          },
-        {"small, by a module", [](const Module &module) { module("scalars", 1e9); }                          },
+         [](const Module &module) { module("make", Array::row({0x1p27}), tsCELL); }},
+        {"small, by a module", [](const Module &module) { module("scalars", 1e9); }},
     };
     for (const Row &row : rows) {
         SCOPED_TRACE(row.what);

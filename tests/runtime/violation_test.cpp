@@ -16,18 +16,12 @@ struct FaultRow {
     const char *message;
 };
 constexpr FaultRow faults[] = {
-    {"overrun_block",      wroteOutside},
-    {"underrun_block",     wroteOutside},
-    {"overrun_block_left", wroteOutside},
-    {"overrun_array",      wroteOutside},
-    {"underrun_array",     wroteOutside},
-    {"overrun_array_left", wroteOutside},
-    {"overrun_then_raise", wroteOutside},
-    {"change_input",       changedInput},
-    {"overrun_input",      wroteOutside},
-    {"free_twice",         freedWrongly},
-    {"free_foreign",       freedWrongly},
-    {"free_data",          freedWrongly},
+    {"overrun_block", wroteOutside},      {"underrun_block", wroteOutside},
+    {"overrun_block_left", wroteOutside}, {"overrun_array", wroteOutside},
+    {"underrun_array", wroteOutside},     {"overrun_array_left", wroteOutside},
+    {"overrun_then_raise", wroteOutside}, {"change_input", changedInput},
+    {"overrun_input", wroteOutside},      {"free_twice", freedWrongly},
+    {"free_foreign", freedWrongly},       {"free_data", freedWrongly},
 };
 
 TEST(Violation, IsFoundInCheckedMode) {
@@ -106,16 +100,11 @@ struct RefusalRow {
     const char *identifier;
 };
 constexpr RefusalRow refusals[] = {
-    {"give_input",        "TESSEL:host:badOwner"},
-    {"give_twice",        "TESSEL:host:badOwner"},
-    {"give_cells_own",    "TESSEL:host:badOwner"},
-    {"cell_out_of_range", "TESSEL:host:badIndex"},
-    {"cell_of_number",    "TESSEL:host:badClass"},
-    {"cell_value_twice",  "TESSEL:host:badOwner"},
-    {"cell_of_input",     "TESSEL:host:badOwner"},
-    {"cell_into_input",   "TESSEL:host:badOwner"},
-    {"cell_itself",       "TESSEL:host:badOwner"},
-    {"cell_cycle",        "TESSEL:host:badOwner"},
+    {"give_input", "TESSEL:host:badOwner"},     {"give_twice", "TESSEL:host:badOwner"},
+    {"give_cells_own", "TESSEL:host:badOwner"}, {"cell_out_of_range", "TESSEL:host:badIndex"},
+    {"cell_of_number", "TESSEL:host:badClass"}, {"cell_value_twice", "TESSEL:host:badOwner"},
+    {"cell_of_input", "TESSEL:host:badOwner"},  {"cell_into_input", "TESSEL:host:badOwner"},
+    {"cell_itself", "TESSEL:host:badOwner"},    {"cell_cycle", "TESSEL:host:badOwner"},
 };
 
 void expectRefusals() {

@@ -15,7 +15,7 @@ struct ListedConstant {
 
 /// In stored order.
 constexpr auto constants = std::to_array<ListedConstant>({
-  // clang-format off
+    // clang-format off
     {"NC_BYTE",                "BYTE",              1},
     {"NC_CHAR",                "CHAR",              2},
     {"NC_DOUBLE",              "DOUBLE",            6},
@@ -85,7 +85,7 @@ constexpr auto constants = std::to_array<ListedConstant>({
     {"NC_UNLIMITED",           "UNLIMITED",         0},
     {"NC_SIZEHINT_DEFAULT",    "SIZEHINT_DEFAULT",  0},
     {"NC_VERBOSE",             "VERBOSE",           2},
-  // clang-format on
+    // clang-format on
 });
 
 /// What the operation "get_constant_names" gives.

@@ -19,12 +19,12 @@ struct Member {
 /// In the order that every family has.
 inline const std::array<Member, 7> members = {
     Member{"double", tsDOUBLE, "double", "double precision"},
-    Member{"float",  tsSINGLE, "single", "single precision"},
-    Member{"int",    tsINT32,  "int32",  "int32"           },
-    Member{"short",  tsINT16,  "int16",  "int16"           },
-    Member{"schar",  tsINT8,   "int8",   "int8"            },
-    Member{"uchar",  tsUINT8,  "uint8",  "uint8"           },
-    Member{"text",   tsCHAR,   "char",   "char"            },
+    Member{"float", tsSINGLE, "single", "single precision"},
+    Member{"int", tsINT32, "int32", "int32"},
+    Member{"short", tsINT16, "int16", "int16"},
+    Member{"schar", tsINT8, "int8", "int8"},
+    Member{"uchar", tsUINT8, "uint8", "uint8"},
+    Member{"text", tsCHAR, "char", "char"},
 };
 
 /// All but text.

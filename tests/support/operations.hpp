@@ -16,7 +16,7 @@ struct ListedOperation {
 
 /// In stored order.
 constexpr auto operations = std::to_array<ListedOperation>({
-  // clang-format off
+    // clang-format off
     {  0, "nc_abort",              "abort",              2, "TESSEL:netcdf:abort:badInputArgumentCount",             "Must supply two input parameters for ABORT operation."},
     {  1, "nc_close",              "close",              2, "TESSEL:netcdf:close:badInputParameterCount",            "Must supply two input parameters for CLOSE operation."},
     {  2, "nc_copy_att",           "copy_att",           6, "TESSEL:netcdf:copyAtt:badInputParameterCount",          "Must supply six input parameters for COPY_ATT operation."},
@@ -119,7 +119,7 @@ constexpr auto operations = std::to_array<ListedOperation>({
     { 99, "nc_set_fill",           "set_fill",           3, "TESSEL:netcdf:setFill:badInputParameterCount",          "Must supply three input parameters for the SET_FILL operation."},
     {100, "nc_strerror",           "strerror",           2, "TESSEL:netcdf:strerror:badInputArgumentCount",          "Must supply two input parameters for the STRERROR operation."},
     {101, "nc_sync",               "sync",               2, "TESSEL:netcdf:sync:badInputArgumentCount",              "Must supply two input parameters for the SYNC operation."},
-  // clang-format on
+    // clang-format on
 });
 
 } // namespace tessel::test

@@ -120,13 +120,13 @@ struct TextBuffer {
     const char *message;
 };
 constexpr auto textBuffers = std::to_array<TextBuffer>({
-    {"get_att_text",  3, "Failed to allocate memory for get_att_text read operation."  },
-    {"get_var_text",  3, "Failed to allocate memory for get_var_text read operation."  },
-    {"get_var1_text", 2, "Failed to allocate memory for get_var1_text read operation." },
-    {"get_vara_text", 3, "Failed to allocate memory for get_vara_text read operation." },
-    {"get_vars_text", 3, "Failed to allocate memory for get_vars_text read operation." },
-    {"put_att_text",  3, "Failed to allocate memory for put_att_text write operation." },
-    {"put_var_text",  2, "Failed to allocate memory for put_var_text write operation." },
+    {"get_att_text", 3, "Failed to allocate memory for get_att_text read operation."},
+    {"get_var_text", 3, "Failed to allocate memory for get_var_text read operation."},
+    {"get_var1_text", 2, "Failed to allocate memory for get_var1_text read operation."},
+    {"get_vara_text", 3, "Failed to allocate memory for get_vara_text read operation."},
+    {"get_vars_text", 3, "Failed to allocate memory for get_vars_text read operation."},
+    {"put_att_text", 3, "Failed to allocate memory for put_att_text write operation."},
+    {"put_var_text", 2, "Failed to allocate memory for put_var_text write operation."},
     {"put_var1_text", 2, "Failed to allocate memory for put_var1_text write operation."},
     {"put_vara_text", 2, "Failed to allocate memory for put_vara_text write operation."},
     {"put_vars_text", 2, "Failed to allocate memory for put_vars_text write operation."},

@@ -20,12 +20,12 @@ struct Dimension {
 };
 
 constexpr auto dimensions = std::to_array<Dimension>({
-    {"t",      NC_UNLIMITED},
-    {"y",      3           },
-    {"x",      4           },
-    {"five",   5           },
-    {"ten",    10          },
-    {"twenty", 20          },
+    {"t", NC_UNLIMITED},
+    {"y", 3},
+    {"x", 4},
+    {"five", 5},
+    {"ten", 10},
+    {"twenty", 20},
 });
 
 struct Variable {

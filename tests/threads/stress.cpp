@@ -238,11 +238,9 @@ struct Action {
     void (*run)(Worker &);
 };
 constexpr std::array actions = {
-    Action{"ownFile",       ownFile      },
-    Action{"commonDataset", commonDataset},
-    Action{"commonFile",    commonFile   },
-    Action{"commonRows",    commonRows   },
-    Action{"errors",        errors       },
+    Action{"ownFile", ownFile},       Action{"commonDataset", commonDataset},
+    Action{"commonFile", commonFile}, Action{"commonRows", commonRows},
+    Action{"errors", errors},
 };
 
 /// Arrays made, moved and destroyed without any call, as other threads of a program do.

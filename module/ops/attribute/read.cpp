@@ -16,12 +16,11 @@ namespace {
 template <class T>
 using GetAtt = int(int ncid, int varid, const char *name, T *values);
 
-constexpr Family<GetAtt> getAtt = {
-    11,
-    catalogue::getAttForeign,
-    {nc_get_att_double, nc_get_att_float, nc_get_att_int, nc_get_att_short, nc_get_att_schar,
-                     nc_get_att_uchar, nc_get_att_text}
-};
+constexpr Family<GetAtt> getAtt = {11,
+                                   catalogue::getAttForeign,
+                                   {nc_get_att_double, nc_get_att_float, nc_get_att_int,
+                                    nc_get_att_short, nc_get_att_schar, nc_get_att_uchar,
+                                    nc_get_att_text}};
 
 } // namespace
 

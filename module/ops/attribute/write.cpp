@@ -17,12 +17,11 @@ using PutAtt = int(int ncid, int varid, const char *name, nc_type type, std::siz
                    const T *values);
 
 /// The numbers; text takes no external type, and has a handler of its own.
-constexpr Family<PutAtt, NumericMemoryTypes> putAtt = {
-    59,
-    catalogue::putAttForeign,
-    {nc_put_att_double, nc_put_att_float, nc_put_att_int, nc_put_att_short, nc_put_att_schar,
-                     nc_put_att_uchar}
-};
+constexpr Family<PutAtt, NumericMemoryTypes> putAtt = {59,
+                                                       catalogue::putAttForeign,
+                                                       {nc_put_att_double, nc_put_att_float,
+                                                        nc_put_att_int, nc_put_att_short,
+                                                        nc_put_att_schar, nc_put_att_uchar}};
 
 } // namespace
 

@@ -17,23 +17,21 @@ namespace {
 template <class T>
 using GetVar1 = int(int ncid, int varid, const std::size_t *index, T *value);
 
-constexpr Family<GetVar1> getVar1 = {
-    25,
-    catalogue::getVar1Foreign,
-    {nc_get_var1_double, nc_get_var1_float, nc_get_var1_int, nc_get_var1_short, nc_get_var1_schar,
-                      nc_get_var1_uchar, nc_get_var1_text}
-};
+constexpr Family<GetVar1> getVar1 = {25,
+                                     catalogue::getVar1Foreign,
+                                     {nc_get_var1_double, nc_get_var1_float, nc_get_var1_int,
+                                      nc_get_var1_short, nc_get_var1_schar, nc_get_var1_uchar,
+                                      nc_get_var1_text}};
 
 template <class T>
 using GetVara = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
                     T *data);
 
-constexpr Family<GetVara> getVara = {
-    32,
-    catalogue::getVaraForeign,
-    {nc_get_vara_double, nc_get_vara_float, nc_get_vara_int, nc_get_vara_short, nc_get_vara_schar,
-                      nc_get_vara_uchar, nc_get_vara_text}
-};
+constexpr Family<GetVara> getVara = {32,
+                                     catalogue::getVaraForeign,
+                                     {nc_get_vara_double, nc_get_vara_float, nc_get_vara_int,
+                                      nc_get_vara_short, nc_get_vara_schar, nc_get_vara_uchar,
+                                      nc_get_vara_text}};
 
 constexpr TextBlock text = {2, countedInFull};
 

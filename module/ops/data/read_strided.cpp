@@ -16,12 +16,11 @@ template <class T>
 using GetVars = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
                     const std::ptrdiff_t *stride, T *data);
 
-constexpr Family<GetVars> getVars = {
-    39,
-    catalogue::getVarsForeign,
-    {nc_get_vars_double, nc_get_vars_float, nc_get_vars_int, nc_get_vars_short, nc_get_vars_schar,
-                      nc_get_vars_uchar, nc_get_vars_text}
-};
+constexpr Family<GetVars> getVars = {39,
+                                     catalogue::getVarsForeign,
+                                     {nc_get_vars_double, nc_get_vars_float, nc_get_vars_int,
+                                      nc_get_vars_short, nc_get_vars_schar, nc_get_vars_uchar,
+                                      nc_get_vars_text}};
 
 constexpr TextBlock text = {2, countedInFull};
 

@@ -15,23 +15,21 @@ namespace {
 template <class T>
 using PutVar1 = int(int ncid, int varid, const std::size_t *index, const T *value);
 
-constexpr Family<PutVar1> putVar1 = {
-    87,
-    catalogue::putVar1Foreign,
-    {nc_put_var1_double, nc_put_var1_float, nc_put_var1_int, nc_put_var1_short, nc_put_var1_schar,
-                      nc_put_var1_uchar, nc_put_var1_text}
-};
+constexpr Family<PutVar1> putVar1 = {87,
+                                     catalogue::putVar1Foreign,
+                                     {nc_put_var1_double, nc_put_var1_float, nc_put_var1_int,
+                                      nc_put_var1_short, nc_put_var1_schar, nc_put_var1_uchar,
+                                      nc_put_var1_text}};
 
 template <class T>
 using PutVara = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
                     const T *data);
 
-constexpr Family<PutVara> putVara = {
-    73,
-    catalogue::putVaraForeign,
-    {nc_put_vara_double, nc_put_vara_float, nc_put_vara_int, nc_put_vara_short, nc_put_vara_schar,
-                      nc_put_vara_uchar, nc_put_vara_text}
-};
+constexpr Family<PutVara> putVara = {73,
+                                     catalogue::putVaraForeign,
+                                     {nc_put_vara_double, nc_put_vara_float, nc_put_vara_int,
+                                      nc_put_vara_short, nc_put_vara_schar, nc_put_vara_uchar,
+                                      nc_put_vara_text}};
 
 } // namespace
 

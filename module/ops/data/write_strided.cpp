@@ -16,12 +16,11 @@ template <class T>
 using PutVars = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
                     const std::ptrdiff_t *stride, const T *data);
 
-constexpr Family<PutVars> putVars = {
-    80,
-    catalogue::putVarsForeign,
-    {nc_put_vars_double, nc_put_vars_float, nc_put_vars_int, nc_put_vars_short, nc_put_vars_schar,
-                      nc_put_vars_uchar, nc_put_vars_text}
-};
+constexpr Family<PutVars> putVars = {80,
+                                     catalogue::putVarsForeign,
+                                     {nc_put_vars_double, nc_put_vars_float, nc_put_vars_int,
+                                      nc_put_vars_short, nc_put_vars_schar, nc_put_vars_uchar,
+                                      nc_put_vars_text}};
 
 } // namespace
 

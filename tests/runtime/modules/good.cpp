@@ -153,22 +153,22 @@ void callBack(const Call &call) {
 }
 
 constexpr Action actions[] = {
-    {"nothing",            nothing         },
-    {"empty_slots",        emptySlots      },
-    {"count_inputs",       countInputs     },
-    {"add",                add             },
-    {"gaps",               gaps            },
-    {"sixteen",            sixteen         },
-    {"text",               text            },
-    {"one_of_each",        oneOfEach       },
-    {"scalars",            scalars         },
-    {"make",               make            },
-    {"calloc",             calloc          },
-    {"describe",           describe        },
+    {"nothing", nothing},
+    {"empty_slots", emptySlots},
+    {"count_inputs", countInputs},
+    {"add", add},
+    {"gaps", gaps},
+    {"sixteen", sixteen},
+    {"text", text},
+    {"one_of_each", oneOfEach},
+    {"scalars", scalars},
+    {"make", make},
+    {"calloc", calloc},
+    {"describe", describe},
     {"outputs_then_raise", outputsThenRaise},
-    {"nest",               nest            },
-    {"replace",            replace         },
-    {"call_back",          callBack        },
+    {"nest", nest},
+    {"replace", replace},
+    {"call_back", callBack},
 };
 
 } // namespace

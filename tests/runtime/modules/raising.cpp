@@ -122,21 +122,21 @@ void exclusive(const Call &call) {
 }
 
 constexpr Action actions[] = {
-    {"int",            throwInt         },
-    {"runtime_error",  throwRuntimeError},
-    {"bad_alloc",      throwBadAlloc    },
-    {"length_error",   throwLengthError },
-    {"local",          throwLocal       },
-    {"plain",          raisePlain       },
-    {"text",           raiseText        },
-    {"latin1",         raiseLatin1      },
-    {"long",           raiseLong        },
-    {"format",         raiseFormat      },
-    {"exit_thread",    exitThread       },
-    {"other_thread",   otherThread      },
-    {"take_destroyed", takeDestroyed    },
-    {"count_calls",    countCalls       },
-    {"exclusive",      exclusive        },
+    {"int", throwInt},
+    {"runtime_error", throwRuntimeError},
+    {"bad_alloc", throwBadAlloc},
+    {"length_error", throwLengthError},
+    {"local", throwLocal},
+    {"plain", raisePlain},
+    {"text", raiseText},
+    {"latin1", raiseLatin1},
+    {"long", raiseLong},
+    {"format", raiseFormat},
+    {"exit_thread", exitThread},
+    {"other_thread", otherThread},
+    {"take_destroyed", takeDestroyed},
+    {"count_calls", countCalls},
+    {"exclusive", exclusive},
 };
 
 } // namespace
