@@ -70,13 +70,19 @@ def draw(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray, path: 
     else:
         kind = _area(figure, axes, variable, part)
     _title(axes, variable, part)
-    axes.text(0, -0.01, _plain(os.path.basename(dataset.path)), fontsize=8, color="0.4",
-              transform=figure.transFigure, va="top")
+    _footnote(axes, 0, _plain(os.path.basename(dataset.path)))
     with warnings.catch_warnings(), np.errstate(all="ignore"):
         warnings.filterwarnings("ignore", message="Glyph .* missing")
         with written_aside(path, overwrite=True, source=dataset.path) as temporary:
             figure.savefig(temporary, format=ending, dpi=_DPI, bbox_inches="tight", pad_inches=0.15)
     return kind
+
+
+def _footnote(axes: Axes, side: int, text: str) -> None:
+    """A small text below the label of the lower axis: at the left (0) or at the right (1)."""
+    axes.annotate(text, (side, 0), (0, -44), xycoords="axes fraction",
+                  textcoords="offset points", fontsize=8, color="0.4", va="top",
+                  ha="right" if side else "left")
 
 
 def _plain(text: str) -> str:
@@ -184,7 +190,7 @@ def _area(figure: Figure, axes: Axes, variable: Variable, part: Slice) -> str:
         width, tall = x_range[1] - x_range[0], (y_range[1] - y_range[0]) * stretch
         if 1 / 6 < tall / width < 3:
             axes.set_aspect(stretch)
-            height = 0.84 * _WIDTH * tall / width + 1.3
+            height = 0.8 * _WIDTH * tall / width + 1.3
     figure.set_size_inches(_WIDTH, min(max(height, 3.0), 10.0))
 
     bar = figure.colorbar(mesh, cax=axes.inset_axes((1.02, 0, 0.025, 1)),
@@ -192,8 +198,7 @@ def _area(figure: Figure, axes: Axes, variable: Variable, part: Slice) -> str:
     bar.set_label(_plain(variable.units or variable.name), fontsize=11)
     bar.ax.tick_params(labelsize=10)
     if values.mask.any():
-        axes.text(1, -0.01, "grey: no value", fontsize=8, color="0.4", ha="right", va="top",
-                  transform=figure.transFigure)
+        _footnote(axes, 1, "grey: no value")
     return "map" if is_map else "section"
 
 
