@@ -16,6 +16,7 @@ namespace tessel::bench {
 namespace {
 
 constexpr int repetitions = 25;
+constexpr int blockRepetitions = 9;
 constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
 
 double shortest(const std::vector<double> &all) {
@@ -61,7 +62,9 @@ void add(const std::string &name, const std::function<void()> &work, bool block)
                 work();
             }
         });
-    registered->Repetitions(repetitions)->ReportAggregatesOnly()->UseRealTime();
+    registered->Repetitions(block ? blockRepetitions : repetitions)
+        ->ReportAggregatesOnly()
+        ->UseRealTime();
     registered->ComputeStatistics("shortest", shortest);
     if (block) {
         registered->Iterations(1)->Unit(benchmark::kMillisecond);

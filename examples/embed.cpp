@@ -3,7 +3,11 @@
 
 #include <iostream>
 
-int main(int, char **argv) try {
+int main(int argc, char **argv) try {
+    if (argc != 3) {
+        std::cerr << "usage: embed FILE VARIABLE\n";
+        return 2;
+    }
     const tessel::Module netcdf = tessel::Module::find("netcdf");
     const tessel::Results file = netcdf("open", argv[1], "NOWRITE");
     const tessel::Results variable = netcdf("inq_varid", file[0], argv[2]);

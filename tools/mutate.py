@@ -56,8 +56,12 @@ def comparisons(file: Path, plain: str) -> Iterator[Mutant]:
 
 
 def constants(file: Path, plain: str) -> Iterator[Mutant]:
+    # What the library overwrites may begin with any value: to change it changes nothing.
+    overwritten = {match.start(1) for match in
+                   re.finditer(r"^ +(?:int|std::size_t) \w+ = (0);", plain, re.M)}
     for match in re.finditer(r"(?<![\w.])(-?\d+)(?![\w.])", plain):
-        yield Mutant("constant", file, *match.span(1), str(int(match[1]) + 1))
+        if match.start(1) not in overwritten:
+            yield Mutant("constant", file, *match.span(1), str(int(match[1]) + 1))
     for old, new in (("true", "false"), ("false", "true"), ("std::size_t{1}", "std::size_t{2}")):
         for match in re.finditer(rf"\b{re.escape(old)}", plain):
             yield Mutant("constant", file, *match.span(), new)
@@ -163,13 +167,15 @@ class Tree:
                        check=True, capture_output=True)
 
     def compiles(self) -> bool:
-        done = subprocess.run(["cmake", "--build", self.build], capture_output=True, check=False)
+        targets = ["netcdf_module", "rows", "inner_functions", "real_files", "list_operations"]
+        done = subprocess.run(["cmake", "--build", self.build, "--target", *targets],
+                              capture_output=True, check=False)
         return done.returncode == 0
 
     def passes(self) -> bool:
         """True if nothing fails; a run that hangs is one that fails."""
         command = ["ctest", "--test-dir", self.build, "--stop-on-failure", "--timeout", "120",
-                   "-j", "2", "-R", "conformance|structure"]
+                   "-j", "2", "-R", "^conformance|^structure.(arrows|operations)"]
         return subprocess.run(command, capture_output=True, check=False).returncode == 0
 
     def judge(self, mutant: Mutant) -> str:

@@ -28,8 +28,8 @@ template <class... Arguments>
 consteval bool conversionsMatch(std::string_view format) {
     constexpr char expected[] = {conversion<Arguments>..., '\0'};
     std::size_t next = 0;
-    for (std::size_t at = 0; at + 1 < format.size(); ++at) {
-        if (format[at] == '%' && format[++at] != expected[next++]) {
+    for (std::size_t at = 0; at < format.size(); ++at) {
+        if (format[at] == '%' && (++at == format.size() || format[at] != expected[next++])) {
             return false;
         }
     }

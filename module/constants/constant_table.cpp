@@ -1,7 +1,6 @@
 // module/constants/constant_table.cpp: the library's named constants.
 //
-// The values are written out, not taken from the library's header: they are what programs of the
-// host have stored and compared for years.
+// The values are written out, so that they do not move with the header that the module is built with.
 #include "constants/constant_table.hpp"
 
 namespace tessel::netcdf {

@@ -21,22 +21,26 @@ template <class T>
 struct memory;
 
 // clang-format off
-template <> struct memory<double>        { static constexpr tsClassID hostClass = tsDOUBLE; static constexpr const char *description = "double precision"; };
-template <> struct memory<float>         { static constexpr tsClassID hostClass = tsSINGLE; static constexpr const char *description = "single precision"; };
-template <> struct memory<int>           { static constexpr tsClassID hostClass = tsINT32;  static constexpr const char *description = "int32"; };
-template <> struct memory<short>         { static constexpr tsClassID hostClass = tsINT16;  static constexpr const char *description = "int16"; };
-template <> struct memory<signed char>   { static constexpr tsClassID hostClass = tsINT8;   static constexpr const char *description = "int8"; };
-template <> struct memory<unsigned char> { static constexpr tsClassID hostClass = tsUINT8;  static constexpr const char *description = "uint8"; };
-template <> struct memory<char>          { static constexpr tsClassID hostClass = tsCHAR;   static constexpr const char *description = "char"; };
+template <> struct memory<double>        { static constexpr tsClassID hostClass = classOf<double>;           static constexpr const char *description = "double precision"; };
+template <> struct memory<float>         { static constexpr tsClassID hostClass = classOf<float>;            static constexpr const char *description = "single precision"; };
+template <> struct memory<int>           { static constexpr tsClassID hostClass = classOf<int>;              static constexpr const char *description = "int32"; };
+template <> struct memory<short>         { static constexpr tsClassID hostClass = classOf<short>;            static constexpr const char *description = "int16"; };
+template <> struct memory<signed char>   { static constexpr tsClassID hostClass = classOf<signed char>;      static constexpr const char *description = "int8"; };
+template <> struct memory<unsigned char> { static constexpr tsClassID hostClass = classOf<unsigned char>;    static constexpr const char *description = "uint8"; };
+template <> struct memory<char>          { static constexpr tsClassID hostClass = tsCHAR;                    static constexpr const char *description = "char"; };
 // clang-format on
 
-/// The memory types in the order in which every family of the operation table has its rows.
+/// Some memory types, in an order.
 template <class... T>
 struct TypeList {
     static constexpr int size = sizeof...(T);
+    template <class More>
+    using with = TypeList<T..., More>;
 };
-using MemoryTypes = TypeList<double, float, int, short, signed char, unsigned char, char>;
+
+/// The memory types in the order in which every family of the operation table has its rows.
 using NumericMemoryTypes = TypeList<double, float, int, short, signed char, unsigned char>;
+using MemoryTypes = NumericMemoryTypes::with<char>;
 
 /// One family of the operation table: the id of its first row, the error for an entry that is not
 /// of it, and its library functions, of type Signature<T> for memory type T.

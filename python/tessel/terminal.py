@@ -20,9 +20,7 @@ _EVERY = 0.1  # seconds
 
 def _message(error: Exception) -> str:
     if isinstance(error, tessel.Error):
-        file = getattr(error, "filename", None)
-        return f"{error.message}: {file}" if file and str(file) not in error.message \
-            else error.message
+        return error.message
     if isinstance(error, MemoryError):
         return "There is not enough memory."
     if isinstance(error, OSError) and error.strerror and error.filename:

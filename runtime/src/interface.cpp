@@ -5,9 +5,11 @@
 #include "tessel/host.h"
 #include "text.hpp"
 
+#include <array>
 #include <cmath>
 #include <cstdarg>
 #include <cstdio>
+#include <span>
 #include <string>
 
 using namespace tessel;

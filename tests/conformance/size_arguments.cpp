@@ -113,7 +113,7 @@ Row smallNumber(std::string title, Value value, const std::string &number) {
             {}, {"nc_set_default_format(" + number + ", out)", "nc_strerror(-36)"}, answering("nc_set_default_format", -36)};
 }
 
-/// An int32 array is read as a double, eight bytes at a time: that is how it has always been.
+/// An int32 array is read as a double, eight bytes at a time.
 Rows smallNumbers() {
     const std::string emptyID = "TESSEL:netcdf:unpackIntSingleton:argumentIsEmptySet";
     const std::string emptyText = "new_default_format argument cannot be []";

@@ -11,8 +11,8 @@ from pathlib import Path
 import numpy as np
 import pytest
 import tessel
-from made_files import (BYTE, CHAR, DOUBLE, EVERYTHING, FLOAT, INT, MEMBERS, NOFILL,
-                        OFFSET64, SHORT, generate, netcdf)
+from made_files import (BYTE, CHAR, DOUBLE, EVERYTHING, FLOAT, INT, MEMBERS, NOFILL, OFFSET64,
+                        SHORT, generate, netcdf, run_tool)
 from scipy.io import netcdf_file
 from tessel.dataset import Dataset
 
@@ -78,8 +78,8 @@ def of_scipy(version: int) -> Callable[[Path], str]:
 def of_nco(path: Path) -> str:
     """A file that NCO has worked on."""
     source = generate(path.with_name("source.nc"), EVERYTHING)
-    subprocess.run(["ncks", "-O", "-h", "--fl_fmt=64bit_offset", "--hdr_pad=100", "-v",
-                    "r2,count,r3", source, path], check=True)
+    run_tool("ncks", "-O", "-h", "--fl_fmt=64bit_offset", "--hdr_pad=100", "-v", "r2,count,r3",
+             source, path)
     return str(path)
 
 

@@ -1,13 +1,13 @@
 """tests/python/test_time_mean.py: the file of the mean over time, against NumPy, read by SciPy,
 ncdump and the module."""
 
-import subprocess
 from pathlib import Path
 
 import numpy as np
 import pytest
 import tessel
 from scipy.io import netcdf_file
+from made_files import generate, run_tool
 from tessel import show, time_mean
 from tessel.dataset import Dataset
 
@@ -33,14 +33,6 @@ VALUES = """
     cell = 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12 ;
     station = "ab", "c\\351", "12345" ;
 """
-
-
-def generate(path: Path, cdl: str, kind: str = "classic") -> str:
-    """A file made by ncgen."""
-    text = path.with_suffix(".cdl")
-    text.write_text(f"netcdf made {{\n{cdl}\n}}\n")
-    subprocess.run(["ncgen", "-k", kind, "-o", path, text], check=True)
-    return str(path)
 
 
 def field(tmp_path: Path, definition: str, values: str, kind: str = "classic") -> str:
@@ -101,16 +93,14 @@ def test_ncdump_reads_it(tmp_path):
                    f"t = {', '.join('-1' if i % 12 == 5 else str(i) for i in range(36))} ;")
     target = tmp_path / "mean.nc"
     mean_of(source, "t", target)
-    text = subprocess.run(["ncdump", "-v", "t", target], capture_output=True, check=True,
-                          text=True).stdout
+    text = run_tool("ncdump", "-v", "t", target)
     assert "float t(lat, lon) ;" in text
     assert 't:cell_methods = "time: mean" ;' in text
     assert "t:missing_value = -1.f ;" in text
     assert "_FillValue" not in text
     assert text[text.index(" t =\n"):].split("=")[1].replace(";", "").replace("}", "").split() == \
         "12, 13, 14, 15, 16, -1, 18, 19, 20, 21, 22, 23".split()
-    kind = subprocess.run(["ncdump", "-k", target], capture_output=True, check=True, text=True)
-    assert kind.stdout.strip() == "64-bit offset"
+    assert run_tool("ncdump", "-k", target).strip() == "64-bit offset"
 
 
 def test_packed_integers_become_doubles_in_their_own_units(tmp_path):

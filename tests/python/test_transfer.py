@@ -15,7 +15,8 @@ from pathlib import Path
 import numpy as np
 import pytest
 import tessel
-from made_files import EVERYTHING, MIB, NOFILL, OFFSET64, generate, netcdf, open_descriptors, sparse
+from made_files import (EVERYTHING, MIB, NOFILL, OFFSET64, generate, netcdf, open_descriptors,
+                        run_tool, sparse)
 from tessel.dataset import Dataset
 from tessel.transfer import blocks
 
@@ -38,8 +39,7 @@ def same(one: object, other: object) -> bool:
 
 def dump(path: str | Path) -> str:
     """All of a file as text."""
-    return subprocess.run(["ncdump", "-n", "name", "-p", "9,17", path], capture_output=True,
-                          check=True).stdout.decode("latin-1")
+    return run_tool("ncdump", "-n", "name", "-p", "9,17", path)
 
 
 def names_in(path: str) -> list[str]:
@@ -191,8 +191,7 @@ def test_copy_is_equal(everything, tmp_path, target_format, block_bytes):
     assert dump(target) == dump(everything)
     for name in names_in(everything):
         assert same(tessel.read(target, name), tessel.read(everything, name)), name
-    kind = subprocess.run(["ncdump", "-k", target], capture_output=True, check=True, text=True)
-    assert kind.stdout.strip() == FORMATS[target_format]
+    assert run_tool("ncdump", "-k", target).strip() == FORMATS[target_format]
     assert tessel.check(target) <= target.stat().st_size <= tessel.check(target) + 3
 
 

@@ -33,8 +33,6 @@ constexpr Family<GetVara> getVara = {32,
                                       nc_get_vara_short, nc_get_vara_schar, nc_get_vara_uchar,
                                       nc_get_vara_text}};
 
-constexpr TextBlock text = {2, countedInFull};
-
 } // namespace
 
 void readVar1Handler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
@@ -70,7 +68,7 @@ void readVaraHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prh
 
     const IndexVector dims = resultShape(count);
     const int status = withMember(getVara, entry, [&]<class T>(GetVara<T> *get) {
-        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, text, entry, [&](T *data) {
+        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, blockText, entry, [&](T *data) {
             return get(ncid, varid, start.data(), count.data(), data);
         });
     });

@@ -22,8 +22,6 @@ constexpr Family<GetVars> getVars = {39,
                                       nc_get_vars_short, nc_get_vars_schar, nc_get_vars_uchar,
                                       nc_get_vars_text}};
 
-constexpr TextBlock text = {2, countedInFull};
-
 } // namespace
 
 void readVarsHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
@@ -47,7 +45,7 @@ void readVarsHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prh
 
     const IndexVector dims = resultShape(count);
     const int status = withMember(getVars, entry, [&]<class T>(GetVars<T> *get) {
-        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, text, entry, [&](T *data) {
+        return readBlock<T>(plhs[0], {dims.data(), dims.size()}, blockText, entry, [&](T *data) {
             return get(ncid, varid, start.data(), count.data(), stride.data(), data);
         });
     });

@@ -4,6 +4,7 @@
 
 #include "call/failure.hpp"
 #include "convert/index_vector.hpp"
+#include "convert/read_buffer.hpp"
 
 #include <algorithm>
 #include <cstddef>
@@ -44,9 +45,7 @@ inline IndexVector resultShape(const IndexVector &lengths) {
     return dims;
 }
 
-/// The count of characters that a block of text hands over: all of them.
-inline std::size_t countedInFull(std::size_t n) {
-    return n;
-}
+/// How the families that read blocks read text: all characters of the block are handed over.
+inline constexpr TextBlock blockText = {2, [](std::size_t n) { return n; }};
 
 } // namespace tessel::netcdf

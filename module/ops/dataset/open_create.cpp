@@ -50,8 +50,8 @@ void createTunedHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *
     checkCount(catalogue::createTuned, nrhs, entry);
     const std::string path = unpackName(prhs[1], "file");
     const int mode = unpackMode(prhs[2]);
-    // Both sizes come from one argument, and the last one is counted but never read: programs rely
-    // on the hint being the initial size, and only the hint that comes back means anything.
+    // One argument gives both sizes: the hint that goes in is the initial size, and only the one
+    // that comes back means anything. The last argument is counted but never read.
     const std::size_t initialSize = unpackGenericSizeParameter(prhs[3], "initialsize");
     std::size_t chunkSize = unpackGenericSizeParameter(prhs[3], "chunksize");
 

@@ -1,0 +1,86 @@
+"""tests/python/test_show.py: the main job, on a real file and on odd ones, as a person runs it."""
+
+from __future__ import annotations
+
+import subprocess
+import sys
+from pathlib import Path
+
+import numpy as np
+import pytest
+from made_files import generate
+from scipy.io import netcdf_file
+
+PNG = b"\x89PNG\r\n\x1a\n"
+
+
+def show(*arguments: object, folder: Path) -> subprocess.CompletedProcess[str]:
+    """Runs the main job."""
+    command = [sys.executable, "-m", "tessel.show", "--output", folder, *arguments]
+    return subprocess.run([str(word) for word in command], capture_output=True, text=True,
+                          check=False, cwd=folder)
+
+
+def climatology() -> str:
+    """The real file."""
+    files = subprocess.run(["dpkg", "-L", "ferret-datasets"], capture_output=True, check=True,
+                           text=True).stdout.split()
+    [path] = [file for file in files if file.endswith("/coads_climatology.cdf")]
+    return path
+
+
+def test_the_real_file(tmp_path: Path) -> None:
+    done = show(climatology(), folder=tmp_path)
+    assert done.returncode == 0 and done.stderr == ""
+    with netcdf_file(climatology(), mmap=False) as dataset:
+        values = dataset.variables["SST"][:].astype(np.float64)
+    values = np.ma.masked_equal(values, np.float32(-1e34).astype(np.float64))
+    for text in ("COADSX  180", "TIME     12  unlimited", "float SST(TIME, COADSY, COADSX)",
+                 "SEA SURFACE TEMPERATURE", f"range    {values.min():.7g} to {values.max():.7g} Deg C",
+                 f"mean     {values.mean():.7g} Deg C",
+                 f"missing  {100 * values.mask.mean():.1f} %"):
+        assert text in done.stdout, text
+    assert (tmp_path / "coads_climatology-SST.png").read_bytes().startswith(PNG)
+    assert (tmp_path / "coads_climatology-SST-time-mean.nc").read_bytes().startswith(b"CDF\x02")
+
+
+@pytest.mark.parametrize("arguments, message", [
+    (["no-such-file.nc"],
+     'Unable to open netCDF file, library error message "No such file or directory"'),
+    ([__file__], 'Unable to open netCDF file, library error message "NetCDF: Unknown file format"'),
+    ([climatology(), "NOPE"],
+     'Variable ID retrieval failed, library error message "NetCDF: Variable not found"'),
+])
+def test_errors_are_the_modules_own_message(tmp_path: Path, arguments: list[str],
+                                            message: str) -> None:
+    done = show(*arguments, folder=tmp_path)
+    assert (done.returncode, done.stdout, done.stderr) == (1, "", message + "\n")
+    assert list(tmp_path.iterdir()) == []
+
+
+ODD = {
+    "no variables": ("dimensions: x = 2 ;", "No picture: the file has no variables."),
+    "a scalar": ("variables: double v ; data: v = 2.5 ;", "No picture: it is a single value."),
+    "text": ('dimensions: n = 3 ; variables: char v(n) ; data: v = "abc" ;',
+             "No picture: its values are text."),
+    "a line": ("dimensions: x = 3 ; variables: float v(x) ; data: v = 1, 2, 4 ;", "The line is in"),
+    "all missing": ("dimensions: x = 3 ; variables: float v(x) ; v:_FillValue = 1.f ; "
+                    "data: v = 1, 1, 1 ;", "No picture: all its values are missing."),
+    "no records": ("dimensions: t = UNLIMITED ; x = 3 ; variables: float v(t, x) ;",
+                   "No picture: it has no values."),
+}
+
+
+@pytest.mark.parametrize("cdl, last", ODD.values(), ids=ODD.keys())
+def test_odd_files(tmp_path: Path, cdl: str, last: str) -> None:
+    done = show(generate(tmp_path / "odd.nc", cdl), folder=tmp_path)
+    assert done.returncode == 0 and done.stderr == ""
+    assert last in done.stdout
+
+
+def test_a_file_cannot_steer_the_terminal(tmp_path: Path) -> None:
+    path = generate(tmp_path / "odd.nc", r'dimensions: x = 1 ; variables: float v(x) ; '
+                    r'v:note = "\033[2J\007\r" ; data: v = 1 ;')
+    done = show(path, folder=tmp_path)
+    assert done.returncode == 0
+    assert not [c for c in done.stdout if ord(c) < 32 and c != "\n"]
