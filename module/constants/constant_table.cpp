@@ -1,6 +1,7 @@
 // module/constants/constant_table.cpp: the library's named constants.
 //
-// The values are written out, so that they do not move with the header that the module is built with.
+// The values are written out, so that they do not move with the header that the module is built
+// with.
 #include "constants/constant_table.hpp"
 
 namespace tessel::netcdf {

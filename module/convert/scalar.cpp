@@ -151,8 +151,8 @@ int unpackIntSingleton(const tsArray *array, const char *label) {
     if (!isDoubleOrInt32(array)) {
         raise(catalogue::badSingletonType);
     }
-    // The storage is read as a double whatever the class is; a lone int32 has only half of the bytes,
-    // and the other half reads as zero.
+    // The storage is read as a double whatever the class is; a lone int32 has only half of the
+    // bytes, and the other half reads as zero.
     const std::size_t width =
         tsGetClassID(array) == tsDOUBLE ? sizeof(double) : sizeof(std::int32_t);
     double value = 0.0;

@@ -98,8 +98,10 @@ PYBIND11_MODULE(_runtime, extension) {
                  return py::str("<tessel.Module {}>").format(module.file());
              })
         .def_property_readonly("file", &Module::file, "The file that it was loaded from.");
-    extension.def("load_file", loadFile, "The module in a file.", py::arg("path"));
-    extension.def("find", &Module::find, "The module of a name.", py::arg("name"));
+    // Loading waits for calls in progress, and other threads need not wait with it.
+    using OthersRun = py::call_guard<py::gil_scoped_release>;
+    extension.def("load_file", loadFile, "The module in a file.", py::arg("path"), OthersRun());
+    extension.def("find", &Module::find, "The module of a name.", py::arg("name"), OthersRun());
 }
 
 } // namespace tessel::python

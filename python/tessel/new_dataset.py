@@ -3,6 +3,7 @@
 
 from __future__ import annotations
 
+import threading
 from collections.abc import Sequence
 from types import TracebackType
 from typing import Any
@@ -14,6 +15,8 @@ from tessel.dataset import Dataset
 
 FORMATS = {"classic": "NOCLOBBER", "64bit-offset": "64BIT_OFFSET"}
 """The formats that can be written, and the library's constants that create them."""
+
+_default_format = threading.Lock()
 
 
 class NewDataset:
@@ -39,12 +42,13 @@ class NewDataset:
     def _create(self, constant: str) -> Any:
         mode = int(self.parameter("NOCLOBBER")) | int(self.parameter(constant))
         # A mode without a format stands for the default, which only few programs change; for them
-        # it is set back.
-        before = self._netcdf("set_default_format", self.parameter("FORMAT_CLASSIC"))
-        try:
-            return self._netcdf("create", self.path, mode)
-        finally:
-            self._netcdf("set_default_format", before)
+        # it is set back. Two threads at it at once would set back each other's.
+        with _default_format:
+            before = self._netcdf("set_default_format", self.parameter("FORMAT_CLASSIC"))
+            try:
+                return self._netcdf("create", self.path, mode)
+            finally:
+                self._netcdf("set_default_format", before)
 
     def __enter__(self) -> NewDataset:
         return self

@@ -279,6 +279,31 @@ def test_other_threads_compute_while_the_library_works(
     assert read > 10
 
 
+def test_loading_waits_without_the_interpreters_lock(tmp_path: Path) -> None:
+    """A thread that loads a module waits for a long read of another one, and the rest goes on."""
+    length = 2**24
+    ncid = netcdf("create", str(tmp_path / "long.nc"), 512)
+    netcdf("def_var", ncid, "v", 6, netcdf("def_dim", ncid, "x", length))
+    netcdf("enddef", ncid)
+    netcdf("put_var_double", ncid, 0, np.zeros(length))
+    reading = threading.Thread(target=lambda: [netcdf("get_vars_double", ncid, 0, 0, length, 1)
+                                               for _ in range(3)])
+    loading = threading.Thread(target=lambda: [tessel.load("netcdf") for _ in range(100)])
+    longest = 0.0
+    reading.start()
+    loading.start()
+    while reading.is_alive():
+        before = time.monotonic()
+        sum(range(1000))
+        longest = max(longest, time.monotonic() - before)
+    loading.join()
+    began = time.monotonic()
+    netcdf("get_vars_double", ncid, 0, 0, length, 1)
+    one_read = time.monotonic() - began
+    netcdf("close", ncid)
+    assert longest < one_read / 2
+
+
 def test_another_binding_under_one_lock(tmp_path: Path) -> None:
     """netCDF4-python uses the same library, and does not take the runtime's lock."""
     library = threading.Lock()

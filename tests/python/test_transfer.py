@@ -10,6 +10,7 @@ import signal
 import subprocess
 import sys
 import textwrap
+from concurrent.futures import ThreadPoolExecutor
 from pathlib import Path
 
 import numpy as np
@@ -493,3 +494,18 @@ def test_memory_is_bounded(tmp_path):
     last = tessel.read(target, "big", (1022, size // 4096 - 1))
     assert last.ravel().tolist() == [0, 1]
     target.unlink()
+
+
+def test_copies_in_many_threads_leave_the_default_format(everything, tmp_path):
+    before = netcdf("set_default_format", 2)
+    try:
+        def copy_often(thread: int) -> None:
+            for i in range(50):
+                target = tmp_path / f"{thread}-{i}.nc"
+                tessel.copy(everything, target, "classic")
+                assert target.read_bytes()[:4] == b"CDF\x01"
+        with ThreadPoolExecutor(4) as threads:
+            list(threads.map(copy_often, range(4)))
+        assert netcdf("set_default_format", before)[0, 0] == 2
+    finally:
+        netcdf("set_default_format", before)
