@@ -18,7 +18,7 @@ using bench::Pair;
 
 constexpr std::size_t largeBytes = std::size_t{256} << 20U;
 constexpr std::size_t largeElements = largeBytes / sizeof(double);
-constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / (1024 * 512)};
+constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / 1024 / 512};
 constexpr const char *dimension = "time";
 
 /// The dataset, open for reading.

@@ -129,7 +129,7 @@ Array fromStr(py::handle text) {
 }
 
 Array fromBytes(py::handle value) {
-    const std::string_view bytes = value.cast<std::string_view>();
+    const auto bytes = value.cast<std::string_view>();
     Array array = characterRow(bytes.size());
     std::transform(bytes.begin(), bytes.end(), array.elements<tsChar>().begin(),
                    [](char byte) { return static_cast<unsigned char>(byte); });
