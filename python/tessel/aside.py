@@ -22,7 +22,8 @@ def _judge(target: str, overwrite: bool, source: str | os.PathLike[str] | None) 
         return
     if source is not None and os.path.exists(source) and os.path.exists(target) \
             and os.path.samefile(source, target):
-        raise _refused("TESSEL:python:sameFile", "The target is the same file as the source", target)
+        raise _refused("TESSEL:python:sameFile", "The target is the same file as the source",
+                       target)
     if not overwrite:
         raise _refused("TESSEL:python:fileExists", "The target exists already", target)
     if os.path.exists(target) and not stat.S_ISREG(os.stat(target).st_mode):
@@ -43,8 +44,6 @@ def _settle(temporary: str, target: str, overwrite: bool) -> None:
                            target) from None
         except OSError:  # a file system without links
             os.rename(temporary, target)
-        else:
-            os.unlink(temporary)
     folder = os.open(os.path.dirname(target), os.O_RDONLY | os.O_DIRECTORY)
     try:
         os.fsync(folder)

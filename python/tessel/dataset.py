@@ -265,6 +265,6 @@ class Dataset:
         for marker in np.unique(np.concatenate(markers)):
             with np.errstate(all="ignore"):
                 same = np.asarray(marker).astype(stored.dtype)
-            if floating or same == marker:  # a marker that the stored type cannot hold marks nothing
+            if floating or same == marker:  # what the stored type cannot hold marks nothing
                 missing |= stored == same
         return missing

@@ -34,6 +34,7 @@ _WIDTH = 10.0
 _MISSING_COLOUR = "0.82"
 _MOST_CELLS = 1300  # along one side: about as many as the picture has pixels
 _MOST_TICKS = 8
+_LARGEST = 1e300  # Matplotlib counts a little beyond what it draws, and doubles end at 1.8e308
 
 
 class NothingToDraw(Exception):
@@ -99,8 +100,9 @@ def _slice(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
     first = [chosen.get(name, 0) for name in names]
     limits = tuple(slice(begin, begin + 1) if name in chosen else slice(None)
                    for name, begin in zip(names, first))
-    usable = np.ma.masked_invalid(values[limits], copy=False)
-    if np.ma.getmaskarray(usable).all():
+    part = values[(*limits, ...)]  # the dots keep an array where there is no dimension to limit
+    usable = np.ma.MaskedArray(part.data, np.ma.getmaskarray(part) | ~np.isfinite(part.data))
+    if usable.mask.all():
         raise NothingToDraw("all its values are missing")
     if usable.size == 1:
         raise NothingToDraw("it is a single value")
@@ -111,6 +113,8 @@ def _slice(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
     parts = usable.transpose(others + drawn)
     at = next(index for index in np.ndindex(parts.shape[:len(others)])
               if not parts[index].mask.all())
+    if np.abs(parts[at]).max() > _LARGEST:
+        raise NothingToDraw(f"it has values beyond {_LARGEST:g}")
     places = [axes[i].written(first[i] + index) for i, index in zip(others, at)
               if axes[i].variable is not None or axes[i].dimension.length > 1]
     return Slice(parts[at], [_drawable(axes[i]) for i in drawn], places)
@@ -132,7 +136,7 @@ def _judge(variable: Variable, chosen: Mapping[str, int]) -> None:
 def _drawable(axis: Axis) -> Axis:
     """The axis with positions that go one way; by index where the file's do not."""
     unwrapped = replace(axis, values=axis.unwrapped)
-    if unwrapped.is_monotonic:
+    if unwrapped.is_monotonic and np.abs(unwrapped.values).max() <= _LARGEST:
         return unwrapped
     return Axis(axis.dimension, np.arange(axis.dimension.length, dtype=float))
 

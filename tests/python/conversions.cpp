@@ -22,7 +22,12 @@ py::tuple roundTrip(py::handle value) {
     return py::make_tuple(back, keeper);
 }
 
-/// A double, or a complex number of another class.
+void oneWay(py::handle value) {
+    Lenders lenders;
+    static_cast<void>(toHost(value, lenders));
+}
+
+/// An array of a numeric class whose elements have no defined values.
 py::object ofDimensions(const std::vector<std::size_t> &dims, int classID, bool complex) {
     return toPython(Array::numeric(static_cast<tsClassID>(classID), dims, complex));
 }
@@ -52,6 +57,7 @@ PYBIND11_MODULE(conversions, extension) {
     PythonClasses::load();
     py::register_local_exception_translator(showIdentifier);
     extension.def("round_trip", roundTrip);
+    extension.def("to_host", oneWay);
     extension.def("of_dimensions", ofDimensions);
     extension.def("in_cells", inCells);
 }

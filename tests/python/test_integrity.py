@@ -219,6 +219,21 @@ def test_names_that_cannot_be_asked_for_are_no_cut(tmp_path, name):
         assert tessel.check(path) <= len(data)
 
 
+def test_a_header_that_is_longer_than_the_inquiries_say(tmp_path):
+    path = Path(generate(tmp_path / "f.nc", """dimensions: x = 300 ;
+        variables: short longer_name(x) ; short other(x) ; data: longer_name = 1 ; other = 2 ;"""))
+    data = path.read_bytes().replace(b"longer_name", b"l\0nger_name")  # asked for, it is "l"
+    path.write_bytes(data)
+    least = tessel.check(path)
+    assert 1200 < least <= len(data)
+    os.truncate(path, least)
+    assert tessel.check(path) == least
+    os.truncate(path, least - 1)
+    with pytest.raises(tessel.Error) as raised:
+        tessel.check(path)
+    assert raised.value.identifier == TOO_SHORT
+
+
 @pytest.mark.parametrize("kind", ["netCDF-4", "netCDF-4 classic model"])
 def test_other_formats_have_nothing_to_check(tmp_path, kind):
     path = generate(tmp_path / "f.nc", EVERYTHING, kind)

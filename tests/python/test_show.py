@@ -66,6 +66,26 @@ ODD = {
     "a line": ("dimensions: x = 3 ; variables: float v(x) ; data: v = 1, 2, 4 ;", "The line is in"),
     "all missing": ("dimensions: x = 3 ; variables: float v(x) ; v:_FillValue = 1.f ; "
                     "data: v = 1, 1, 1 ;", "No picture: all its values are missing."),
+    "a missing scalar": ("variables: float v ; v:_FillValue = 1.f ; data: v = 1 ;",
+                         "No picture: all its values are missing."),
+    "values beyond what is drawn": ("dimensions: x = 3 ; variables: double v(x) ; "
+                                    "data: v = -1e308, 0, 1e308 ;",
+                                    "No picture: it has values beyond 1e+300."),
+    "positions beyond what is drawn": ("dimensions: x = 3 ; variables: double x(x), v(x) ; "
+                                       "data: x = -1e308, 0, 1e308 ; v = 1, 2, 3 ;",
+                                       "The line is in"),
+    "infinite values": ("dimensions: x = 3 ; variables: double v(x) ; "
+                        "data: v = -Infinity, 1, Infinity ;", "The line is in"),
+    "packed values": ("dimensions: x = 3 ; variables: short v(x) ; v:scale_factor = 0.5 ; "
+                      "v:add_offset = 10. ; v:missing_value = -1s ; data: v = -1, 0, 4 ;",
+                      "range    10 to 12"),
+    "texts": ('dimensions: n = 2 ; w = 5 ; variables: char v(n, w) ; data: v = "ab", "cdefg" ;',
+              '  "ab"\n  "cdefg"\n'),
+    "signs of formulas": ("dimensions: x = 2 ; variables: float v(x) ; "
+                          'v:long_name = "cost $x_{$ in $" ; data: v = 1, 2 ;', "The line is in"),
+    "a time that is none": ("dimensions: time = 2 ; variables: double time(time), v(time) ; "
+                            'time:units = "fortnights since yesterday" ; '
+                            "data: time = 1, 2 ; v = 1, 2 ;", "The line is in"),
     "no records": ("dimensions: t = UNLIMITED ; x = 3 ; variables: float v(t, x) ;",
                    "No picture: it has no values."),
 }
@@ -76,6 +96,15 @@ def test_odd_files(tmp_path: Path, cdl: str, last: str) -> None:
     done = show(generate(tmp_path / "odd.nc", cdl), folder=tmp_path)
     assert done.returncode == 0 and done.stderr == ""
     assert last in done.stdout
+
+
+def test_a_type_that_the_module_cannot_read(tmp_path: Path) -> None:
+    path = generate(tmp_path / "odd.nc", 'dimensions: x = 2 ; variables: string s(x) ; '
+                    'data: s = "a", "b" ;', "netCDF-4")
+    done = show(path, folder=tmp_path)
+    assert done.returncode == 1 and "string s(x)" in done.stdout
+    assert done.stderr == ('Variable data retrieval failed, library error message '
+                           '"NetCDF: Attempt to convert between text & numbers"\n')
 
 
 def test_a_file_cannot_steer_the_terminal(tmp_path: Path) -> None:
