@@ -170,13 +170,17 @@ std::string Array::utf8() const {
     if (array->classID == tsFUNCTION) {
         return array->extras->names.front();
     }
-    if (array->classID != tsCHAR) {
+    return utf8Of(array.get());
+}
+
+std::string utf8Of(const tsArray *characters) {
+    if (characters->classID != tsCHAR) {
         raise(host_errors::badClass);
     }
-    const std::span<const tsChar> characters = elements<tsChar>();
+    const std::span units(static_cast<const tsChar *>(characters->data), characters->elements);
     return orOutOfMemory([&] {
-        std::string text(utf8Length(characters), '\0');
-        writeUtf8(characters, text.data());
+        std::string text(utf8Length(units), '\0');
+        writeUtf8(units, text.data());
         return text;
     });
 }

@@ -4,6 +4,7 @@
 #include "call_frame.hpp"
 #include "host_errors.hpp"
 #include "tessel/extension.h"
+#include "tessel/runtime/watcher.hpp"
 
 #include <cxxabi.h>
 #include <dlfcn.h>
@@ -176,10 +177,36 @@ Results Module::call(std::span<const tsArray *> inputs, const CallOptions &optio
         raise(host_errors::missingInput);
     }
     const std::lock_guard lock(callLock);
+    if (!watcher) {
+        return run(inputs, options);
+    }
+    watcher->before(inputs, Ask(*this));
+    try {
+        Results results = run(inputs, options);
+        watcher->after(inputs, results, nullptr);
+        return results;
+    } catch (const Error &error) {
+        watcher->after(inputs, Results(), &error);
+        throw;
+    }
+}
+
+Module Module::watchedBy(std::shared_ptr<Watcher> next) const {
+    Module watched = *this;
+    watched.watcher = std::move(next);
+    return watched;
+}
+
+Results Ask::call(std::span<const tsArray *> inputs) const {
+    return module.run(inputs, {});
+}
+
+/// One call, by a thread that has the lock.
+Results Module::run(std::span<const tsArray *> inputs, const CallOptions &options) const {
     Results results;
     CallFrame frame(options);
     std::array<tsArray *, Results::slots> slots{};
-    const auto run = [&] {
+    const auto enter = [&] {
         frame.watch(inputs);
         loaded->entryPoint(options.outputs, slots.data(), static_cast<int>(inputs.size()),
                            inputs.data());
@@ -192,7 +219,7 @@ Results Module::call(std::span<const tsArray *> inputs, const CallOptions &optio
     };
     std::optional<Error> error;
     try {
-        run();
+        enter();
     } catch (...) {
         error = translated();
     }

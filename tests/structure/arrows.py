@@ -31,11 +31,14 @@ MAY_INCLUDE = {
     },
     "runtime/include": {"host"},
     "runtime/src": {"host", "runtime/include"},
-    "python/src": {"host", "runtime/include"},
+    "guard/include": {"host", "runtime/include"},
+    "guard/src": {"host", "runtime/include", "guard/include"},
+    "python/src": {"host", "runtime/include", "guard/include"},
 }
 
 # where an include is looked for, and the folder of the table that a header belongs to
-SEARCH = ["host", "module", "runtime/include", "runtime/src", "python/src"]
+SEARCH = ["host", "module", "runtime/include", "runtime/src", "guard/include",
+          "guard/src", "python/src"]
 
 
 def folder_of(path: Path) -> str | None:

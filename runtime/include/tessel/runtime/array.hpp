@@ -118,4 +118,7 @@ class Array {
     std::unique_ptr<tsArray, Destroy> array;
 };
 
+/// The characters of a char array as UTF-8; Error "TESSEL:host:badClass" for other classes.
+std::string utf8Of(const tsArray *characters);
+
 } // namespace tessel

@@ -61,6 +61,19 @@ class Argument {
     const tsArray *input;
 };
 
+class Watcher;
+
+/// What `call` answers to inputs made of arguments as they are at hand.
+template <class Call, class... Arguments>
+auto withInputs(const Call &call, const Arguments &...arguments) {
+    const std::array<Argument, sizeof...(Arguments)> held{Argument(arguments)...};
+    std::array<const tsArray *, sizeof...(Arguments)> inputs{};
+    for (std::size_t i = 0; i < held.size(); ++i) {
+        inputs[i] = held[i].get();
+    }
+    return call(std::span<const tsArray *>(inputs));
+}
+
 /// A loaded module. Copies share it; it is unloaded with the last one.
 ///
 /// Any thread may load, call and unload any module at any time: all of it happens one after the
@@ -80,6 +93,10 @@ class Module {
 
     [[nodiscard]] const std::filesystem::path &file() const noexcept;
 
+    /// The same module, with someone who looks at each call first (tessel/runtime/watcher.hpp). The
+    /// watcher replaces the one that was there; none if it is empty.
+    [[nodiscard]] Module watchedBy(std::shared_ptr<Watcher> next) const;
+
     /// One call. The inputs are alive until it returns; their data are not copied. Raises Error
     /// with what the module raised, or with the host's own "TESSEL:host:outOfMemory",
     /// "TESSEL:host:foreignException" (an exception of another type left the module),
@@ -91,17 +108,17 @@ class Module {
     /// One call with arguments as they are at hand: netcdf("open", path, "NOWRITE").
     template <class... Arguments>
     Results operator()(const Arguments &...arguments) const {
-        const std::array<Argument, sizeof...(Arguments)> held{Argument(arguments)...};
-        std::array<const tsArray *, sizeof...(Arguments)> inputs{};
-        for (std::size_t i = 0; i < held.size(); ++i) {
-            inputs[i] = held[i].get();
-        }
-        return call(inputs);
+        return withInputs([&](std::span<const tsArray *> inputs) { return call(inputs); },
+                          arguments...);
     }
 
   private:
+    friend class Ask;
+    [[nodiscard]] Results run(std::span<const tsArray *> inputs, const CallOptions &options) const;
+
     struct Loaded;
     std::shared_ptr<const Loaded> loaded;
+    std::shared_ptr<Watcher> watcher;
 };
 
 /// Checked mode, for the tests of modules: from now on, each block has guard bytes around it, data

@@ -1,0 +1,38 @@
+// tessel/netcdf_guard.hpp: keeps calls from the netCDF library that it does not survive.
+//
+// Version 4.9 of the library divides by zero, follows a null pointer, or goes on for ever when it
+// is given certain arguments that look valid, and it fetches what a file name that is an address
+// names. The guard is a watcher for the module "netcdf" which refuses these calls, and no others,
+// with an error that says why:
+//
+//   TESSEL:guard:alignment   a tuned enddef with an alignment of 0, which divides by zero
+//   TESSEL:guard:mode        a mode flag that makes create or open follow a null pointer
+//   TESSEL:guard:closed      anything with a dataset whose closing failed: its memory is freed
+//   TESSEL:guard:counts      a write of counts that multiply to more than 64 bits hold
+//   TESSEL:guard:records     a write that would first fill more than GuardOptions::fillLimit
+//   TESSEL:guard:header      a file whose header claims what it cannot hold, or what would overflow
+//                            the buffers of programs that follow the library's limits
+//   TESSEL:guard:remote      a file name that is an address, unless GuardOptions::remote
+//
+// What it knows of open datasets it has from the calls that it saw. Dataset ids belong to the
+// process, and so does this knowledge: all guards share it.
+#pragma once
+
+#include "tessel/runtime/watcher.hpp"
+
+#include <cstdint>
+#include <memory>
+
+namespace tessel {
+
+struct GuardOptions {
+    /// Whether addresses ("https://...") may be given as file names.
+    bool remote = false;
+
+    /// How many bytes of fill values one call may write before the data that it was given.
+    std::uint64_t fillLimit = std::uint64_t{4} << 30U;
+};
+
+std::shared_ptr<Watcher> netcdfGuard(const GuardOptions &options = {});
+
+} // namespace tessel

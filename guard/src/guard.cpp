@@ -1,0 +1,352 @@
+// guard/src/guard.cpp: the watcher that refuses what the netCDF library does not survive.
+#include "tessel/netcdf_guard.hpp"
+
+#include "datasets.hpp"
+#include "header.hpp"
+#include "operations.hpp"
+#include "refusals.hpp"
+
+#include "tessel/array.h"
+
+#include <algorithm>
+#include <array>
+#include <cctype>
+#include <fstream>
+#include <functional>
+#include <numeric>
+#include <string_view>
+
+namespace tessel {
+namespace guard {
+namespace {
+
+// Flags and values of the library's.
+constexpr int userFormats = 0x40 | 0x80; // what belongs to them cannot be registered here
+constexpr int inMemory = 0x8000;         // the file's name stands for memory that is not there
+constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fails by itself
+constexpr int hdf5 = 0x1000;
+constexpr int noFill = 0x100;
+constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
+
+Datasets &datasets() {
+    static auto &all = *new Datasets; // never destroyed: threads may outlive the end of main
+    return all;
+}
+
+/// The name without the blanks that the library skips at its beginning.
+std::string_view withoutBlanks(std::string_view path) {
+    const auto isBlank = [](char c) { return c > 0 && c <= ' '; };
+    const auto *const first = std::find_if_not(path.begin(), path.end(), isBlank);
+    return path.substr(static_cast<std::size_t>(first - path.begin()));
+}
+
+/// Whether the library would take a file name for an address: "scheme://...", behind any number of
+/// parameters in brackets.
+bool isAddress(std::string_view path) {
+    while (path.starts_with('[') && path.find(']') != std::string_view::npos) {
+        path = withoutBlanks(path.substr(path.find(']') + 1));
+    }
+    const std::size_t end = path.find("://");
+    if (end == std::string_view::npos || end == 0) {
+        return false;
+    }
+    const std::string_view scheme = path.substr(0, end);
+    return std::all_of(scheme.begin(), scheme.end(), [](unsigned char c) {
+        return std::isalnum(c) != 0 || c == '+' || c == '-' || c == '.';
+    });
+}
+
+std::string inQuotes(std::string_view path) {
+    return std::string(1, '"').append(path).append(1, '"');
+}
+
+void lookAtName(std::string_view path, const GuardOptions &options) {
+    if (!options.remote && isAddress(path)) {
+        refuse(remote, inQuotes(path) + " is an address");
+    }
+}
+
+void lookAtOpening(std::string_view path, int flags) {
+    if ((flags & inMemory) != 0 && (flags & answeredBefore) == 0) {
+        refuse(mode, "the flag 32768 (NC_INMEMORY) is set");
+    }
+    if (const auto claim = distrusted(std::string(path))) {
+        refuse(header, "the header of " + inQuotes(path) + " " + *claim);
+    }
+}
+
+void lookAtCreation(int flags) {
+    if ((flags & userFormats) != 0) {
+        refuse(mode, "the flag " + std::to_string(flags & userFormats) +
+                         " (a user-defined format) is set");
+    }
+}
+
+bool isClassicFile(const std::string &path) {
+    std::array<char, 3> magic{};
+    std::ifstream(path, std::ios::binary).read(magic.data(), magic.size());
+    return std::string_view(magic.data(), magic.size()) == "CDF";
+}
+
+void lookAtAlignment(Inputs inputs, int ncid, const Dataset *dataset, const Ask &ask) {
+    if (dataset != nullptr && (!dataset->classic || !dataset->defining)) {
+        return;
+    }
+    const bool zero = size(inputs[3]) == 0 || size(inputs[5]) == 0;
+    if (zero && ask("inq", ncid)[1].number() > 0) {
+        refuse(alignment, "an alignment is 0");
+    }
+}
+
+using Indices = std::vector<std::uint64_t>;
+
+/// Counts that wrap around to what was given. Empty data are the module's to refuse.
+void lookAtCounts(const Indices &count, const tsArray *data) {
+    std::uint64_t product = 1;
+    bool wraps = false;
+    for (const std::uint64_t each : count) {
+        wraps = __builtin_mul_overflow(product, each, &product) || wraps;
+    }
+    const bool none = std::find(count.begin(), count.end(), 0) != count.end();
+    if (wraps && !none && !tsIsEmpty(data) && product == tsGetNumberOfElements(data)) {
+        refuse(counts, "the counts multiply to more than 64 bits hold");
+    }
+}
+
+/// Where a write goes, in the library's order.
+struct Write {
+    Indices start;
+    Indices count;
+    Indices stride;
+};
+
+/// The positions of a write; nothing where the module refuses the call itself.
+std::optional<Write> writeOf(Kind kind, Inputs inputs) {
+    const auto start = indices(inputs[3]);
+    if (!start) {
+        return std::nullopt;
+    }
+    Write write{*start, Indices(start->size(), 1), Indices(start->size(), 1)};
+    if (kind != Kind::writeElement) {
+        const auto count = indices(inputs[4]);
+        if (!count || count->size() != start->size()) {
+            return std::nullopt;
+        }
+        write.count = *count;
+        lookAtCounts(*count, inputs[inputs.size() - 1]);
+    }
+    if (kind == Kind::writeStrided) {
+        const auto stride = indices(inputs[5]);
+        if (!stride || stride->size() != start->size()) {
+            return std::nullopt;
+        }
+        write.stride = *stride;
+    }
+    return write;
+}
+
+/// One more than the last record of a write; 0 if it writes nothing, or is refused by the library
+/// for a step below 1.
+std::uint64_t endOf(const Write &write) {
+    const bool steps = static_cast<std::int64_t>(write.stride[0]) > 0;
+    if (!steps || std::find(write.count.begin(), write.count.end(), 0) != write.count.end()) {
+        return 0;
+    }
+    std::uint64_t end = 0;
+    if (__builtin_mul_overflow(write.count[0] - 1, write.stride[0], &end) ||
+        __builtin_add_overflow(end, write.start[0], &end) ||
+        __builtin_add_overflow(end, 1U, &end)) {
+        return UINT64_MAX;
+    }
+    return end;
+}
+
+/// Looks at a write of a variable that may have records. What it learns of the dataset it notes
+/// there; the end of the write, if it moves the end of the records, is what it gives back.
+std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *dataset,
+                            const Ask &ask, const GuardOptions &options) {
+    const std::uint64_t end = endOf(write);
+    // Only what lies between the end of the records and the write's own is filled.
+    const auto filled = [&](std::uint64_t number) {
+        const std::uint64_t added = end - std::min(end, number);
+        return added - std::min(added, write.count[0]);
+    };
+    if (dataset != nullptr) {
+        if (!dataset->filling || dataset->defining) {
+            return 0;
+        }
+        const auto known = dataset->hasRecords.find(varid);
+        const bool fixed = known != dataset->hasRecords.end() && !known->second;
+        if (fixed || filled(dataset->records) == 0) {
+            return known != dataset->hasRecords.end() && known->second ? end : 0;
+        }
+    }
+    const std::optional<Records> found = recordsOf(ncid, varid, ask);
+    if (dataset != nullptr) {
+        dataset->hasRecords[varid] = found.has_value();
+        dataset->records = found ? found->number : dataset->records;
+    }
+    if (!found) {
+        return 0;
+    }
+    const std::uint64_t records = filled(found->number);
+    std::uint64_t bytes = 0;
+    if (__builtin_mul_overflow(records, found->bytes, &bytes) || bytes > options.fillLimit) {
+        refuse(guard::records, "the write ends at record " + std::to_string(end - 1) + ", and " +
+                                   std::to_string(records) + " records of " +
+                                   std::to_string(found->bytes) + " bytes are missing before it");
+    }
+    return end;
+}
+
+/// The watcher.
+class Guard : public Watcher {
+  public:
+    explicit Guard(const GuardOptions &given) : options(given) {}
+
+    void before(Inputs inputs, const Ask &ask) override {
+        kind = kindOf(inputs);
+        recordsEnd = 0;
+        if (datasets().anyDead) {
+            lookForDead(inputs);
+        }
+        if (kind != Kind::other) {
+            look(inputs, ask);
+        }
+    }
+
+    void after(Inputs inputs, const Results &results, const Error *error) noexcept override {
+        if (kind != Kind::other) {
+            try {
+                remember(inputs, results, error);
+            } catch (const std::exception &) {
+                // There is no memory: a dataset that is not known is guarded all the same, with
+                // more inquiries.
+            }
+        }
+    }
+
+  private:
+    /// Any operation on a dataset has its id first, and copy_att has a second one.
+    static void lookForDead(Inputs inputs) {
+        for (const std::size_t i : {std::size_t{1}, std::size_t{4}}) {
+            const auto ncid = inputs.size() > i ? integer(inputs[i]) : std::nullopt;
+            const Dataset *const dataset = ncid ? datasets().find(*ncid) : nullptr;
+            if (dataset != nullptr && dataset->dead && (i == 1 || inputs.size() == 6)) {
+                refuse(closed, "the dataset is that of " + inQuotes(dataset->path));
+            }
+        }
+    }
+
+    void look(Inputs inputs, const Ask &ask) {
+        if (kind == Kind::open || kind == Kind::create) {
+            const auto name = fileName(inputs[1]);
+            if (!name) {
+                return;
+            }
+            const std::string_view path = withoutBlanks(*name);
+            lookAtName(path, options);
+            // A mode that is given by a name has none of the flags.
+            const int flags = integer(inputs[2]).value_or(0);
+            kind == Kind::open ? lookAtOpening(path, flags) : lookAtCreation(flags);
+            return;
+        }
+        const auto ncid = integer(inputs[1]);
+        if (!ncid) {
+            return;
+        }
+        Dataset *const dataset = datasets().find(*ncid);
+        try {
+            if (kind == Kind::tunedEndDefinition) {
+                lookAtAlignment(inputs, *ncid, dataset, ask);
+            } else if (isWrite()) {
+                const auto varid = integer(inputs[2]);
+                if (const auto write = writeOf(kind, inputs); write && varid) {
+                    recordsEnd = lookAtRecords(*write, *ncid, *varid, dataset, ask, options);
+                }
+            }
+        } catch (const Error &error) {
+            if (std::string_view(error.identifier()).starts_with("TESSEL:guard:")) {
+                throw;
+            }
+            // There is no such dataset or variable, which the module says itself.
+        }
+    }
+
+    void remember(Inputs inputs, const Results &results, const Error *error) const {
+        if (kind == Kind::open || kind == Kind::create) {
+            if (error == nullptr) {
+                rememberOpened(inputs, results);
+            }
+            return;
+        }
+        const auto first = integer(inputs[1]);
+        if (kind == Kind::setDefaultFormat) {
+            if (error == nullptr) {
+                datasets().defaultFormat = first.value_or(datasets().defaultFormat);
+            }
+            return;
+        }
+        Dataset *const dataset = first ? datasets().find(*first) : nullptr;
+        if (dataset == nullptr) {
+            return;
+        }
+        if (kind == Kind::end) {
+            rememberEnd(*first, *dataset, error);
+        } else if (error == nullptr) {
+            rememberChange(inputs, *dataset);
+        }
+    }
+
+    void rememberOpened(Inputs inputs, const Results &results) const {
+        const auto name = fileName(inputs[1]);
+        const int flags = integer(inputs[2]).value_or(0);
+        Dataset dataset;
+        dataset.path = withoutBlanks(name.value_or(""));
+        dataset.defining = kind == Kind::create;
+        const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
+                                             datasets().defaultFormat) != hdf5Formats.end();
+        dataset.classic = kind == Kind::create ? (flags & hdf5) == 0 && !hdf5ByDefault
+                                               : isClassicFile(dataset.path);
+        datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
+    }
+
+    static void rememberEnd(int ncid, Dataset &dataset, const Error *error) {
+        if (error == nullptr || error->identifier().ends_with(":notNetcdfID")) {
+            datasets().remove(ncid);
+        } else if (error->identifier().starts_with("TESSEL:netcdf:")) {
+            dataset.dead = true;
+            datasets().anyDead = true;
+        }
+    }
+
+    void rememberChange(Inputs inputs, Dataset &dataset) const {
+        if (isWrite()) {
+            dataset.records = std::max(dataset.records, recordsEnd);
+        } else if (kind == Kind::redefine) {
+            dataset.defining = true;
+            dataset.hasRecords.clear(); // variables may come, and dimensions be known anew
+        } else if (kind == Kind::endDefinition || kind == Kind::tunedEndDefinition) {
+            dataset.defining = false;
+        } else if (kind == Kind::setFill) {
+            dataset.filling = integer(inputs[2]) != noFill;
+        }
+    }
+
+    [[nodiscard]] bool isWrite() const noexcept {
+        return kind == Kind::writeElement || kind == Kind::writeBlock || kind == Kind::writeStrided;
+    }
+
+    GuardOptions options;
+    Kind kind = Kind::other;      // of the call in progress
+    std::uint64_t recordsEnd = 0; // where it ends, if it writes records
+};
+
+} // namespace
+} // namespace guard
+
+std::shared_ptr<Watcher> netcdfGuard(const GuardOptions &options) {
+    return std::make_shared<guard::Guard>(options);
+}
+
+} // namespace tessel

@@ -1,0 +1,200 @@
+// guard/src/header.cpp: what a file of the classic formats claims about itself.
+#include "header.hpp"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <string_view>
+#include <vector>
+
+namespace tessel::guard {
+namespace {
+
+// The library's limits.
+constexpr std::uint64_t maxName = 256;
+constexpr std::uint64_t maxDimensions = 1024;
+
+/// The lists of a header, by their tags.
+enum : std::uint32_t { dimensionList = 10, variableList = 11, attributeList = 12 };
+
+/// The bytes of an element of each external type; the numbers of the types begin with 1.
+constexpr std::array<unsigned, 12> typeSizes = {0, 1, 1, 2, 4, 4, 8, 1, 2, 4, 8, 8};
+
+/// Nothing more can be said: the file ends within its header, or is not of these formats. The
+/// library says so itself.
+struct Ended {};
+
+/// The claim that is not to be trusted.
+struct Distrusted {
+    std::string claim;
+};
+
+class Reader {
+  public:
+    explicit Reader(const std::string &path) : file(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+        struct stat status {};
+        if (file >= 0 && fstat(file, &status) == 0 && S_ISREG(status.st_mode)) {
+            fileSize = static_cast<std::uint64_t>(status.st_size);
+        }
+    }
+    ~Reader() {
+        if (file >= 0) {
+            ::close(file);
+        }
+    }
+    Reader(const Reader &) = delete;
+    Reader &operator=(const Reader &) = delete;
+
+    [[nodiscard]] std::uint64_t left() const noexcept {
+        return fileSize - std::min(position, fileSize);
+    }
+
+    std::uint64_t number(std::size_t bytes) {
+        std::uint64_t value = 0;
+        for (std::size_t i = 0; i < bytes; ++i) {
+            value = value << 8U | byte();
+        }
+        return value;
+    }
+
+    void skip(std::uint64_t bytes) {
+        if (bytes > left()) {
+            throw Ended{};
+        }
+        position += bytes;
+    }
+
+  private:
+    unsigned char byte() {
+        if (position < start || position >= start + buffered) {
+            fill();
+        }
+        return buffer[static_cast<std::size_t>(position++ - start)];
+    }
+
+    void fill() {
+        if (left() == 0) {
+            throw Ended{};
+        }
+        const ssize_t got = pread(file, buffer.data(), buffer.size(), static_cast<off_t>(position));
+        if (got <= 0) {
+            throw Ended{};
+        }
+        start = position;
+        buffered = static_cast<std::uint64_t>(got);
+    }
+
+    int file;
+    std::uint64_t fileSize = 0;
+    std::uint64_t position = 0;
+    std::uint64_t start = 0;
+    std::uint64_t buffered = 0;
+    std::array<unsigned char, 8192> buffer{};
+};
+
+/// Walks through a header and looks at its claims.
+class Header {
+  public:
+    explicit Header(const std::string &path) : reader(path) {}
+
+    void look() {
+        if (reader.number(3) != 0x434446) { // "CDF"
+            throw Ended{};
+        }
+        const std::uint64_t version = reader.number(1);
+        countSize = version == 5 ? 8 : 4;
+        offsetSize = version == 1 ? 4 : 8;
+        if (version != 1 && version != 2 && version != 5) {
+            throw Ended{};
+        }
+        reader.skip(countSize); // the number of records
+        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0; --n) {
+            name();
+            reader.skip(countSize);
+        }
+        attributes();
+        for (std::uint64_t n = list(variableList, "variables"); n > 0; --n) {
+            variable();
+        }
+    }
+
+  private:
+    std::uint64_t count(std::string_view what) {
+        const std::uint64_t n = reader.number(countSize);
+        if (n > reader.left()) {
+            throw Distrusted{"has " + std::to_string(n) + " " + std::string(what) +
+                             ", where the file has " + std::to_string(reader.left()) +
+                             " bytes left"};
+        }
+        return n;
+    }
+
+    std::uint64_t list(std::uint32_t tag, std::string_view what) {
+        const std::uint64_t found = reader.number(4);
+        const std::uint64_t n = count(what);
+        if (found != tag && (found != 0 || n != 0)) {
+            throw Ended{};
+        }
+        return n;
+    }
+
+    void name() {
+        const std::uint64_t length = count("characters in a name");
+        if (length > maxName) {
+            throw Distrusted{"has a name of " + std::to_string(length) + " characters, where " +
+                             std::to_string(maxName) + " are the most"};
+        }
+        reader.skip(padded(length));
+    }
+
+    void attributes() {
+        for (std::uint64_t n = list(attributeList, "attributes"); n > 0; --n) {
+            name();
+            const std::uint64_t type = reader.number(4);
+            const std::uint64_t values = count("values in an attribute");
+            if (type >= typeSizes.size()) {
+                throw Ended{};
+            }
+            reader.skip(padded(values * typeSizes[static_cast<std::size_t>(type)]));
+        }
+    }
+
+    void variable() {
+        name();
+        const std::uint64_t dimensions = count("dimensions in a variable");
+        if (dimensions > maxDimensions) {
+            throw Distrusted{"has a variable of " + std::to_string(dimensions) +
+                             " dimensions, where " + std::to_string(maxDimensions) +
+                             " are the most"};
+        }
+        reader.skip(dimensions * countSize);
+        attributes();
+        reader.skip(4 + countSize + offsetSize); // type, size, place
+    }
+
+    static std::uint64_t padded(std::uint64_t bytes) noexcept { return (bytes + 3) / 4 * 4; }
+
+    Reader reader;
+    std::size_t countSize = 4;
+    std::size_t offsetSize = 4;
+};
+
+} // namespace
+
+std::optional<std::string> distrusted(const std::string &path) {
+    try {
+        Header(path).look();
+    } catch (const Ended &) {
+        return std::nullopt;
+    } catch (const Distrusted &found) {
+        return found.claim;
+    }
+    return std::nullopt;
+}
+
+} // namespace tessel::guard

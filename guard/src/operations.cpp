@@ -1,0 +1,178 @@
+// guard/src/operations.cpp: what a call asks for, as far as the guard wants to know.
+#include "operations.hpp"
+
+#include "tessel/array.h"
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <limits>
+#include <string_view>
+#include <type_traits>
+
+namespace tessel::guard {
+namespace {
+
+struct Row {
+    std::string_view name;
+    Kind kind;
+    std::size_t inputs; // with the name of the operation
+};
+
+constexpr std::array rows = {
+    Row{"open", Kind::open, 3},
+    Row{"_open", Kind::open, 4},
+    Row{"create", Kind::create, 3},
+    Row{"_create", Kind::create, 5},
+    Row{"close", Kind::end, 2},
+    Row{"abort", Kind::end, 2},
+    Row{"redef", Kind::redefine, 2},
+    Row{"enddef", Kind::endDefinition, 2},
+    Row{"end_def", Kind::endDefinition, 2},
+    Row{"_enddef", Kind::tunedEndDefinition, 6},
+    Row{"set_fill", Kind::setFill, 3},
+    Row{"set_default_format", Kind::setDefaultFormat, 2},
+};
+
+/// The typed families, whose names end with a type.
+constexpr std::array families = {
+    Row{"put_var1_", Kind::writeElement, 5},
+    Row{"put_vara_", Kind::writeBlock, 6},
+    Row{"put_vars_", Kind::writeStrided, 7},
+};
+
+constexpr std::string_view longPrefix = "nc_";
+
+/// A name of an operation, lower-cased, up to the first zero. No operation has a longer one.
+class Name {
+  public:
+    explicit Name(const tsArray *input) noexcept {
+        const auto *const units = static_cast<const tsChar *>(tsGetData(input));
+        const std::size_t n = tsGetNumberOfElements(input);
+        for (std::size_t i = 0; i < n && units[i] != 0; ++i) {
+            if (length == text.size() || units[i] > 0x7F) {
+                length = 0;
+                return;
+            }
+            const auto letter = static_cast<char>(units[i]);
+            text[length++] =
+                letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter + ('a' - 'A')) : letter;
+        }
+    }
+
+    [[nodiscard]] std::string_view view() const noexcept { return {text.data(), length}; }
+
+  private:
+    std::array<char, 24> text{};
+    std::size_t length = 0;
+};
+
+template <class Rows, class Matches>
+Kind kindIn(const Rows &table, std::size_t inputs, const Matches &matches) {
+    const auto *const row = std::find_if(table.begin(), table.end(), matches);
+    return row != table.end() && row->inputs == inputs ? row->kind : Kind::other;
+}
+
+/// A number as 64 bits, a negative one wrapped around; what does not fit is 2^63, as it is for the
+/// module. Nothing for an infinite or NaN double, which the module refuses.
+template <class T>
+std::optional<std::uint64_t> wrapped(const tsArray *array, std::size_t i) {
+    const T value = static_cast<const T *>(tsGetData(array))[i];
+    if constexpr (std::is_floating_point_v<T>) {
+        constexpr T half = 0x1p63;
+        if (std::is_same_v<T, double> && !std::isfinite(value)) {
+            return std::nullopt;
+        }
+        if (value >= 0 && value < 2 * half) {
+            return static_cast<std::uint64_t>(value);
+        }
+        return static_cast<std::uint64_t>(value < 0 && value >= -half
+                                              ? static_cast<std::int64_t>(value)
+                                              : std::numeric_limits<std::int64_t>::min());
+    } else {
+        return static_cast<std::uint64_t>(value);
+    }
+}
+
+struct Reader {
+    tsClassID classID;
+    std::optional<std::uint64_t> (*read)(const tsArray *, std::size_t);
+};
+
+constexpr std::array readers = {
+    Reader{tsDOUBLE, wrapped<double>},      Reader{tsSINGLE, wrapped<float>},
+    Reader{tsINT8, wrapped<std::int8_t>},   Reader{tsUINT8, wrapped<std::uint8_t>},
+    Reader{tsINT16, wrapped<std::int16_t>}, Reader{tsUINT16, wrapped<std::uint16_t>},
+    Reader{tsINT32, wrapped<std::int32_t>}, Reader{tsUINT32, wrapped<std::uint32_t>},
+    Reader{tsINT64, wrapped<std::int64_t>}, Reader{tsUINT64, wrapped<std::uint64_t>},
+};
+
+} // namespace
+
+Kind kindOf(Inputs inputs) {
+    if (inputs.empty() || tsGetClassID(inputs[0]) != tsCHAR) {
+        return Kind::other;
+    }
+    const Name lowered(inputs[0]);
+    std::string_view name = lowered.view();
+    if (name.starts_with(longPrefix)) {
+        name.remove_prefix(longPrefix.size());
+    }
+    // Nearly all calls read or inquire.
+    if (name.starts_with("get_") || name.starts_with("inq")) {
+        return Kind::other;
+    }
+    if (name.starts_with("put_")) {
+        return kindIn(families, inputs.size(),
+                      [&](const Row &row) { return name.starts_with(row.name); });
+    }
+    return kindIn(rows, inputs.size(), [&](const Row &row) { return name == row.name; });
+}
+
+std::optional<int> integer(const tsArray *input) {
+    const tsClassID found = tsGetClassID(input);
+    if (tsIsEmpty(input) || (found != tsDOUBLE && found != tsINT32)) {
+        return std::nullopt;
+    }
+    if (found == tsINT32) {
+        return *static_cast<const std::int32_t *>(tsGetData(input));
+    }
+    const double value = *static_cast<const double *>(tsGetData(input));
+    constexpr double end = 0x1p31;
+    return value > -end - 1 && value < end ? std::optional(static_cast<int>(value)) : std::nullopt;
+}
+
+std::optional<std::uint64_t> size(const tsArray *input) {
+    const auto found = indices(input);
+    return found ? std::optional(found->back()) : std::nullopt;
+}
+
+std::optional<std::vector<std::uint64_t>> indices(const tsArray *input) {
+    const tsClassID found = tsGetClassID(input);
+    const auto *const reader = std::find_if(
+        readers.begin(), readers.end(), [&](const Reader &row) { return row.classID == found; });
+    if (reader == readers.end() || tsIsEmpty(input)) {
+        return std::nullopt;
+    }
+    const std::size_t n = tsGetNumberOfElements(input);
+    std::vector<std::uint64_t> values(n);
+    for (std::size_t i = 0; i < n; ++i) {
+        const auto value = reader->read(input, i);
+        if (!value) {
+            return std::nullopt;
+        }
+        values[n - 1 - i] = *value;
+    }
+    return values;
+}
+
+std::optional<std::string> fileName(const tsArray *input) {
+    if (tsGetClassID(input) != tsCHAR) {
+        return std::nullopt;
+    }
+    std::string name = utf8Of(input);
+    name.resize(std::min(name.size(), name.find('\0')));
+    return name;
+}
+
+} // namespace tessel::guard

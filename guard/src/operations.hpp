@@ -1,0 +1,48 @@
+// guard/src/operations.hpp: what a call asks for, as far as the guard wants to know.
+#pragma once
+
+#include "tessel/runtime/watcher.hpp"
+
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace tessel::guard {
+
+/// What the guard tells apart.
+enum class Kind {
+    other,
+    open,
+    create,
+    end, // close and abort
+    redefine,
+    endDefinition,
+    tunedEndDefinition,
+    setFill,
+    setDefaultFormat,
+    writeElement,
+    writeBlock,
+    writeStrided,
+};
+
+/// The operation that the first input names, if the call has the inputs that the operation wants;
+/// `other` for operations without interest, and for calls that the module refuses itself.
+Kind kindOf(Inputs inputs);
+
+/// An argument as the module reads ids and flags: the first element of a double or int32 array.
+/// Nothing for what the module refuses.
+std::optional<int> integer(const tsArray *input);
+
+/// A size, as the module reads it: 0 where it is below 1. Nothing for what the module refuses.
+std::optional<std::uint64_t> size(const tsArray *input);
+
+/// Positions, counts or steps in the library's order, as the module reads them: fractions are
+/// truncated and negative values wrap around. Nothing for what the module refuses.
+std::optional<std::vector<std::uint64_t>> indices(const tsArray *input);
+
+/// A file name as the library gets it: up to the first zero.
+std::optional<std::string> fileName(const tsArray *input);
+
+} // namespace tessel::guard

@@ -1,0 +1,32 @@
+// guard/src/refusals.hpp: why a call is refused, a row each.
+#pragma once
+
+#include "tessel/runtime/error.hpp"
+
+#include <string>
+
+namespace tessel::guard {
+
+/// An identifier, and what its message says after the particulars of the call.
+struct Refusal {
+    const char *identifier;
+    const char *reason;
+};
+
+// clang-format off
+inline constexpr Refusal
+    alignment = {"TESSEL:guard:alignment", "the library divides by the alignment of the data and of the records, which must be at least 1 (4 is the usual one)"},
+    mode      = {"TESSEL:guard:mode",      "the library follows a null pointer when it is given this mode flag without what belongs to it"},
+    closed    = {"TESSEL:guard:closed",    "an earlier closing of the dataset failed, and the library has freed its memory but not its id"},
+    counts    = {"TESSEL:guard:counts",    "the library would write what is beyond the data, or for ever"},
+    records   = {"TESSEL:guard:records",   "every record before it would be filled first; with set_fill(ncid, NC_NOFILL) they are left as they are"},
+    header    = {"TESSEL:guard:header",    "the library would trust the header"},
+    remote    = {"TESSEL:guard:remote",    "the library would fetch it; addresses are to be allowed first"};
+// clang-format on
+
+[[noreturn]] inline void refuse(const Refusal &refusal, const std::string &particulars) {
+    throw Error(refusal.identifier,
+                "The call was not made: " + particulars + ", and " + refusal.reason + ".");
+}
+
+} // namespace tessel::guard

@@ -1,0 +1,171 @@
+// tests/guard/fatal_test.cpp: calls that the library does not survive, a row each: in a process of
+// its own without the guard, where it ends badly, and with the guard, where it is refused.
+#include "support.hpp"
+
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <functional>
+#include <ostream>
+
+namespace tessel::test {
+namespace {
+
+constexpr double wraps = -1; // as a count: 2^64-1
+
+struct Fatal {
+    const char *name;
+    const char *identifier;
+    const char *why; // what the message says
+    std::function<void(const Module &netcdf, const Folder &folder)> call;
+};
+
+void PrintTo(const Fatal &fatal, std::ostream *out) {
+    *out << fatal.name;
+}
+
+/// A variable of another variable's length whose fill value has two values instead of one: the
+/// dataset cannot leave define mode, and not be closed.
+int unclosable(const Module &netcdf, const Folder &folder) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int x = intOf(netcdf("def_dim", ncid, "x", 3));
+    netcdf("def_var", ncid, "v", ncInt, x);
+    netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
+    EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:netcdf:close:invalidDataType");
+    return ncid;
+}
+
+void writeStrided(const Module &netcdf, const Folder &folder, const char *operation, int varid,
+                  const Array &start, const Array &count, const Array &stride) {
+    const int ncid = newDataset(netcdf, folder.file("a.nc"));
+    netcdf("set_fill", ncid, 256);
+    const Array one = Array::scalar(1);
+    if (stride) {
+        netcdf(operation, ncid, varid, start, count, stride, one);
+    } else {
+        netcdf(operation, ncid, varid, start, count, one);
+    }
+}
+
+/// In define mode, with a variable.
+int definingDataset(const Module &netcdf, const Folder &folder) {
+    const int ncid = newDataset(netcdf, folder.file("a.nc"));
+    netcdf("redef", ncid);
+    return ncid;
+}
+
+const Fatal rows[] = {
+    {"AlignmentOfTheData", "TESSEL:guard:alignment", "an alignment is 0, and the library divides",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_enddef", definingDataset(netcdf, folder), 0, 0, 0, 4);
+     }},
+    {"AlignmentOfTheRecords", "TESSEL:guard:alignment", "an alignment is 0",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("nc__enddef", definingDataset(netcdf, folder), 0, 4, 0, 0.5);
+     }},
+    {"CreateWithAUserFormat", "TESSEL:guard:mode", "the flag 64 (a user-defined format) is set",
+     [](const Module &netcdf, const Folder &folder) { netcdf("create", folder.file("a.nc"), 64); }},
+    {"CreateWithTheOtherUserFormat", "TESSEL:guard:mode", "the flag 128",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("NC_CREATE", folder.file("a.nc"), 128 + 1);
+     }},
+    {"TunedCreateWithAUserFormat", "TESSEL:guard:mode", "the flag 64",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_create", folder.file("a.nc"), 64, 1024, 1024);
+     }},
+    {"OpenInMemory", "TESSEL:guard:mode", "the flag 32768 (NC_INMEMORY) is set",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("open", folder.file("a.nc"), 32768);
+     }},
+    {"TunedOpenInMemory", "TESSEL:guard:mode", "the flag 32768",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("nc__open", folder.file("a.nc"), 32768 + 1, 1024);
+     }},
+    {"CloseAfterACloseThatFailed", "TESSEL:guard:closed", "a.nc\"",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", unclosable(netcdf, folder));
+     }},
+    {"AbortAfterACloseThatFailed", "TESSEL:guard:closed", "a.nc\"",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("abort", unclosable(netcdf, folder));
+     }},
+    {"CountsThatWrapInRecords", "TESSEL:guard:counts", "multiply to more than 64 bits hold",
+     [](const Module &netcdf, const Folder &folder) {
+         writeStrided(netcdf, folder, "put_vars_double", 1, Array::row({1, 0}),
+                      Array::row({wraps, wraps}), Array::row({2, 1}));
+     }},
+    {"CountsThatWrapInABlock", "TESSEL:guard:counts", "or for ever",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vara_double", ncid, 1, Array::row({0, 0}), Array::row({2, 0x1p63 + 2048}),
+                Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{2, 2048}));
+     }},
+    {"AnElementFarBeyondTheRecords", "TESSEL:guard:records",
+     "ends at record 4000000000, and 4000000000 records of 80 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
+     }},
+    {"ABlockFarBeyondTheRecords", "TESSEL:guard:records", "NC_NOFILL",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vara_double", ncid, 1, Array::row({0, 4e9}), Array::row({1, 1}), 1);
+     }},
+    {"AStepFarBeyondTheRecords", "TESSEL:guard:records", "ends at record 2000000000",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vars_double", ncid, 1, Array::row({0, 0}), Array::row({1, 2}),
+                Array::row({1, 2e9}), Array::row({1, 2}));
+     }},
+};
+
+class FatalCall : public testing::TestWithParam<Fatal> {};
+
+enum class End { survived, raised, notSurvived };
+
+/// What becomes of a process that makes the call without the guard: it is given two seconds, and
+/// little room on the disk.
+End endWithoutGuard(const Fatal &fatal) {
+    const Folder folder;
+    const pid_t child = fork();
+    if (child == 0) {
+        std::freopen("/dev/null", "w", stderr);
+        const rlimit room = {std::size_t{64} << 20U, std::size_t{64} << 20U};
+        const rlimit none = {0, 0};
+        setrlimit(RLIMIT_FSIZE, &room);
+        setrlimit(RLIMIT_CORE, &none);
+        alarm(2);
+        const std::string identifier = identifierOf([&] { fatal.call(plainModule(), folder); });
+        _exit(identifier.empty() ? 0 : 1);
+    }
+    int status = 0;
+    waitpid(child, &status, 0);
+    if (WIFEXITED(status) && WEXITSTATUS(status) < 2) {
+        return WEXITSTATUS(status) == 0 ? End::survived : End::raised;
+    }
+    return End::notSurvived; // by a signal, or by the sanitizer's exit
+}
+
+TEST_P(FatalCall, IsFatalWithoutTheGuard) {
+    EXPECT_EQ(endWithoutGuard(GetParam()), End::notSurvived);
+}
+
+TEST_P(FatalCall, IsRefusedByTheGuard) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    try {
+        GetParam().call(netcdf, folder);
+        ADD_FAILURE() << "it was not refused";
+    } catch (const Error &error) {
+        EXPECT_EQ(error.identifier(), GetParam().identifier);
+        EXPECT_NE(error.message().find(GetParam().why), std::string::npos) << error.message();
+    }
+    EXPECT_GT(netcdf("inq_libvers")[0].size(), 0U) << "the next call works";
+}
+
+INSTANTIATE_TEST_SUITE_P(Rows, FatalCall, testing::ValuesIn(rows),
+                         [](const auto &row) { return row.param.name; });
+
+} // namespace
+} // namespace tessel::test

@@ -1,0 +1,124 @@
+// tests/guard/header_test.cpp: headers that claim what is not to be trusted, and those that are
+// merely wrong, which the library says itself.
+#include "support.hpp"
+
+#include <cstdint>
+#include <initializer_list>
+#include <ostream>
+#include <vector>
+
+namespace tessel::test {
+namespace {
+
+using namespace std::string_literals;
+
+/// A number as the formats store it: four bytes, the highest first.
+std::string big(std::uint32_t value) {
+    std::string bytes;
+    for (const unsigned shift : {24U, 16U, 8U, 0U}) {
+        bytes += static_cast<char>(value >> shift & 0xFFU);
+    }
+    return bytes;
+}
+
+std::string words(std::initializer_list<std::uint32_t> values) {
+    std::string bytes;
+    for (const std::uint32_t value : values) {
+        bytes += big(value);
+    }
+    return bytes;
+}
+
+const std::string classic = "CDF\1"s + big(0); // no records
+const std::string nothing = words({0, 0});
+const std::string oneDimension = words({10, 1, 1}) + "x\0\0\0"s + big(1);
+const std::string room(600, '\0');
+
+/// A variable of n dimensions, all of them the one of length 1.
+std::string variableOf(std::uint32_t n) {
+    std::string ids;
+    for (std::uint32_t i = 0; i < n; ++i) {
+        ids += big(0);
+    }
+    return classic + oneDimension + nothing + words({11, 1, 1}) + "v\0\0\0"s + big(n) + ids +
+           nothing + words({4, 4, 20000}) + room;
+}
+
+/// An attribute of the dataset, with its name, and its type and number of values.
+std::string attributeNamed(const std::string &name, std::uint32_t type, std::uint32_t values) {
+    const std::string padding((4 - name.size() % 4) % 4, '\0');
+    return classic + nothing + words({12, 1, static_cast<std::uint32_t>(name.size())}) + name +
+           padding + words({type, values}) + room + nothing;
+}
+
+struct Claim {
+    const char *name;
+    std::string bytes;
+    const char *identifier;
+    const char *says = "";
+};
+
+void PrintTo(const Claim &claim, std::ostream *out) {
+    *out << claim.name;
+}
+
+constexpr const char *refused = "TESSEL:guard:header";
+constexpr const char *opens = "";
+
+const std::vector<Claim> claims = {
+    {"Empty", "", "TESSEL:netcdf:open:notANetcdfFile"},
+    {"Nothing", classic + nothing + nothing + nothing, opens},
+    {"MoreDimensionsThanBytes", classic + words({10, 0x40000000}) + room, refused,
+     "has 1073741824 dimensions, where the file has 600 bytes left"},
+    {"OneDimensionMoreThanBytes", classic + words({10, 601}) + room, refused,
+     "has 601 dimensions, where the file has 600"},
+    {"AsManyDimensionsAsBytes", classic + words({10, 600}) + room, opens}, // padded with zeros
+    {"MoreAttributesThanBytes", classic + nothing + words({12, 0x7FFFFFFF}) + room, refused,
+     "has 2147483647 attributes"},
+    {"MoreVariablesThanBytes", classic + nothing + nothing + words({11, 0x7FFFFFFF}) + room,
+     refused, "has 2147483647 variables"},
+    {"MoreValuesThanBytes", attributeNamed("long", 6, 0x10000000), refused,
+     "has 268435456 values in an attribute"},
+    {"NameOf256", attributeNamed(std::string(256, 'n'), 1, 4), opens},
+    {"NameOf257", attributeNamed(std::string(257, 'n'), 1, 4), refused,
+     "a name of 257 characters, where 256 are the most"},
+    {"NameLongerThanTheFile", classic + words({10, 1, 0x7FFFFFFF}), refused,
+     "has 2147483647 characters in a name, where the file has 0 bytes left"},
+    {"VariableOf1024Dimensions", variableOf(1024), opens},
+    {"VariableOf1025Dimensions", variableOf(1025), refused,
+     "has a variable of 1025 dimensions, where 1024 are the most"},
+    {"LargeOffsets", "CDF\2"s + big(0) + words({10, 0x40000000}) + room, refused, "dimensions"},
+    {"LargeCounts", "CDF\5"s + words({0, 0, 10, 1, 0}) + room, refused,
+     "has 4294967296 dimensions"},
+    {"OtherFormat", "CDF\7"s + words({10, 0x40000000}) + room, "TESSEL:netcdf:open:notANetcdfFile"},
+};
+
+class Header : public testing::TestWithParam<Claim> {};
+
+TEST_P(Header, IsLookedAt) {
+    const Claim &claim = GetParam();
+    const Folder folder;
+    const std::string file = folder.with("a.nc", claim.bytes);
+    const Module netcdf = guardedModule();
+    std::string message;
+    const std::string identifier = identifierOf([&] {
+        try {
+            netcdf("close", intOf(netcdf("open", file, "NOWRITE")));
+        } catch (const Error &error) {
+            message = error.message();
+            throw;
+        }
+    });
+    EXPECT_EQ(identifier, claim.identifier) << message;
+    EXPECT_NE(message.find(claim.says), std::string::npos) << message;
+    if (identifier == refused) {
+        EXPECT_NE(message.find(file), std::string::npos) << message;
+        EXPECT_EQ(identifierOf([&] { netcdf("_open", file, 0, 4096); }), refused);
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Claims, Header, testing::ValuesIn(claims),
+                         [](const auto &row) { return row.param.name; });
+
+} // namespace
+} // namespace tessel::test

@@ -1,0 +1,262 @@
+// tests/guard/passing_test.cpp: what looks like a refused call and is none, addresses, and the
+// watcher itself.
+#include "support.hpp"
+
+#include <cstddef>
+#include <functional>
+#include <ostream>
+#include <vector>
+
+namespace tessel::test {
+namespace {
+
+struct Passing {
+    const char *name;
+    const char *identifier; // what the module itself says; "" if the call succeeds
+    std::function<void(const Module &netcdf, const Folder &folder)> call;
+};
+
+void PrintTo(const Passing &row, std::ostream *out) {
+    *out << row.name;
+}
+
+const Passing rows[] = {
+    {"AlignmentBeforeAnyVariable", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_enddef", intOf(netcdf("create", folder.file("a.nc"), 0)), 0, 0, 0, 0);
+     }},
+    {"AlignmentOutsideOfDefineMode", "TESSEL:netcdf:pEndDef:operationNotAllowedInDataMode",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_enddef", newDataset(netcdf, folder.file("a.nc")), 0, 0, 0, 0);
+     }},
+    {"AlignmentOfAnHdf5File", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 4096);
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, 0, 0, 0);
+     }},
+    {"AlignmentOfAnHdf5FileByDefault", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int former = intOf(netcdf("set_default_format", 3));
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("set_default_format", former);
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, 0, 0, 0);
+     }},
+    {"AlignmentThatIsNegative", "TESSEL:netcdf:negativeSize",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, -1, 0, 4);
+     }},
+    {"TooFewInputs", "TESSEL:netcdf:pEndDef:badParameterCount",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, 0, 0);
+     }},
+    {"OpenOfAUserFormat", "TESSEL:netcdf:open:unknownErrorStatus",
+     [](const Module &netcdf, const Folder &folder) {
+         newDataset(netcdf, folder.file("a.nc"));
+         netcdf("open", folder.file("a.nc"), 64);
+     }},
+    {"CreateInMemoryFlag", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", intOf(netcdf("create", folder.file("a.nc"), 32768)));
+     }},
+    {"SecondCloseOfADatasetThatWasClosed", "TESSEL:netcdf:close:notNetcdfID",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("close", ncid);
+         netcdf("close", ncid);
+     }},
+    {"CountsThatWrapToAnotherNumber", "TESSEL:netcdf:putVara:dataSizeMismatch",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vara_double", ncid, 1, Array::row({0, 0}), Array::row({-1, -1}),
+                Array::row({1, 2}));
+     }},
+    {"CountsWithoutData", "TESSEL:netcdf:emptyVariableData",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vara_double", ncid, 1, Array::row({0, 0}), Array::row({2, 0x1p63}),
+                Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{0, 0}));
+     }},
+    {"AStepBackwardsFromARecordFarBeyond", "TESSEL:netcdf:putVars:illegalStride",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vars_double", ncid, 1, Array::row({0, 4e9}), Array::row({1, 2}),
+                Array::row({1, -1}), Array::row({1, 2}));
+     }},
+    {"AnElementFarBeyondTheRecordsWithoutFilling", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 512); // 64-bit offsets
+         netcdf("set_fill", ncid, 256);
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 2e8}), 1);
+     }},
+    {"AnElementFarBeyondAFixedDimension", "TESSEL:netcdf:putVar1:indexExceedsDimensionBound",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_var1_double", ncid, 0, 4e9, 1);
+         netcdf("put_var1_double", ncid, 0, 4e9, 1);
+     }},
+    {"AnElementOfNoVariable", "TESSEL:netcdf:putVar1:inqVarNDimsFailure",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_var1_double", ncid, 7, Array::row({0, 4e9}), 1);
+     }},
+    {"AnElementOfNoDataset", "TESSEL:netcdf:putVar1:inqVarNDimsFailure",
+     [](const Module &netcdf, const Folder & /*folder*/) {
+         netcdf("put_var1_double", 0x7FFF0000, 1, Array::row({0, 4e9}), 1);
+     }},
+    {"AnElementWhileDefining", "TESSEL:netcdf:putVar1:operationNotAllowedInDefineMode",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("redef", ncid);
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
+     }},
+    {"AWordInsteadOfADataset", "TESSEL:netcdf:badIDDatatype",
+     [](const Module &netcdf, const Folder & /*folder*/) { netcdf("close", "all"); }},
+};
+
+class PassingCall : public testing::TestWithParam<Passing> {};
+
+TEST_P(PassingCall, IsAnsweredByTheModule) {
+    const Folder folder;
+    EXPECT_EQ(identifierOf([&] { GetParam().call(guardedModule(), folder); }),
+              GetParam().identifier);
+    const Folder other;
+    EXPECT_EQ(identifierOf([&] { GetParam().call(plainModule(), other); }), GetParam().identifier);
+}
+
+INSTANTIATE_TEST_SUITE_P(Rows, PassingCall, testing::ValuesIn(rows),
+                         [](const auto &row) { return row.param.name; });
+
+TEST(Records, FillUpToTheLimit) {
+    const Folder folder;
+    const Module netcdf = guardedModule({.fillLimit = 800}); // ten records
+    const int ncid = newDataset(netcdf, folder.file("a.nc"));
+    const auto write = [&](double record) {
+        return identifierOf([&] {
+            netcdf("put_var1_double", ncid, 1, Array::row({0, record}), 1);
+        });
+    };
+    EXPECT_EQ(write(11), "TESSEL:guard:records");
+    EXPECT_EQ(write(10), "") << "ten records are filled";
+    EXPECT_EQ(write(3), "");
+    EXPECT_EQ(write(22), "TESSEL:guard:records") << "the records end at 11";
+    EXPECT_EQ(write(21), "");
+    for (int record = 22; record < 100; ++record) {
+        EXPECT_EQ(write(record), "") << "records one after the other fill nothing";
+    }
+    netcdf("put_vara_double", ncid, 1, Array::row({0, 100}), Array::row({1, 40}),
+           Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{1, 40}));
+    EXPECT_EQ(netcdf("inq_dim", ncid, 0)[1].number(), 140);
+    // A variable that is defined later makes the records longer.
+    netcdf("redef", ncid);
+    netcdf("def_var", ncid, "more", ncDouble, Array::row({1, 0}));
+    netcdf("enddef", ncid);
+    EXPECT_EQ(write(146), "TESSEL:guard:records") << "six records of 160 bytes";
+    EXPECT_EQ(write(145), "");
+    netcdf("close", ncid);
+}
+
+TEST(Records, OfADatasetThatWasOpenedWithoutTheGuard) {
+    const Folder folder;
+    const Module netcdf = plainModule();
+    const int ncid = newDataset(netcdf, folder.file("a.nc"));
+    const auto write = [&] {
+        guardedModule()("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
+    };
+    EXPECT_EQ(identifierOf(write), "TESSEL:guard:records");
+    netcdf("close", ncid);
+}
+
+struct Name {
+    const char *name;
+    bool address;
+};
+
+TEST(Addresses, AreRefusedUnlessAllowed) {
+    constexpr Name names[] = {
+        {"https://127.0.0.1:1/a.nc", true},
+        {"http://127.0.0.1:1/a.nc", true},
+        {"file:///a.nc", true},
+        {"  dods://127.0.0.1:1/a", true},
+        {"[mode=x] http://127.0.0.1:1/a", true},
+        {"s3://bucket/a", true},
+        {"missing/a.nc", false},
+        {"missing/a:b.nc", false},
+        {"://missing/a.nc", false},
+        {"folder/http://a.nc", false},
+    };
+    const Module guarded = guardedModule();
+    for (const Name &row : names) {
+        for (const char *operation : {"open", "create"}) {
+            const std::string identifier = identifierOf([&] { guarded(operation, row.name, 4); });
+            EXPECT_EQ(identifier == "TESSEL:guard:remote", row.address)
+                << operation << " " << row.name << ": " << identifier;
+        }
+    }
+    const std::string identifier = identifierOf(
+        [&] { guardedModule({.remote = true})("open", "https://127.0.0.1:1/a.nc", 0); });
+    EXPECT_TRUE(identifier.starts_with("TESSEL:netcdf:open:")) << identifier;
+}
+
+TEST(ClosedDatasets, AreRefusedToEveryOperation) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int x = intOf(netcdf("def_dim", ncid, "x", 3));
+    netcdf("def_var", ncid, "v", ncInt, x);
+    netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
+    EXPECT_EQ(identifierOf([&] { netcdf("enddef", ncid); }),
+              "TESSEL:netcdf:endDef:invalidDataType");
+    EXPECT_EQ(identifierOf([&] { netcdf("inq", ncid); }), "") << "it is open still";
+    EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:netcdf:close:invalidDataType");
+
+    const int other = newDataset(netcdf, folder.file("b.nc"));
+    EXPECT_EQ(identifierOf([&] { netcdf("inq", ncid); }), "TESSEL:guard:closed");
+    EXPECT_EQ(identifierOf([&] { netcdf("get_var1_double", ncid, 0, 0); }), "TESSEL:guard:closed");
+    EXPECT_EQ(identifierOf([&] { netcdf("copy_att", other, 0, "a", ncid, 0); }),
+              "TESSEL:guard:closed");
+    EXPECT_EQ(identifierOf([&] { netcdf("inq", other); }), "");
+    netcdf("close", other);
+}
+
+/// Notes what it sees.
+class Notes : public Watcher {
+  public:
+    void before(Inputs inputs, const Ask &ask) override {
+        seen.push_back(utf8Of(inputs[0]));
+        asked = ask("inq_libvers")[0].utf8();
+        if (seen.back() == "refuse") {
+            throw Error("test:refused", "No.");
+        }
+    }
+    void after(Inputs /*inputs*/, const Results &results, const Error *error) noexcept override {
+        ended.push_back(error == nullptr ? std::to_string(results.size()) : error->identifier());
+    }
+
+    std::vector<std::string> seen;
+    std::vector<std::string> ended;
+    std::string asked;
+};
+
+TEST(Watching, SeesEveryCallAndItsEnd) {
+    const auto notes = std::make_shared<Notes>();
+    const Module netcdf = plainModule();
+    const Module watched = netcdf.watchedBy(notes);
+    watched("param", "NC_DOUBLE");
+    EXPECT_EQ(identifierOf([&] { watched("nothing"); }), "TESSEL:netcdf:InvalidOperation");
+    EXPECT_EQ(identifierOf([&] { watched("refuse"); }), "test:refused");
+    netcdf("param", "NC_INT");
+    const Module notWatched = watched.watchedBy(nullptr);
+    notWatched("param", "NC_INT");
+    EXPECT_EQ(notes->seen, (std::vector<std::string>{"param", "nothing", "refuse"}));
+    EXPECT_EQ(notes->ended, (std::vector<std::string>{"1", "TESSEL:netcdf:InvalidOperation"}));
+    EXPECT_EQ(notes->asked, netcdf("inq_libvers")[0].utf8());
+}
+
+} // namespace
+} // namespace tessel::test

@@ -1,0 +1,79 @@
+// tests/guard/support.hpp: datasets in a folder of the test's own, with and without the guard.
+#pragma once
+
+#include "tessel/netcdf_guard.hpp"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <string>
+#include <string_view>
+
+namespace tessel::test {
+
+inline Module plainModule() {
+    return Module(TESSEL_NETCDF_MODULE);
+}
+
+inline Module guardedModule(const GuardOptions &options = {}) {
+    return plainModule().watchedBy(netcdfGuard(options));
+}
+
+/// The identifier that a call raises; "" if it raises none.
+template <class Call>
+std::string identifierOf(const Call &call) {
+    try {
+        call();
+    } catch (const Error &error) {
+        return error.identifier();
+    }
+    return "";
+}
+
+/// A folder that goes with the test.
+class Folder {
+  public:
+    Folder() {
+        std::string pattern = (std::filesystem::temp_directory_path() / "guard-XXXXXX").string();
+        path = mkdtemp(pattern.data());
+    }
+    ~Folder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(path, ignored);
+    }
+    Folder(const Folder &) = delete;
+    Folder &operator=(const Folder &) = delete;
+
+    [[nodiscard]] std::string file(std::string_view name) const { return path / name; }
+
+    [[nodiscard]] std::string with(std::string_view name, std::string_view bytes) const {
+        std::ofstream(path / name, std::ios::binary) << bytes;
+        return path / name;
+    }
+
+  private:
+    std::filesystem::path path;
+};
+
+inline int intOf(const Results &results) {
+    return static_cast<int>(results[results.size() - 1].number());
+}
+
+constexpr double ncDouble = 6;
+constexpr double ncInt = 4;
+
+/// A dataset in data mode: the fixed variable 0 over x (10), and the record variable 1 over t and
+/// x.
+inline int newDataset(const Module &netcdf, const std::string &file, int flags = 0) {
+    const int ncid = intOf(netcdf("create", file, flags));
+    const int t = intOf(netcdf("def_dim", ncid, "t", 0));
+    const int x = intOf(netcdf("def_dim", ncid, "x", 10));
+    netcdf("def_var", ncid, "fixed", ncDouble, x);
+    netcdf("def_var", ncid, "records", ncDouble,
+           Array::row({static_cast<double>(x), static_cast<double>(t)}));
+    netcdf("enddef", ncid);
+    return ncid;
+}
+
+} // namespace tessel::test
