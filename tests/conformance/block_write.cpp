@@ -24,6 +24,14 @@ Outcome wrongSize(const std::string &implied, const std::string &given) {
                      ") does not equal the number of data elements (" + given + ").");
 }
 
+/// The sample's temperatures, and a record of them that nobody wrote.
+const std::string temperatures =
+    "0 1 2 3 100 101 102 103 200 201 202 203 "
+    "10000 10001 10002 10003 10100 10101 10102 10103 10200 10201 10202 10203";
+const std::string filledRecord =
+    "9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 "
+    "9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36";
+
 const Lines levelInquiry = {"nc_inq_var(ncid, 4, out, NULL, out, NULL, NULL)"};
 
 // clang-format off
@@ -38,10 +46,9 @@ Rows elements() {
          {"nc_inq_var(ncid, 5, out, NULL, out, NULL, NULL)", "nc_put_var1_int(ncid, 5, {1, 3}, input 4)"}},
         {"a new record", On::sample, {"put_var1_double", ncid, varid("time"), uint8s({2}), 9}, givesNothing(),
          {"- dimension 0: t = 2, unlimited",
-          "- temp = 0 1 2 3 100 101 102 103 200 201 202 203 10000 10001 10002 10003 10100 10101 10102 10103 10200 10201 10202 10203",
+          "- temp = " + temperatures,
           "- time = 0 1", "- flag = \"NY\"", "+ dimension 0: t = 3, unlimited",
-          "+ temp = 0 1 2 3 100 101 102 103 200 201 202 203 10000 10001 10002 10003 10100 10101 10102 10103 10200 10201 10202 10203 "
-          "9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36",
+          "+ temp = " + temperatures + " " + filledRecord,
           "+ time = 0 1 9", R"(+ flag = "NY\x00")"}},
         {"a character", On::sample, {"put_var1_text", ncid, varid("label"), 1, "x"}, givesNothing(),
          {R"(- label = "a\x00\xE9z!")", R"(+ label = "ax\xE9z!")"},
@@ -95,7 +102,7 @@ Rows blocks() {
          {"nc_inq_var(ncid, 5, out, NULL, out, NULL, NULL)", "nc_put_vara_int(ncid, 5, {0, 0}, {3, 2}, input 5)"}},
         {"a new record of one number", On::noRecords, {"put_vara_double", ncid, varid("time"), 0, 1, 9}, givesNothing(),
          {"- dimension 0: t = 0, unlimited", "- temp = ", "- time = ", "- flag = \"\"", "+ dimension 0: t = 1, unlimited",
-          "+ temp = 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36 9.96921e+36",
+          "+ temp = " + filledRecord,
           "+ time = 9", R"(+ flag = "\x00")"}},
         {"text", On::sample, {"put_vara_text", ncid, varid("name"), doubles({3, 0}), doubles({2, 3}), "abcdef"}, givesNothing(),
          {R"(- name = "first     caf\xE9\x80\xFF\x7F\x00\x00\x00third  end")", R"(+ name = "firab     cafcd\xFF\x7F\x00\x00\x00thief  end")"},

@@ -35,8 +35,12 @@ tsArray *noted(std::string call, tsArray *array) {
 using namespace tessel::test;
 
 void *tsCalloc(size_t count, size_t size) {
-    void *const block = hidden<void *, size_t, size_t>("tsCalloc")(count, size);
+    void *block = hidden<void *, size_t, size_t>("tsCalloc")(count, size);
     if (Probe *const probe = Probe::watching()) {
+        if (probe->refusesNoBytes() && (count == 0 || size == 0)) {
+            hidden<void, void *>("tsFree")(block);
+            block = nullptr;
+        }
         probe->noteBlock("tsCalloc(" + shown(count) + ", " + shown(size) + ")", block);
     }
     return block;
@@ -61,6 +65,13 @@ bool tsIsNumeric(const tsArray *array) {
     const Probe *const probe = Probe::watching();
     return (probe != nullptr && probe->claimsNumeric()) ||
            hidden<bool, const tsArray *>("tsIsNumeric")(array);
+}
+
+void *tsGetData(const tsArray *array) {
+    const Probe *const probe = Probe::watching();
+    return probe != nullptr && probe->hidesNoData() && tsIsEmpty(array)
+               ? nullptr
+               : hidden<void *, const tsArray *>("tsGetData")(array);
 }
 
 tsArray *tsCreateDoubleScalar(double value) {

@@ -61,6 +61,11 @@ class Probe {
     /// tsIsNumeric answers true, whatever the class.
     void claimNumeric() { numericClaimed = true; }
 
+    /// tsCalloc answers a request for no bytes with NULL, tsGetData one for the data of an array
+    /// without elements. A host may do either.
+    void refuseNoBytes() { noBytesRefused = true; }
+    void hideNoData() { noDataHidden = true; }
+
     /// Names for a dataset id and for memory, and a folder that paths are shown without.
     void name(int id, std::string text) { ids[id] = std::move(text); }
     void name(const void *data, std::string text) { memory[data] = std::move(text); }
@@ -99,6 +104,8 @@ class Probe {
     [[nodiscard]] const std::optional<std::string> &explained() const { return explanation; }
     bool deniesText() { return ++textsAsked == textDenied; }
     [[nodiscard]] bool claimsNumeric() const { return numericClaimed; }
+    [[nodiscard]] bool refusesNoBytes() const { return noBytesRefused; }
+    [[nodiscard]] bool hidesNoData() const { return noDataHidden; }
     void note(std::string call) { notes.push_back({std::move(call), nullptr}); }
     void noteBlock(std::string call, const void *block);
     void noteFree(const void *block);
@@ -127,6 +134,8 @@ class Probe {
     int textDenied = 0;
     int textsAsked = 0;
     bool numericClaimed = false;
+    bool noBytesRefused = false;
+    bool noDataHidden = false;
     bool effect = false;
     std::vector<int> openedIDs;
     std::map<int, std::string> ids;

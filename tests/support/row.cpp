@@ -63,6 +63,12 @@ void prepare(Probe &probe, const Interference &interference, const Scene &scene)
     if (interference.isNumeric) {
         probe.claimNumeric();
     }
+    if (interference.noBytes) {
+        probe.refuseNoBytes();
+    }
+    if (interference.noData) {
+        probe.hideNoData();
+    }
     probe.leaveOut(scene.path(""));
     if (scene.ncid() != -1) {
         probe.name(scene.ncid(), "ncid");
@@ -212,6 +218,13 @@ Interference answering(std::string function, int status) {
     return interference;
 }
 
+Interference nullForNothing() {
+    Interference interference;
+    interference.noBytes = true;
+    interference.noData = true;
+    return interference;
+}
+
 Rows together(std::vector<Rows> lists) {
     Rows all;
     for (Rows &list : lists) {
@@ -238,11 +251,21 @@ void check(const Row &row) {
         EXPECT_EQ(seen.outcome, outcomeWithout(n, row, undisturbed));
         EXPECT_EQ(joined(seen.changes), joined(seen.effect ? row.changes : Lines()));
     }
-    SCOPED_TRACE("no allocation fails, and no output is asked for");
-    CallOptions options;
-    options.failAllocation = allocations + 1;
-    options.outputs = 0;
-    checkUndisturbed(row, run(row, options));
+    {
+        SCOPED_TRACE("no allocation fails, and no output is asked for");
+        CallOptions options;
+        options.failAllocation = allocations + 1;
+        options.outputs = 0;
+        checkUndisturbed(row, run(row, options));
+    }
+    {
+        SCOPED_TRACE("the host has no memory for what is empty");
+        Row sparing = row;
+        sparing.interference.noBytes = true;
+        sparing.interference.noData = true;
+        sparing.asks = {}; // an empty array's memory is shown as NULL in them
+        checkUndisturbed(sparing, run(sparing, {}));
+    }
 
     EXPECT_EQ(openDescriptors(), descriptors) << "a file is still open";
 }

@@ -38,10 +38,15 @@ struct Interference {
     int status = 0;         //
     int textDenied = 0;     ///< the n-th tsArrayToString answers NULL
     bool isNumeric = false; ///< tsIsNumeric answers true whatever the class
+    bool noBytes = false;   ///< tsCalloc answers a request for no bytes with NULL
+    bool noData = false;    ///< tsGetData answers NULL for an array without elements
 };
 
 /// The library function answers the status and is not asked.
 Interference answering(std::string function, int status);
+
+/// The host gives NULL where the empty needs no memory, as a host may.
+Interference nullForNothing();
 
 /// One call, and all that is to come of it.
 struct Row {
@@ -59,8 +64,8 @@ using Rows = std::vector<Row>;
 /// The rows of several lists.
 Rows together(std::vector<Rows> lists);
 
-/// Runs the row: as it is, and again with the n-th allocation failing for every n there is. Reports
-/// by way of GoogleTest.
+/// Runs the row: as it is; again with the n-th allocation failing for every n there is; and by a
+/// host that has no memory for what is empty. Reports by way of GoogleTest.
 void check(const Row &row);
 
 } // namespace tessel::test

@@ -100,11 +100,11 @@ void writeCoordinates(int ncid, const char *name, const std::vector<std::size_t>
     std::vector<double> values(size);
     for (std::size_t i = 0; i < size; ++i) {
         std::size_t rest = i;
-        double place = 1.0;
-        for (auto length = lengths.rbegin(); length != lengths.rend(); ++length) {
-            values[i] += place * static_cast<double>(rest % *length);
-            rest /= *length;
-            place *= 100.0;
+        std::size_t block = size;
+        for (const std::size_t length : lengths) {
+            block /= length;
+            values[i] = values[i] * 100.0 + static_cast<double>(rest / block);
+            rest %= block;
         }
     }
     const std::vector<std::size_t> start(lengths.size());

@@ -30,7 +30,7 @@ void want(int status);
 /// twenty = 20, and a variable of each kind that matters; see sample.cpp, or what describe() says.
 class Scene {
   public:
-    explicit Scene(On on);
+    explicit Scene(On what);
     ~Scene();
     Scene(const Scene &) = delete;
     Scene &operator=(const Scene &) = delete;

@@ -124,7 +124,7 @@ Value wholes(tsClassID classID, const std::vector<int> &values) {
     return {[=](const Scene &) { return wholesOf(classID, values); }};
 }
 
-Value shaped(std::vector<std::size_t> dims, const Value &value) {
+Value shaped(const std::vector<std::size_t> &dims, const Value &value) {
     return {[=](const Scene &scene) {
         const Array from = value.make(scene);
         Array to = emptyArray(from.classID(), dims);
@@ -133,7 +133,7 @@ Value shaped(std::vector<std::size_t> dims, const Value &value) {
     }};
 }
 
-Value empty(tsClassID classID, std::vector<std::size_t> dims) {
+Value empty(tsClassID classID, const std::vector<std::size_t> &dims) {
     return {[=](const Scene &) { return emptyArray(classID, dims); }};
 }
 
@@ -148,7 +148,7 @@ Value complexDouble(double real) {
     return complexDoubles({real});
 }
 
-Value cell(Values values) {
+Value cell(const Values &values) {
     return {[=](const Scene &scene) {
         const std::array<std::size_t, 2> dims = {std::max<std::size_t>(values.size(), 1), 1};
         Array array = Array::cell(dims);
@@ -172,21 +172,21 @@ const Value ncid = {[](const Scene &scene) { return Array::scalar(scene.ncid());
 const Value other = {[](const Scene &scene) { return Array::scalar(scene.otherNcid()); }};
 const Value opened = {[](const Scene &scene) { return Array::scalar(scene.openedByCall()); }};
 
-Value varid(std::string name) {
+Value varid(const std::string &name) {
     return {[=](const Scene &scene) {
         int id = 0;
         want(nc_inq_varid(scene.ncid(), name.c_str(), &id));
         return Array::scalar(id);
     }};
 }
-Value dimid(std::string name) {
+Value dimid(const std::string &name) {
     return {[=](const Scene &scene) {
         int id = 0;
         want(nc_inq_dimid(scene.ncid(), name.c_str(), &id));
         return Array::scalar(id);
     }};
 }
-Value file(std::string name) {
+Value file(const std::string &name) {
     return {[=](const Scene &scene) { return Array::text(scene.path(name)); }};
 }
 

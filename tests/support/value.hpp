@@ -53,15 +53,15 @@ Value chars(std::string_view utf8);
 Value wholes(tsClassID classID, const std::vector<int> &values);
 
 /// The same elements, or the same class without any, in other dimensions.
-Value shaped(std::vector<std::size_t> dims, const Value &value);
-Value empty(tsClassID classID, std::vector<std::size_t> dims = {0, 0});
+Value shaped(const std::vector<std::size_t> &dims, const Value &value);
+Value empty(tsClassID classID, const std::vector<std::size_t> &dims = {0, 0});
 
 /// The same array with an imaginary part that is 7 everywhere.
 Value complexDouble(double real);
 Value complexDoubles(std::initializer_list<double> reals);
 
 // Classes without numbers. A cell holds the given values in a column.
-Value cell(Values values = {});
+Value cell(const Values &values = {});
 Value structure();
 Value function();
 Value unknown();
@@ -71,9 +71,9 @@ Value unknown();
 extern const Value ncid;
 extern const Value other;
 extern const Value opened;
-Value varid(std::string name);
-Value dimid(std::string name);
-Value file(std::string name);
+Value varid(const std::string &name);
+Value dimid(const std::string &name);
+Value file(const std::string &name);
 
 /// The text of the library's version.
 extern const Value libraryVersion;
