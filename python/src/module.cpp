@@ -1,5 +1,6 @@
 // python/src/module.cpp: the extension `tessel._runtime`: loading modules and calling them.
 #include "conversion.hpp"
+#include "tessel/netcdf_guard.hpp"
 
 #include <pybind11/stl/filesystem.h>
 
@@ -93,6 +94,14 @@ PYBIND11_MODULE(_runtime, extension) {
                        "A loaded module. Call it with the name of an operation and its arguments.")
         .def(py::init<const Module &>(), "The same module.", py::arg("module"))
         .def("__call__", call, callDoc)
+        .def(
+            "guarded",
+            [](const Module &module, bool remote) {
+                return module.watchedBy(netcdfGuard({.remote = remote}));
+            },
+            "The same module, kept from the calls that the netCDF library does not survive, and\n"
+            "from addresses given as file names unless they are allowed.",
+            py::arg("remote"))
         .def("__repr__",
              [](const Module &module) {
                  return py::str("<tessel.Module {}>").format(module.file());

@@ -61,7 +61,7 @@ unknown              tessel.Unknown                      tessel.Unknown
 from __future__ import annotations
 
 import os
-from typing import Literal, overload
+from typing import Literal, get_args, overload
 
 from tessel import _runtime
 from tessel._runtime import Module
@@ -75,22 +75,34 @@ from tessel.values import Function, Unknown
 __all__ = ["Error", "Function", "Module", "Netcdf", "Unknown", "check", "copy", "load",
            "progress_bar", "read"]
 
+Guard = Literal["on", "remote", "off"]
+"""How much the netCDF library is kept from: see `load`."""
+
 
 @overload
-def load(module: Literal["netcdf"]) -> Netcdf: ...
+def load(module: Literal["netcdf"], guard: Guard | None = None) -> Netcdf: ...
 @overload
-def load(module: str | os.PathLike[str]) -> Module: ...
+def load(module: str | os.PathLike[str], guard: Guard | None = None) -> Module: ...
 
 
-def load(module: str | os.PathLike[str]) -> Module:
+def load(module: str | os.PathLike[str], guard: Guard | None = None) -> Module:
     """The module of a name ("netcdf"), or in a file (a str with a slash, or a path object).
 
     A name is looked up in the folders of the variable TESSEL_MODULE_PATH and among the modules that
     came with this package. A module whose file is called "netcdf.tsx" is a `tessel.Netcdf`, which
-    has a method for every operation.
+    has a method for every operation and a guard: it refuses the few calls that the netCDF library
+    does not survive, and file names that are addresses, which the library would fetch
+    (identifiers that begin with "TESSEL:guard:"). `guard` is "on", "remote" (addresses are
+    allowed) or "off"; None takes it from the variable TESSEL_GUARD, and "on" without one.
     """
     loaded = _load(module)
-    return Netcdf(loaded) if loaded.file.name == "netcdf.tsx" else loaded
+    if loaded.file.name != "netcdf.tsx":
+        return loaded
+    chosen = os.environ.get("TESSEL_GUARD", "on") if guard is None else guard
+    if chosen not in get_args(Guard):
+        raise Error("TESSEL:python:badGuard", f"A guard is one of {', '.join(get_args(Guard))}, "
+                                              f"and not {chosen!r}.")
+    return Netcdf(loaded if chosen == "off" else loaded.guarded(chosen == "remote"))
 
 
 def _load(module: str | os.PathLike[str]) -> Module:

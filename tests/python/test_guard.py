@@ -1,0 +1,77 @@
+# tests/python/test_guard.py: the guard is there unless it is switched off.
+"""What `tessel.load` gives is kept from the calls that the netCDF library does not survive."""
+
+import os
+import subprocess
+import sys
+from pathlib import Path
+
+import pytest
+import tessel
+
+FATAL = """
+import resource, sys, tessel
+resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
+try:
+    {load}.create(sys.argv[1], 64)
+except tessel.Error as error:
+    print(error.identifier)
+"""
+
+
+def outcome(folder: Path, load: str, **variables: str) -> tuple[int, str]:
+    """How a process ends that makes a call that is fatal to the library, and what it prints."""
+    done = subprocess.run([sys.executable, "-B", "-c", FATAL.format(load=load),
+                           folder / "new.nc"], capture_output=True, text=True, check=False,
+                          env={**os.environ, **variables})
+    return done.returncode, done.stdout.strip()
+
+
+GUARDED = (0, "TESSEL:guard:mode")
+
+
+@pytest.mark.parametrize(("load", "variable", "guarded"), [
+    ("tessel.load('netcdf')", None, True),
+    ("tessel.load('netcdf', 'on')", "off", True),
+    ("tessel.load('netcdf')", "remote", True),
+    ("tessel.load('netcdf')", "off", False),
+    ("tessel.load('netcdf', guard='off')", "on", False),
+    ("tessel.load(tessel.load('netcdf').file)", None, True),
+])
+def test_a_call_that_the_library_does_not_survive(tmp_path, load, variable, guarded):
+    variables = {} if variable is None else {"TESSEL_GUARD": variable}
+    found = outcome(tmp_path, load, **variables)
+    if guarded:
+        assert found == GUARDED
+    else:
+        assert found[0] != 0
+        assert found[1] == ""
+
+
+@pytest.mark.parametrize(("guard", "identifier"), [
+    ("on", "TESSEL:guard:remote"),
+    ("remote", "TESSEL:netcdf:open:"),
+    ("off", "TESSEL:netcdf:open:"),
+])
+def test_addresses(guard, identifier):
+    with pytest.raises(tessel.Error) as raised:
+        tessel.load("netcdf", guard=guard).open("https://127.0.0.1:1/a.nc", "NOWRITE")
+    assert raised.value.identifier.startswith(identifier)
+
+
+@pytest.mark.parametrize(("argument", "variable"), [("none", "on"), (None, ""), (None, "On")])
+def test_a_word_that_is_no_guard(monkeypatch, argument, variable):
+    monkeypatch.setenv("TESSEL_GUARD", variable)
+    with pytest.raises(tessel.Error) as raised:
+        tessel.load("netcdf", argument)
+    assert raised.value.identifier == "TESSEL:python:badGuard"
+    assert "on, remote, off" in raised.value.message
+
+
+def test_read_and_check_refuse_addresses_too():
+    for call in (lambda: tessel.read("https://127.0.0.1:1/a.nc", "v"),
+                 lambda: tessel.check("https://127.0.0.1:1/a.nc"),
+                 lambda: tessel.copy("https://127.0.0.1:1/a.nc", "target.nc")):
+        with pytest.raises(tessel.Error) as raised:
+            call()
+        assert raised.value.identifier == "TESSEL:guard:remote"
