@@ -49,7 +49,7 @@ def identifiers(value: Any) -> Any:
     return [integer(value)] if not isinstance(value, list) else value
 
 
-def numbers(value: Any, dtype: numpy.dtype[Any], operation: str) -> Any:
+def numbers(value: Any, dtype: numpy.dtype[Any]) -> Any:
     """An array of exactly this dtype for Python's own numbers; else the value itself."""
     if type(value) not in (int, float, list, tuple):
         return value
@@ -65,9 +65,11 @@ def numbers(value: Any, dtype: numpy.dtype[Any], operation: str) -> Any:
     with numpy.errstate(all="ignore"):
         for i, each in enumerate(flat):
             if not _put(made, i, each):
+                from tessel import notes  # here, because only errors need it
+
                 raise Error("TESSEL:python:notExact",
-                            f"{each!r} is not exact as {dtype.name}; pass an array of that dtype "
-                            "to have it rounded.", operation)
+                            f"{notes.shortened(each)} is not exact as {dtype.name}; pass an array "
+                            "of that dtype to have it rounded.")
     return made.reshape(objects.shape)
 
 

@@ -6,19 +6,11 @@ from __future__ import annotations
 import argparse
 import os
 from collections.abc import Callable
-from typing import NoReturn
 
 import tessel
-from tessel import integrity, show, terminal, wording
+from tessel import integrity, notes, show, terminal, wording
 from tessel.dataset import Dataset
 from tessel.new_dataset import FORMATS
-
-
-class _Parser(argparse.ArgumentParser):
-    """A parser that shows nothing to the terminal that could steer it."""
-
-    def error(self, message: str) -> NoReturn:
-        super().error(wording.printable(message))
 
 
 def _open(options: argparse.Namespace) -> Dataset:
@@ -47,11 +39,13 @@ def _plot(options: argparse.Namespace) -> None:
         try:
             if variable.is_text:
                 raise picture.NothingToDraw("its values are text")
-            kind = picture.draw(dataset, variable, dataset.values(variable), options.output,
-                                dict(options.index))
+            chosen = dict(options.index)
+            kind = picture.draw(dataset, variable, dataset.values(variable, chosen),
+                                options.output, chosen)
         except picture.NothingToDraw as reason:
             raise tessel.Error("TESSEL:python:nothingToDraw",
-                               f"No picture of {variable.name}: {reason}.") from None
+                               f"No picture of {variable.name}: {reason}.",
+                               path=dataset.place) from None
     print(f"The {kind} is in {wording.printable(options.output)}")
 
 
@@ -103,7 +97,7 @@ def _add_check(parser: argparse.ArgumentParser) -> None:
 
 
 def _parser() -> argparse.ArgumentParser:
-    parser = _Parser(prog="tessel", description=__doc__)
+    parser = terminal.Parser(prog="tessel", description=__doc__)
     commands = parser.add_subparsers(metavar="COMMAND", required=True)
 
     def command(name: str, action: Callable[[argparse.Namespace], None],
@@ -144,7 +138,17 @@ def _parser() -> argparse.ArgumentParser:
     return parser
 
 
+def _line(error: Exception, options: argparse.Namespace) -> str:
+    """What went wrong, with which file, and what is there instead of a dataset."""
+    message = terminal.message_of(error)
+    if isinstance(error, tessel.Error):
+        path = error.path or getattr(options, "file", getattr(options, "source", None))
+        if path is not None:
+            message = ": ".join([terminal.with_file(error.message, path), *notes.instead(error)])
+    return f"tessel: {message}"
+
+
 def main(arguments: list[str] | None = None) -> int:
     """The command line; returns its exit status."""
     options = _parser().parse_args(arguments)
-    return terminal.run(lambda: options.action(options))
+    return terminal.run(lambda: options.action(options), lambda error: _line(error, options))

@@ -3,16 +3,17 @@
 
 from __future__ import annotations
 
-import os
-from collections.abc import Iterator
+from collections.abc import Iterator, Mapping, Sequence
 from dataclasses import dataclass, field
 from functools import cached_property
 from types import TracebackType
 from typing import Any
 
 import numpy as np
+from numpy.typing import NDArray
 
 import tessel
+from tessel import paths, wording
 
 TEXT = 2
 """The number of the external type of text."""
@@ -72,7 +73,7 @@ class Attribute:
 
     name: str
     type: ExternalType
-    value: str | np.ndarray | tessel.Error
+    value: str | NDArray[Any] | tessel.Error
 
 
 @dataclass(frozen=True)
@@ -89,6 +90,13 @@ class Variable:
     def shape(self) -> tuple[int, ...]:
         """The lengths of the dimensions."""
         return tuple(dimension.length for dimension in self.dimensions)
+
+    def __str__(self) -> str:
+        """What it is, with its dimensions in the host's order, in printable characters."""
+        lengths = ", ".join(f"{each.name}={each.length}{' unlimited' if each.unlimited else ''}"
+                            for each in self.dimensions[::-1])
+        shape = f"({lengths})" if lengths else ", a single value"
+        return wording.printable(f"{self.type.name} {self.name}{shape}")
 
     @property
     def is_text(self) -> bool:
@@ -115,7 +123,7 @@ class Variable:
         numbers = self.numbers(attribute)
         return float(numbers[0]) if numbers.size else default
 
-    def numbers(self, attribute: str) -> np.ndarray:
+    def numbers(self, attribute: str) -> NDArray[Any]:
         """All numbers of an attribute; none when it is missing or no number."""
         found = self.attributes.get(attribute)
         value = found.value if found else None
@@ -133,12 +141,21 @@ class Variable:
                 or self.text("axis").upper() == "T")
 
 
-class Dataset:
-    """An open file. Close it, or use it in a `with` statement."""
+def host_order(places: Sequence[int]) -> NDArray[Any]:
+    """Places in the library's order as an argument, which is in the host's."""
+    return np.array(places[::-1], float)
 
-    def __init__(self, path: str | os.PathLike[str]) -> None:
+
+class Dataset:
+    """An open file. Close it, or use it in a `with` statement.
+
+    `path` is the name that it was given, and `place` where that led from the folder of then.
+    """
+
+    def __init__(self, path: paths.Path) -> None:
         self._netcdf = tessel.load("netcdf")
-        self.path = os.fspath(path)
+        self.path = paths.given(path)
+        self.place = paths.absolute(self.path)
         self.ncid = self._netcdf("open", self.path, "NOWRITE")
 
     def __enter__(self) -> Dataset:
@@ -151,6 +168,12 @@ class Dataset:
     def close(self) -> None:
         """Closes the file."""
         self._netcdf("close", self.ncid)
+
+    def refusal(self, identifier: str, message: str, variable: Variable) -> tessel.Error:
+        """The error for what cannot be done with a variable."""
+        error = tessel.Error(identifier, message, path=self.place)
+        error.add_note(str(variable))
+        return error
 
     def call(self, operation: str, *arguments: object) -> Any:
         """An operation of the module on this file."""
@@ -220,16 +243,40 @@ class Dataset:
         first with the most dimensions; without such, any."""
         everything = list(self.variables.values())
         data = [each for each in everything if each.is_numeric and not each.is_coordinate]
-        return max(data or everything, key=lambda each: len(each.dimensions), default=None)
+        candidates = data or everything
+        return max(candidates, key=lambda each: len(each.dimensions)) if candidates else None
 
-    def read(self, variable: Variable) -> np.ndarray:
+    def read(self, variable: Variable, chosen: Mapping[str, int] | None = None) -> NDArray[Any]:
         """All values as the file stores them, in the library's order of dimensions: a view of the
-        host's array, nothing is copied. The module's error where it cannot read the type."""
+        host's array, nothing is copied. Of the dimensions that `chosen` names, only that one
+        position is read. The module's error where it cannot read the type."""
         member = variable.type.member or "text"
-        values = self.call(f"get_var_{member}", variable.varid)
+        shape = variable.shape
+        if chosen:
+            start, shape = self._block(variable, chosen)
+            values = self.call(f"get_vara_{member}", variable.varid, host_order(start),
+                               host_order(shape))
+        else:
+            values = self.call(f"get_var_{member}", variable.varid)
         if isinstance(values, str):  # one row of characters is a str
             values = np.array(list(values), dtype="U1")
-        return values.reshape(variable.shape[::-1], order="F").T
+        read: NDArray[Any] = values.reshape(shape[::-1], order="F").T
+        return read
+
+    def _block(self, variable: Variable,
+               chosen: Mapping[str, int]) -> tuple[tuple[int, ...], tuple[int, ...]]:
+        """Where the chosen part begins, and its lengths."""
+        lengths = {each.name: each.length for each in variable.dimensions}
+        for name, index in chosen.items():
+            if name not in lengths:
+                raise self.refusal("TESSEL:python:badIndex", wording.printable(
+                    f"{variable.name} has no dimension {name}."), variable)
+            if not 0 <= index < lengths[name]:
+                raise self.refusal("TESSEL:python:badIndex", wording.printable(
+                    f"{name} has {lengths[name]} positions, and none is {index}; the first is 0."),
+                    variable)
+        return (tuple(chosen.get(each.name, 0) for each in variable.dimensions),
+                tuple(1 if each.name in chosen else each.length for each in variable.dimensions))
 
     def texts(self, variable: Variable) -> Iterator[str]:
         """The values of a text variable: one text for each run along the last dimension."""
@@ -244,9 +291,11 @@ class Dataset:
             except UnicodeDecodeError:
                 yield line.decode("latin-1")
 
-    def values(self, variable: Variable) -> np.ma.MaskedArray:
-        """All values in the variable's own units: unpacked, and masked where they are missing."""
-        stored = self.read(variable)
+    def values(self, variable: Variable,
+               chosen: Mapping[str, int] | None = None) -> np.ma.MaskedArray[Any, Any]:
+        """What `read` gives in the variable's own units: unpacked, and masked where it is
+        missing."""
+        stored = self.read(variable, chosen)
         missing = self._missing(variable, stored)
         if stored.dtype == np.int8 and variable.text("_Unsigned").lower() == "true":
             stored = stored.view(np.uint8)
@@ -254,11 +303,12 @@ class Dataset:
         if (scale, offset) != (1, 0):
             with np.errstate(all="ignore"):
                 stored = stored * scale + offset
-        return np.ma.MaskedArray(stored, missing)
+        return np.ma.MaskedArray(stored, missing)  # type: ignore[no-untyped-call]
 
-    def _missing(self, variable: Variable, stored: np.ndarray) -> np.ndarray:
+    def _missing(self, variable: Variable, stored: NDArray[Any]) -> NDArray[np.bool_]:
         floating = stored.dtype.kind == "f"
-        missing = np.isnan(stored) if floating else np.zeros(stored.shape, bool)
+        missing: NDArray[np.bool_] = (np.isnan(stored) if floating
+                                      else np.zeros(stored.shape, bool))
         markers = [variable.numbers("missing_value"), variable.numbers("_FillValue")]
         if "_FillValue" not in variable.attributes and variable.type.fill:
             markers.append(self._netcdf("parameter", variable.type.fill).ravel())

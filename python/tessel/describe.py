@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import textwrap
 from collections.abc import Iterable, Iterator, Mapping
+from typing import Any
 
 import numpy as np
 
@@ -95,10 +96,10 @@ def _shape(variable: Variable) -> str:
     return wording.printable(f"{total} ({sizes})" if sizes else total)
 
 
-def statistics(variable: Variable, values: np.ma.MaskedArray) -> str:
+def statistics(variable: Variable, values: np.ma.MaskedArray[Any, Any]) -> str:
     """How many values there are, their range, mean and share of missing ones."""
-    present = values.compressed()
-    rows = [("values", _shape(variable))]
+    present = values.compressed()  # type: ignore[no-untyped-call]
+    rows: list[tuple[str, ...]] = [("values", _shape(variable))]
     if values.size == 1 and present.size:
         rows.append(("value", wording.with_units(wording.number(present[0]), variable.units)))
     elif present.size:

@@ -56,8 +56,9 @@ BUILT_INS: dict[type[Exception], str] = {
         maximumNumberOfAttributesExceeded maximumNumberOfVariablesExceeded
         actionProhibitedOnGlobalVarid mathArgumentOutOfDomainOfFunc
         badBlockSize badDimensions badFormat badModuleName badOutputCount badShape
-        characterTooLarge differentFields dimensionsTooLarge missingInput nestedTooDeeply notExact
-        nothingToDraw notText shapeTooLarge tooManyDimensions
+        badGuard badPath characterTooLarge differentFields dimensionsTooLarge missingInput
+        nestedTooDeeply notExact nothingToDraw notText readOnlyArray recordsWithoutVariables
+        shapeTooLarge tooManyDimensions
         """,
     OverflowError: """
         mathResultNotRepresentable packUpSizetScalar integerTooLarge notRepresentable
@@ -71,8 +72,11 @@ BUILT_INS: dict[type[Exception], str] = {
         badOwner foreignException nestedCall noCall
         """,
     NotImplementedError: "unhandledOperation unrecognizedOperation unhandledFuncstr",
+    # An unknown status is one that the module's table of statuses leaves out: those of the HDF5
+    # layer, which all come from what is in a file or from reading and writing it.
     OSError: """
         notANetcdfFile notAClassicFile notARegularFile corruptedFile fileTooShort sameFile
+        unknownErrorStatus
         """,
     ModuleNotFoundError: "moduleNotFound",
     ImportError: "notAModule noEntryPoint",
@@ -117,7 +121,7 @@ SYSTEM_ERRORS: dict[str, int] = {
 
 # What no built-in says.
 WITHOUT_BUILT_IN = """
-    unknownErrorStatus v2ApiError inFortranStringTooShort recordOperationWithoutRecordVars
+    v2ApiError inFortranStringTooShort recordOperationWithoutRecordVars
     tsArrayToStringFailureForUnpackingName tsArrayToStringFailureForMode violation
     """.split()
 
@@ -136,9 +140,14 @@ class Error(Exception):
     """Made for people."""
 
     operation: str | None
-    """The operation that was called, by its short name; None where none was."""
+    """The operation that was called, by its short name, or the function of this package that
+    refused ("read", "copy", "check"); None where none was."""
 
-    def __new__(cls, identifier: str, message: str, operation: str | None = None) -> Error:
+    path: str | None
+    """The file that it is about, from the root on; None where none is known."""
+
+    def __new__(cls, identifier: str, message: str, operation: str | None = None, *,
+                path: str | None = None) -> Error:
         kind = CLASSES.get(word_of(identifier), cls) if cls is Error else cls
         made = _base(kind).__new__(kind, identifier, message)
         made.identifier = identifier
@@ -150,8 +159,10 @@ class Error(Exception):
             made.strerror = message if number is None else os.strerror(number)
         return made
 
-    def __init__(self, identifier: str, message: str, operation: str | None = None) -> None:
+    def __init__(self, identifier: str, message: str, operation: str | None = None, *,
+                 path: str | None = None) -> None:
         super().__init__(identifier, message)
+        self.path = path  # not earlier, because import errors have one of their own, and clear it
 
     @property
     def word(self) -> str:
@@ -162,7 +173,7 @@ class Error(Exception):
         return self.message
 
     def __reduce__(self) -> tuple[Any, ...]:
-        state = dict(self.__dict__)
+        state = {**self.__dict__, "path": self.path}  # which import errors keep elsewhere
         if isinstance(self, builtins.OSError) and self.filename is not None:
             state["filename"] = self.filename
         return type(self), (self.identifier, self.message), state
@@ -211,8 +222,13 @@ CLASSES: dict[str, type[Error]] = _classes()
 
 def raised(module: object, arguments: tuple[object, ...], identifier: str, message: str) -> Error:
     """The exception for a call that failed: the error, with a note on what was called."""
+    return explained(Error(identifier, message), module, arguments)
+
+
+def explained(error: Error, module: object, arguments: tuple[object, ...]) -> Error:
+    """An error of a call, with the note on what was called if it has none yet."""
     from tessel import notes  # here, because only errors need it
 
-    error = Error(identifier, message)
-    notes.explain(error, module, arguments)
+    if error.operation is None:
+        notes.explain(error, module, arguments)
     return error

@@ -113,7 +113,7 @@ def _write(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, 
             found = tuple((identifier.replace(":putAtt:", ":putAttText:"), cause)
                           for identifier, cause in errors)
         empty = () if may_be_empty else (("TESSEL:netcdf:emptyVariableData", "data is empty"),)
-        data = Argument("data", data_kind(of.dtype, short), size)
+        data = Argument("data", data_kind(of.dtype), size)
         return Operation(
             short=short, long=f"nc_{short}", purpose=of.filled(purpose), notes=notes,
             arguments=(NCID, VARID, *given, data), results=(),

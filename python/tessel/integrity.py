@@ -19,6 +19,7 @@ from collections.abc import Iterator
 from dataclasses import dataclass
 
 import tessel
+from tessel import notes, paths
 from tessel.dataset import Dataset, external_type
 
 _WORD = 4
@@ -69,11 +70,12 @@ def _form(path: str) -> _Form | None:
 
 def format_of(dataset: Dataset) -> str | None:
     """The name of the classic format of an open file; None for other formats."""
-    form = _form(dataset.path)
+    form = _form(dataset.place)
     return form.name if form else None
 
 
-def check(path: str | os.PathLike[str]) -> int | None:
+@notes.told
+def check(path: paths.Path) -> int | None:
     """Raises a tessel.Error, "TESSEL:python:fileTooShort", when a file is shorter than what is in
     it needs. Returns the least size in bytes that it must have, or None when its format is none of
     those that the library reads beyond their end: then there is nothing to check.
@@ -84,17 +86,17 @@ def check(path: str | os.PathLike[str]) -> int | None:
 
 def verify(dataset: Dataset) -> int | None:
     """The same for an open file."""
-    form = _form(dataset.path)
+    form = _form(dataset.place)
     if form is None:
         return None
     header = _Header(dataset, form)
-    with open(dataset.path, "rb") as file:
+    with open(dataset.place, "rb") as file:
         least = header.least_size(file.read(header.length))
         there = os.fstat(file.fileno()).st_size
     if there < least:
         raise tessel.Error("TESSEL:python:fileTooShort",
                            f"The file is cut off: it has {there} bytes, and what is in it needs "
-                           f"{least}: {dataset.path}")
+                           f"{least}.", path=dataset.place)
     return least
 
 

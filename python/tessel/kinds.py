@@ -47,7 +47,7 @@ POSITIONS = Kind(
      ("TESSEL:netcdf:indexArgumentHasNaN", "has an element that is no number")))
 
 
-def data_kind(dtype: str, operation: str) -> Kind:
+def data_kind(dtype: str) -> Kind:
     """Data to write: an array of the dtype, or Python's numbers that are exact in it; text without
     a dtype."""
     if not dtype:
@@ -55,7 +55,8 @@ def data_kind(dtype: str, operation: str) -> Kind:
                     "{name}", ())
     return Kind(f"Numbers | NDArray[numpy.{dtype}]", f"array of {dtype}, or numbers exact in it",
                 f"{{name}} if type({{name}}) is ndarray else "
-                f"numbers({{name}}, dtypes['{dtype}'], '{operation}')", ())
+                f"numbers({{name}}, dtypes['{dtype}'])",
+                (("TESSEL:python:notExact", f"has a number of Python's that no {dtype} is"),))
 
 
 NUMBER = ResultKind("int", "int", "int({value}.item())")

@@ -36,10 +36,11 @@ import numpy
 from numpy import ndarray
 from numpy.typing import NDArray
 
+from tessel import errors, paths
 from tessel._runtime import Module
 from tessel.arguments import identifiers, integer, numbers, vector
 from tessel.operation import Operation
-from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS, find
+from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS
 
 Indices = Union[SupportsIndex, Sequence[SupportsIndex], NDArray[Any]]
 """Positions, counts, strides, dimensions."""
@@ -52,6 +53,7 @@ class Opened(NamedTuple):
     """What is remembered of an open dataset, for the notes of errors."""
 
     path: str
+    """From the root on, so that it leads there from any folder."""
 
 
 # By id, for the whole process, as the ids are. An id that others have closed and opened again may
@@ -60,7 +62,7 @@ _opened: dict[int, Opened] = {}
 
 
 def path_of(ncid: int) -> str | None:
-    """The path with which an open dataset was opened here."""
+    """The file that an open dataset was opened from, or made as, here."""
     found = _opened.get(ncid)
     return found.path if found else None
 
@@ -84,7 +86,9 @@ def _forget(ncid: Any, known: Opened | None, result: None) -> None:
 
 
 def _text(path: Any) -> str:
-    return os.fsdecode(path) if isinstance(path, (str, bytes, os.PathLike)) else repr(path)
+    if isinstance(path, (str, bytes, os.PathLike)):
+        return paths.absolute(os.fsdecode(path))
+    return repr(path)
 
 
 def _constant(value: ndarray[Any, Any]) -> int | float:
@@ -126,7 +130,7 @@ _call = Module.__call__
 _SCOPE: dict[str, Any] = {
     "Any": Any, "Indices": Indices, "NDArray": NDArray, "Numbers": Numbers,
     "PLAIN": (list, tuple, ndarray), "SupportsIndex": SupportsIndex, "__name__": __name__,
-    "call": _call, "constant": _constant,
+    "call": _call, "constant": _constant, "Error": errors.Error, "explained": errors.explained,
     "dtypes": {name: numpy.dtype(name) for name in
                ("float64", "float32", "int32", "int16", "int8", "uint8")},
     "forget": _forget, "identifiers": identifiers, "integer": integer, "known": _known,
@@ -154,6 +158,11 @@ def _source(operation: Operation) -> str:
     elif operation.ends:
         value = f"forget(ncid, known(ncid), {value})"
     lines.append(f"    return {value}")
+    if any(each.kind.refuses for each in operation.arguments):
+        names = "".join(f", {each.name}" for each in operation.arguments)
+        lines = ["    try:", *(f"    {line}" for line in lines),
+                 "    except Error as error:",
+                 f"        raise explained(error, self, ('{operation.short}'{names}))"]
     return "\n".join([f"def {operation.short}({operation.parameters}) -> {operation.returns}:",
                       *lines, ""])
 

@@ -11,6 +11,7 @@ from typing import Any
 import numpy as np
 
 import tessel
+from tessel import notes
 from tessel.dataset import Dataset
 
 FORMATS = {"classic": "NOCLOBBER", "64bit-offset": "64BIT_OFFSET"}
@@ -27,9 +28,9 @@ class NewDataset:
     """
 
     def __init__(self, path: str, form: str) -> None:
-        if form not in FORMATS:
-            raise tessel.Error("TESSEL:python:badFormat",
-                               f"The format is one of {', '.join(FORMATS)}, not {form!r}.")
+        if not isinstance(form, str) or form not in FORMATS:
+            raise tessel.Error("TESSEL:python:badFormat", f"The format is one of "
+                               f"{', '.join(FORMATS)}, not {notes.shortened(form)}.")
         self._netcdf = tessel.load("netcdf")
         self._defining = True
         self.path = path

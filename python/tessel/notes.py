@@ -3,25 +3,31 @@
 
 The message is the module's and stays so. The note is attached to the exception (`__notes__`), and
 Python shows it below the message. All of it is found out when the error is there: nothing of this
-runs when a call succeeds, and nothing here can fail a call in another way.
+runs when a call succeeds, and nothing here can fail a call in another way. What comes from a file
+is made harmless, because Python shows notes as they are.
 """
 
 from __future__ import annotations
 
+import functools
+import inspect
 import os
+import reprlib
 import threading
 from collections.abc import Callable, Iterator
 from contextlib import suppress
-from typing import Any
+from typing import Any, TypeVar
 
 import numpy
 
-from tessel import beginning, operations
+from tessel import beginning, operations, paths, wording
 from tessel.errors import Error
 from tessel.operation import Operation
 
 _LONGEST = 60
 _MOST = 12
+
+_Function = TypeVar("_Function", bound=Callable[..., Any])
 
 _busy = threading.local()
 """Set while this thread makes a note, which asks the module and may meet errors itself."""
@@ -34,11 +40,52 @@ def explain(error: Error, module: Any, arguments: tuple[Any, ...]) -> None:
     _busy.now = True
     try:
         with suppress(Exception):
-            lines = list(_lines(error, module, arguments))
-            if lines:
-                error.add_note("\n".join(lines))
+            _add(error, _lines(error, module, arguments))
     finally:
         _busy.now = False
+
+
+def _add(error: Error, lines: Iterator[str]) -> None:
+    """Adds a note of these lines."""
+    text = "\n".join(map(wording.printable, lines))
+    if text:
+        error.add_note(text)
+
+
+def told(function: _Function) -> _Function:
+    """Has a function of this package say in every error how it was called, and about which
+    files."""
+    signature = inspect.signature(function)
+
+    @functools.wraps(function)
+    def telling(*given: Any, **named: Any) -> Any:
+        folder = None
+        with suppress(OSError):
+            folder = os.getcwd()  # now, because what `progress` does may change it
+        try:
+            return function(*given, **named)
+        except Error as error:
+            with suppress(Exception):
+                if error.operation is None:
+                    error.operation = function.__name__
+                values = signature.bind(*given, **named).arguments
+                _add(error, _lines_of_function(error, function.__name__, values, folder))
+            raise
+
+    return telling  # type: ignore[return-value]
+
+
+def _lines_of_function(error: Error, name: str, values: dict[str, Any],
+                       folder: str | None) -> Iterator[str]:
+    written = (f"{each}={shortened(value)}" for each, value in values.items())
+    yield f"in tessel.{name}({', '.join(written)})"
+    before = "\n".join(getattr(error, "__notes__", ())).splitlines()
+    for each, title in (("path", "file"), ("source", "source"), ("target", "target")):
+        value = values.get(each)
+        if isinstance(value, (str, bytes, os.PathLike)):
+            line = f"{title}: {paths.absolute(os.fsdecode(value), folder)}"
+            if line not in before:
+                yield line
 
 
 def _lines(error: Error, module: Any, arguments: tuple[Any, ...]) -> Iterator[str]:
@@ -53,7 +100,7 @@ def _lines(error: Error, module: Any, arguments: tuple[Any, ...]) -> Iterator[st
     if row is not None:
         values = dict(zip((each.name for each in row.arguments), given))
         if "path" in values:
-            yield from _file(error, row, values["path"])
+            yield from _file(error, values["path"])
         else:
             yield from _Subject(module, error, values).lines()
 
@@ -62,7 +109,24 @@ def _call(name: str, row: Operation | None, given: list[Any]) -> str:
     """The call as one might write it."""
     names = [f"{each.name}=" for each in row.arguments] if row else []
     names += [""] * (len(given) - len(names))
-    return f"{name}({', '.join(map(str.__add__, names, map(shortened, given)))})"
+    values = (shortened(paths.shown(each)) for each in given)
+    return f"{name}({', '.join(map(str.__add__, names, values))})"
+
+
+class _Short(reprlib.Repr):
+    """Writes values, but never all of a large one."""
+
+    def repr_int(self, value: int, level: int) -> str:
+        """An int; Python itself refuses to write one of thousands of digits."""
+        bits = value.bit_length()
+        return super().repr_int(value, level) if bits < 200 else f"<int of {bits} bits>"
+
+
+_short = _Short()
+_short.maxlevel = 2
+_short.maxlist = _short.maxtuple = _short.maxdict = _MOST
+_short.maxstring = _LONGEST - 10
+_short.maxother = _LONGEST
 
 
 def shortened(value: Any) -> str:
@@ -71,39 +135,51 @@ def shortened(value: Any) -> str:
         if value.dtype.kind in "biuf" and value.size == 1:
             return str(value.item())
         what = f"{value.dtype.name} array of shape {value.shape}"
-        return f"<{what}: {value.ravel().tolist()}>" if 0 < value.size <= 4 else f"<{what}>"
+        few = 0 < value.size <= 4
+        return f"<{what}: {_short.repr(value.ravel().tolist())}>" if few else f"<{what}>"
     if isinstance(value, (str, bytes)):
         return repr(value if len(value) <= _LONGEST else value[:_LONGEST]) + (
             f"... ({len(value)} characters)" if len(value) > _LONGEST else "")
     if isinstance(value, (list, tuple)) and len(value) > _MOST:
         return f"<{type(value).__name__} of {len(value)}>"
-    text = repr(value)
+    text = _short.repr(value)
     return text if len(text) <= _LONGEST else text[:_LONGEST] + "..."
 
 
-def _file(error: Error, row: Operation, path: Any) -> Iterator[str]:
+def _file(error: Error, path: Any) -> Iterator[str]:
     """About an operation that opens or creates."""
     if not isinstance(path, (str, bytes, os.PathLike)):
         return
     given = os.fspath(path)
     if isinstance(error, OSError):
         error.filename = given
-    if "\0" in os.fsdecode(given) or "://" in os.fsdecode(given):
+    absolute = paths.shown(paths.absolute(os.fsdecode(given)))
+    if os.path.isabs(absolute) and "\0" not in absolute:
+        error.path = absolute
+        yield f"file: {absolute}"
+        yield from instead(error)
+
+
+def instead(error: Error) -> Iterator[str]:
+    """What there is in place of the dataset that an operation was to open or create."""
+    path = error.path
+    if path is None or error.operation not in _OPENING:
         return
-    absolute = os.path.abspath(os.fsdecode(given))
-    yield f"file: {absolute}"
     if error.word == "noSuchFileOrDirectory":
-        folder = os.path.dirname(absolute)
+        missing, folder = path, os.path.dirname(path)
         while not os.path.lexists(folder):
-            absolute, folder = folder, os.path.dirname(folder)
-        if absolute != os.path.abspath(os.fsdecode(given)):
-            yield f"there is no folder {absolute}"
-        elif os.path.islink(absolute):
-            yield f"it is a link to {os.readlink(absolute)}, which is not there"
-    elif os.path.isdir(absolute):
+            missing, folder = folder, os.path.dirname(folder)
+        if missing != path:
+            yield f"there is no folder {missing}"
+        elif os.path.islink(path):
+            yield f"it is a link to {os.readlink(path)}, which is not there"
+    elif os.path.isdir(path):
         yield "it is a folder"
-    elif row.short in ("open", "_open") and os.path.isfile(absolute):
-        yield f"it {beginning.described(absolute)}"
+    elif error.operation in ("open", "_open") and os.path.isfile(path):
+        yield f"it {beginning.described(path)}"
+
+
+_OPENING = {each.short for each in operations.OPERATIONS if each.opens}
 
 
 class _Subject:
@@ -144,9 +220,11 @@ class _Subject:
     def _dataset(self, name: str, ncid: int) -> str:
         from tessel.netcdf import path_of
 
-        path = path_of(ncid)
+        path = paths.shown(path_of(ncid))
         if path is None:
             return f"{name} {ncid}: no dataset that was opened here is known by this id"
+        if name != "ncid_in":  # of two datasets, the one that is written
+            self._error.path = path
         return f"{name} {ncid}: opened as {path!r}"
 
     def _variable(self, name: str, ncid: int, varid: int) -> str:

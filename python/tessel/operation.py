@@ -28,7 +28,13 @@ class Kind:
     """The expression that a method hands on; {name} is the argument's name."""
 
     errors: Errors
-    """What the module raises for a bad one; {label} is the module's name for the argument."""
+    """What the module raises for a bad one; {label} is the module's name for the argument. What
+    begins with "TESSEL:python:" is raised by the conversion."""
+
+    @property
+    def refuses(self) -> bool:
+        """Whether the conversion itself can raise."""
+        return any(identifier.startswith("TESSEL:python:") for identifier, _ in self.errors)
 
 
 @dataclass(frozen=True)

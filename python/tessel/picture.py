@@ -16,7 +16,7 @@ import matplotlib
 import numpy as np
 
 import tessel
-from tessel import describe, wording
+from tessel import describe, paths, wording
 from tessel.aside import written_aside
 from tessel.axis import Axis, Calendar, latitude, longitude, year_zero_allowed
 from tessel.dataset import Dataset, Variable
@@ -56,14 +56,14 @@ def draw(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray, path: 
          chosen: Mapping[str, int] | None = None) -> str:
     """Draws a variable into a file, in the format that its name ends in, and says what the picture
     is; NothingToDraw when there is nothing that a picture would show. `chosen` has positions along
-    dimensions, by their names."""
+    dimensions, by their names; `values` are what `dataset.values` gives with it."""
     part = _slice(dataset, variable, values, chosen or {})
     figure = Figure(layout="constrained")
     ending = os.path.splitext(path)[1].lstrip(".").lower()
     if ending not in figure.canvas.get_supported_filetypes():
         raise tessel.Error("TESSEL:python:badFormat",
                            "The name of a picture ends in .png, .pdf, .svg or another format that "
-                           f"Matplotlib has: {path}")
+                           "Matplotlib has.", path=paths.absolute(path))
     axes = figure.add_subplot()
     axes.tick_params(labelsize=10)
     if len(part.axes) == 1:
@@ -93,15 +93,10 @@ def _plain(text: str) -> str:
 
 def _slice(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
            chosen: Mapping[str, int]) -> Slice:
-    _judge(variable, chosen)
     if not values.size:
         raise NothingToDraw("it has no values")
-    names = [dimension.name for dimension in variable.dimensions]
-    first = [chosen.get(name, 0) for name in names]
-    limits = tuple(slice(begin, begin + 1) if name in chosen else slice(None)
-                   for name, begin in zip(names, first))
-    part = values[(*limits, ...)]  # the dots keep an array where there is no dimension to limit
-    usable = np.ma.MaskedArray(part.data, np.ma.getmaskarray(part) | ~np.isfinite(part.data))
+    first = [chosen.get(dimension.name, 0) for dimension in variable.dimensions]
+    usable = np.ma.MaskedArray(values.data, np.ma.getmaskarray(values) | ~np.isfinite(values.data))
     if usable.mask.all():
         raise NothingToDraw("all its values are missing")
     if usable.size == 1:
@@ -118,19 +113,6 @@ def _slice(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
     places = [axes[i].written(first[i] + index) for i, index in zip(others, at)
               if axes[i].variable is not None or axes[i].dimension.length > 1]
     return Slice(parts[at], [_drawable(axes[i]) for i in drawn], places)
-
-
-def _judge(variable: Variable, chosen: Mapping[str, int]) -> None:
-    """Refuses positions that are not in the variable."""
-    lengths = {dimension.name: dimension.length for dimension in variable.dimensions}
-    for name, index in chosen.items():
-        if name not in lengths:
-            raise tessel.Error("TESSEL:python:badIndex",
-                               f"{variable.name} has no dimension {name}.")
-        if not 0 <= index < lengths[name]:
-            raise tessel.Error("TESSEL:python:badIndex",
-                               f"{name} has {lengths[name]} positions, and none is {index}; "
-                               "the first is 0.")
 
 
 def _drawable(axis: Axis) -> Axis:

@@ -4,11 +4,11 @@ its mean over time."""
 
 from __future__ import annotations
 
-import argparse
 import os
 import re
 import subprocess
 import sys
+from typing import Any
 
 import numpy as np
 
@@ -23,7 +23,8 @@ def output_path(folder: str, path: str, variable: str, ending: str) -> str:
     return os.path.join(folder, f"{name[:80]}{ending}")
 
 
-def describe_file(dataset: Dataset, variable: Variable | None) -> np.ma.MaskedArray | None:
+def describe_file(dataset: Dataset,
+                  variable: Variable | None) -> np.ma.MaskedArray[Any, Any] | None:
     """Prints what is in a file, and what the values of a variable are like; returns them when they
     are numbers."""
     print(describe.listing(dataset))
@@ -38,7 +39,7 @@ def describe_file(dataset: Dataset, variable: Variable | None) -> np.ma.MaskedAr
     return values
 
 
-def _show_picture(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
+def _show_picture(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray[Any, Any],
                   path: str) -> None:
     from tessel import picture  # here, because it takes a second that errors need not wait for
 
@@ -50,7 +51,7 @@ def _show_picture(dataset: Dataset, variable: Variable, values: np.ma.MaskedArra
         print(f"\nThe {kind} is in {wording.printable(path)}")
 
 
-def _show_time_mean(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
+def _show_time_mean(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray[Any, Any],
                     path: str) -> None:
     try:
         over = time_mean.write(dataset, variable, values, path)
@@ -88,7 +89,7 @@ def show(path: str, name: str | None, folder: str) -> None:
 
 def main(arguments: list[str] | None = None) -> int:
     """The command; returns its exit status."""
-    parser = argparse.ArgumentParser(prog="tessel.show", description=__doc__)
+    parser = terminal.Parser(prog="tessel.show", description=__doc__)
     parser.add_argument("file", metavar="FILE", help="the netCDF file")
     parser.add_argument("variable", metavar="VARIABLE", nargs="?",
                         help="the variable to show; else the first with the most dimensions")

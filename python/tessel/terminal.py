@@ -3,13 +3,15 @@
 
 from __future__ import annotations
 
+import argparse
+import io
 import os
 import signal
 import sys
 import time
 from collections.abc import Callable
 from types import TracebackType
-from typing import TextIO
+from typing import NoReturn, TextIO
 
 import tessel
 from tessel import wording
@@ -18,8 +20,26 @@ _BAR = 40
 _EVERY = 0.1  # seconds
 
 
-def _message(error: Exception) -> str:
+class Parser(argparse.ArgumentParser):
+    """A parser of which every error is one line too, and shows nothing that steers a terminal."""
+
+    def error(self, message: str) -> NoReturn:
+        """Ends the process."""
+        line = wording.printable(f"{message}; try {self.prog} --help")
+        self.exit(1, f"{self.prog.split()[0]}: {line}\n")
+
+
+def with_file(message: str, path: str) -> str:
+    """A message with the file that it is about."""
+    return f"{message.rstrip('.')}: {path}"
+
+
+def message_of(error: Exception) -> str:
+    """What an error says: the module's own message alone, and all others with the file if one is
+    known."""
     if isinstance(error, tessel.Error):
+        if error.path is not None and error.identifier.startswith("TESSEL:python:"):
+            return with_file(error.message, error.path)
         return error.message
     if isinstance(error, MemoryError):
         return "There is not enough memory."
@@ -28,11 +48,12 @@ def _message(error: Exception) -> str:
     return str(error)
 
 
-def run(command: Callable[[], None]) -> int:
-    """Runs a command and returns its exit status: 0, or 1 when it failed, which one line on the
+def run(command: Callable[[], object], line: Callable[[Exception], str] = message_of) -> int:
+    """Runs a command and returns its exit status: 0, or 1 when it failed, which one `line` on the
     standard error says. Ctrl-C ends the process as it ends others."""
     for stream in (sys.stdout, sys.stderr):  # never fail over a character that a terminal lacks
-        stream.reconfigure(errors="backslashreplace")
+        if isinstance(stream, io.TextIOWrapper):
+            stream.reconfigure(errors="backslashreplace")
     try:
         command()
         sys.stdout.flush()
@@ -45,7 +66,7 @@ def run(command: Callable[[], None]) -> int:
         os.kill(os.getpid(), signal.SIGINT)
         return 128 + signal.SIGINT
     except (tessel.Error, OSError, MemoryError) as error:
-        message = _message(error)
+        message = line(error)
     try:
         sys.stdout.flush()
     except OSError:  # it is what failed

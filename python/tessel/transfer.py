@@ -5,17 +5,18 @@ from __future__ import annotations
 
 import math
 import operator
-import os
-from collections.abc import Callable, Iterator, Sequence
+from collections.abc import Callable, Iterable, Iterator, Sequence
 from typing import Any
 
 import numpy as np
+from numpy.typing import NDArray
 
 import tessel
-from tessel import integrity
+from tessel import integrity, notes, wording
 from tessel.aside import written_aside
-from tessel.dataset import TEXT, Dataset, Variable
+from tessel.dataset import TEXT, Dataset, Variable, host_order
 from tessel.new_dataset import NewDataset
+from tessel.paths import Path
 
 Progress = Callable[[int, int], object]
 """Is told the bytes of values that are done, and those that there are."""
@@ -33,8 +34,9 @@ _FIRST_INEXACT = 2.0**53
 _WIDE_INTEGERS = {"int64", "uint64"}
 
 
-def read(path: str | os.PathLike[str], variable: str, start: Sequence[int] | None = None,
-         count: Sequence[int] | None = None, *, out: np.ndarray | None = None,
+@notes.told
+def read(path: Path, variable: str, start: Sequence[int] | None = None,
+         count: Sequence[int] | None = None, *, out: NDArray[Any] | None = None,
          progress: Progress | None = None, block_bytes: int = BLOCK_BYTES,
          check: bool = True) -> Any:
     """All values of a variable, or `count` of them from `start` on, as the file stores them.
@@ -50,14 +52,15 @@ def read(path: str | os.PathLike[str], variable: str, start: Sequence[int] | Non
     called with the bytes done and all bytes, before the first block and after each. Ctrl-C is
     heard between blocks. A file that was cut off is refused unless `check` is False.
     """
+    size, tell = _block_size(block_bytes), _progress(progress)
     with Dataset(path) as dataset:
         if check:
             integrity.verify(dataset)
-        return _read(dataset, dataset.find(variable), start, count, out,
-                     progress or _ignore, _block_size(block_bytes))
+        return _read(dataset, dataset.find(variable), start, count, out, tell, size)
 
 
-def copy(source: str | os.PathLike[str], target: str | os.PathLike[str],
+@notes.told
+def copy(source: Path, target: Path,
          format: str | None = None, *, overwrite: bool = False,  # pylint: disable=redefined-builtin
          progress: Progress | None = None, block_bytes: int = BLOCK_BYTES,
          check: bool = True) -> None:
@@ -67,33 +70,72 @@ def copy(source: str | os.PathLike[str], target: str | os.PathLike[str],
 
     The target appears when it is complete, or not at all, whatever happens: it is written aside, in
     the same folder, and renamed. A target that exists is kept, unless `overwrite` is given; one
-    that is the source is refused. What the format cannot hold is the module's error.
+    that is the source is refused. What the format cannot hold is the module's error. A file that
+    counts records and has no variable with records, which the library does not write but reads, is
+    refused: there is nothing by which the copy could count them.
 
     `progress`, `block_bytes` and `check` are as in `read`.
     """
-    size = _block_size(block_bytes)
+    size, tell = _block_size(block_bytes), _progress(progress)
     with Dataset(source) as dataset:
         own = integrity.format_of(dataset)
         if own is None:
             raise tessel.Error("TESSEL:python:notAClassicFile",
                                "Only files of the classic formats, 64-bit offset and 64-bit data "
-                               f"are copied: {dataset.path}")
+                               "are copied; this one has another format, such as that of HDF5.",
+                               path=dataset.place)
         if check:
             integrity.verify(dataset)
-        with written_aside(target, overwrite=overwrite, source=source) as temporary, \
-                NewDataset(temporary, format or own) as made:
+        _judge_records(dataset)
+        with written_aside(target, overwrite=overwrite, source=dataset.place) as temporary, \
+                NewDataset(temporary, own if format is None else format) as made:
             _define(dataset, made)
-            _copy_values(dataset, made, progress or _ignore, size)
+            _copy_values(dataset, made, tell, size)
 
 
 def _ignore(_done: int, _total: int) -> None:
     """The progress that nobody wants to know."""
 
 
+def _progress(progress: Progress | None) -> Progress:
+    if progress is not None and not callable(progress):
+        raise _bad_type("progress", "a function of two numbers", progress)
+    return progress or _ignore
+
+
 def _block_size(block_bytes: int) -> int:
-    if block_bytes < 1:
+    size = _whole_number("block_bytes", block_bytes)
+    if size < 1:
         raise tessel.Error("TESSEL:python:badBlockSize", "A block has at least one byte.")
-    return block_bytes
+    return size
+
+
+def _whole_number(name: str, value: Any) -> int:
+    try:
+        return operator.index(value)
+    except TypeError:
+        raise _bad_type(name, "a whole number", value) from None
+
+
+def _whole_numbers(name: str, values: Any) -> list[int]:
+    if not isinstance(values, Iterable):
+        raise _bad_type(name, "a sequence of whole numbers", values)
+    return [_whole_number(f"each element of {name}", each) for each in values]
+
+
+def _bad_type(name: str, wanted: str, value: object) -> tessel.Error:
+    return tessel.Error("TESSEL:python:unsupportedType",
+                        f"{name} is {wanted}, not of the type {type(value).__name__}.")
+
+
+def _judge_records(dataset: Dataset) -> None:
+    """Refuses records that no variable has."""
+    for each in dataset.dimensions:
+        if each.unlimited and each.length and not any(
+                each in variable.dimensions for variable in dataset.variables.values()):
+            raise tessel.Error("TESSEL:python:recordsWithoutVariables", wording.printable(
+                f"The file counts {each.length} records along {each.name}, and no variable has "
+                "any; a copy would count none."), path=dataset.place)
 
 
 def blocks(shape: Sequence[int], most: int) -> Iterator[tuple[list[int], list[int]]]:
@@ -121,7 +163,12 @@ def _memory_of_value(variable: Variable) -> int:
     """The bytes that a value takes on its way."""
     if variable.type.number == TEXT:
         return _MEMORY_OF_CHARACTER
-    return np.dtype(_DTYPES[variable.type.member]).itemsize
+    return _dtype(variable).itemsize
+
+
+def _dtype(variable: Variable) -> np.dtype[Any]:
+    """What holds the values; what the module cannot read it refuses itself, whatever this is."""
+    return np.dtype(_DTYPES[variable.type.member or "text"])
 
 
 def _read_block(dataset: Dataset, variable: Variable, start: Sequence[int],
@@ -130,22 +177,18 @@ def _read_block(dataset: Dataset, variable: Variable, start: Sequence[int],
     member = variable.type.member or "text"  # the module then says what is wrong
     if not variable.dimensions:
         return dataset.call(f"get_var_{member}", variable.varid)
-    values = dataset.call(f"get_vara_{member}", variable.varid, _vector(start), _vector(count))
+    values = dataset.call(f"get_vara_{member}", variable.varid, host_order(start),
+                          host_order(count))
     if variable.type.name in _WIDE_INTEGERS and (abs(values) >= _FIRST_INEXACT).any():
-        raise tessel.Error("TESSEL:python:notExact",
-                           f"{variable.name} has integers that no double holds exactly.")
+        raise dataset.refusal("TESSEL:python:notExact", wording.printable(
+            f"{variable.name} has integers that no double holds exactly."), variable)
     return values
 
 
-def _vector(places: Sequence[int]) -> np.ndarray:
-    """Places in the library's order as an argument, which is in the host's."""
-    return np.array(places[::-1], float)
-
-
 def _read(dataset: Dataset, variable: Variable, start: Sequence[int] | None,
-          count: Sequence[int] | None, out: np.ndarray | None, progress: Progress,
+          count: Sequence[int] | None, out: NDArray[Any] | None, progress: Progress,
           block_bytes: int) -> Any:
-    first, counts = _selection(variable, start, count)
+    first, counts = _selection(dataset, variable, start, count)
     total = math.prod(counts) * variable.type.size
     progress(0, total)
     most = 1 if variable.type.member is None else block_bytes // _memory_of_value(variable)
@@ -155,7 +198,7 @@ def _read(dataset: Dataset, variable: Variable, start: Sequence[int] | None,
             progress(total, total)
         return values
 
-    values = _room(variable, counts, out)
+    values = _room(dataset, variable, counts, out)
     done = 0
     for at, size in blocks(counts, most):
         block = _read_block(dataset, variable, list(map(operator.add, first, at)), size)
@@ -167,46 +210,54 @@ def _read(dataset: Dataset, variable: Variable, start: Sequence[int] | None,
     return values
 
 
-def _is_row(values: np.ndarray) -> bool:
+def _is_row(values: NDArray[Any]) -> bool:
     return values.ndim == 2 and values.shape[0] == 1
 
 
-def _selection(variable: Variable, start: Sequence[int] | None,
+def _selection(dataset: Dataset, variable: Variable, start: Sequence[int] | None,
                count: Sequence[int] | None) -> tuple[list[int], list[int]]:
     """The selected block in the library's order."""
     lengths = variable.shape[::-1]
-    first = [0] * len(lengths) if start is None else [operator.index(each) for each in start]
-    for name, vector in (("Start", first), ("Count", first if count is None else count)):
-        if len(vector) != len(lengths):
-            raise tessel.Error(f"TESSEL:python:bad{name}Length",
-                               f"{name} has {len(vector)} elements, and {variable.name} "
-                               f"{len(lengths)} dimensions.")
+    name = wording.printable(variable.name)
+    first = [0] * len(lengths) if start is None else _whole_numbers("start", start)
     counts = ([length - begin for length, begin in zip(lengths, first)] if count is None
-              else [operator.index(each) for each in count])
+              else _whole_numbers("count", count))
+    for what, vector in (("Start", first), ("Count", first if count is None else counts)):
+        if len(vector) != len(lengths):
+            raise dataset.refusal(f"TESSEL:python:bad{what}Length",
+                                  f"{what} has {len(vector)} elements, and {name} "
+                                  f"{len(lengths)} dimensions.", variable)
     if any(begin < 0 or many < 0 or begin + many > length
            for begin, many, length in zip(first, counts, lengths)):
-        raise tessel.Error("TESSEL:python:indexExceedsDimensionBound",
-                           f"{variable.name} has the lengths {tuple(lengths)}, and not "
-                           f"{tuple(counts)} values from {tuple(first)} on.")
+        raise dataset.refusal("TESSEL:python:indexExceedsDimensionBound",
+                              f"{name} has the lengths {tuple(lengths)}, and not "
+                              f"{tuple(counts)} values from {tuple(first)} on.", variable)
     return first[::-1], counts[::-1]
 
 
-def _room(variable: Variable, counts: list[int], out: np.ndarray | None) -> np.ndarray:
+def _room(dataset: Dataset, variable: Variable, counts: list[int],
+          out: NDArray[Any] | None) -> NDArray[Any]:
     """The array that takes the values: `out`, if there is one and it fits."""
     shape = tuple(counts[::-1]) + (1,) * (2 - len(counts))
-    dtype = np.dtype(_DTYPES[variable.type.member or "text"])
+    dtype = _dtype(variable)
     if out is None:
         return np.empty(shape, dtype, order="F")
+    if not isinstance(out, np.ndarray):
+        raise _bad_type("out", "an array of NumPy's", out)
     if out.shape != shape:
-        raise tessel.Error("TESSEL:python:badShape",
-                           f"The array for the values has the shape {out.shape}, not {shape}.")
+        raise dataset.refusal("TESSEL:python:badShape",
+                              f"The array for the values has the shape {out.shape}, not {shape}.",
+                              variable)
     if out.dtype != dtype:
-        raise tessel.Error("TESSEL:python:unsupportedDtype",
-                           f"The array for the values is of {out.dtype}, not {dtype}.")
+        raise dataset.refusal("TESSEL:python:unsupportedDtype",
+                              f"The array for the values is of {out.dtype}, not {dtype}.", variable)
+    if not out.flags.writeable:
+        raise tessel.Error("TESSEL:python:readOnlyArray",
+                           "The array for the values cannot be written to.")
     return out
 
 
-def _place(values: np.ndarray, at: list[int], size: list[int], block: Any) -> None:
+def _place(values: NDArray[Any], at: list[int], size: list[int], block: Any) -> None:
     """Puts a block, whose place is in the library's order, into the host's array."""
     if isinstance(block, str):
         block = np.frombuffer(block.encode("utf-32-le", "surrogatepass"), "<U1")
@@ -237,8 +288,8 @@ def _copy_values(dataset: Dataset, made: NewDataset, progress: Progress, block_b
     for variable, start, count in _plan(variables, block_bytes):
         values = _read_block(dataset, variable, start, count)
         if variable.dimensions:
-            made.put(f"put_vara_{variable.type.member}", variable.varid, _vector(start),
-                     _vector(count), values)
+            made.put(f"put_vara_{variable.type.member}", variable.varid, host_order(start),
+                     host_order(count), values)
         else:
             made.put(f"put_var_{variable.type.member}", variable.varid, values)
         del values  # before the next block is read

@@ -4,6 +4,7 @@
 from __future__ import annotations
 
 import unicodedata
+from typing import Any
 
 import numpy as np
 
@@ -25,10 +26,9 @@ def shortened(text: str, length: int) -> str:
     return f"{text[:length]}… ({count(len(text))} characters)"
 
 
-def number(value: float | np.generic) -> str:
+def number(value: float | np.number[Any]) -> str:
     """A number as short as seven significant digits allow; integers in full."""
-    value = np.asarray(value)[()]
-    if value.dtype.kind in "iu":
+    if np.asarray(value).dtype.kind in "iu":
         return str(value)
     return f"{float(value):.7g}"
 

@@ -57,12 +57,12 @@ def run(capsys, *arguments: object) -> tuple[int, str, str]:
 
 
 def one_line(result: tuple[int, str, str]) -> str:
-    """The line that a command failed with."""
+    """The line that a command failed with, without its name."""
     status, output, errors = result
     assert (status, output) == (1, "")
-    assert errors.endswith("\n")
+    assert errors.startswith("tessel: ") and errors.endswith("\n")
     assert errors.count("\n") == 1
-    return errors[:-1]
+    return errors[len("tessel: "):-1]
 
 
 # info
@@ -125,10 +125,30 @@ def test_plot_draws_the_chosen_values_and_masks_missing_ones(monkeypatch, field,
     with Dataset(field) as dataset:
         variable = dataset.find("t")
         values = dataset.values(variable)
-        picture.draw(dataset, variable, values, str(tmp_path / "a.png"), {"z": 2, "time": 1})
+        chosen = {"z": 2, "time": 1}
+        picture.draw(dataset, variable, dataset.values(variable, chosen), str(tmp_path / "a.png"),
+                     chosen)
     np.testing.assert_array_equal(drawn["part"].values, values[1, 2])
     assert drawn["part"].values.mask.sum() == values[1, 2].mask.sum() > 0
     assert drawn["part"].at == ["1 February 2001", "z 50 m"]
+
+
+@pytest.mark.parametrize(("arguments", "most"), [
+    ([], 120), (["--index", "x=2"], 24), (["--index", "z=0", "--index", "time=1"], 20),
+    (["--index", "z=0", "--index", "time=1", "--index", "x=0"], 5)])
+def test_plot_reads_only_what_was_chosen(capsys, monkeypatch, field, tmp_path, arguments, most):
+    sizes = []
+
+    def call(dataset, operation, *given):
+        result = Dataset.untouched(dataset, operation, *given)
+        if operation.startswith("get_var"):
+            sizes.append(result.size)
+        return result
+
+    monkeypatch.setattr(Dataset, "untouched", Dataset.call, raising=False)
+    monkeypatch.setattr(Dataset, "call", call)
+    assert run(capsys, "plot", field, "t", *arguments, "-o", tmp_path / "a.png")[0] == 0
+    assert max(sizes) == most
 
 
 @pytest.mark.parametrize("ending", ["pdf", "svg", "PNG"])
@@ -148,7 +168,8 @@ def test_other_formats_of_pictures(capsys, field, tmp_path, ending):
     (["s", "--index", "time=0"], "No picture of s: it is a single value."),
 ])
 def test_nothing_to_plot(capsys, field, tmp_path, arguments, line):
-    assert one_line(run(capsys, "plot", field, *arguments, "-o", tmp_path / "a.png")) == line
+    assert one_line(run(capsys, "plot", field, *arguments, "-o", tmp_path / "a.png")) == (
+        f"{line.rstrip('.')}: {field}")
     assert os.listdir(tmp_path) == ["field.nc"]
 
 
@@ -233,7 +254,7 @@ def test_check(capsys, tmp_path):
         more = {"plot": ["r3"], "copy": [tmp_path / "copy.nc"]}.get(arguments[0], [])
         assert one_line(run(capsys, arguments[0], path, *more, *arguments[1:])) == (
             f"The file is cut off: it has {size - 10} bytes, and what is in it needs "
-            f"{re.search('needs ([0-9]+)', output)[1]}: {path}")
+            f"{re.search('needs ([0-9]+)', output)[1]}: {path}"), arguments
         if arguments[0] != "check":
             assert run(capsys, arguments[0], path, *more, *arguments[1:], "--no-check")[0] == 0
     other = generate(tmp_path / "g.nc", EVERYTHING, "netCDF-4")
@@ -276,10 +297,64 @@ def test_help(capsys, arguments):
     ["plot", "a", "b", "-o", "c", "--index", "x=-1"], ["ops", "a", "b"],
     ["info", "\033[31m", "a", "b"]])
 def test_wrong_usage(capsys, arguments):
-    status, output, errors = run(capsys, *arguments)
-    assert (status, output) == (2, "")
-    assert errors.startswith("usage: tessel")
-    assert "\033" not in errors
+    line = one_line(run(capsys, *arguments))
+    assert re.search(r"; try tessel( info| plot| copy| check| ops)? --help$", line)
+    assert "\033" not in line
+
+
+WRONG = {
+    "empty": (b"", "it is empty"),
+    "cut off": (b"CDF", "it was cut off after 3 bytes"),
+    "gzip": (b"\x1f\x8b\x08" + bytes(9), "it is compressed by gzip: decompress it first (gunzip) "
+                                         "(12 bytes)"),
+    "HTML": (b"<!doctype html>", "it is a web page, perhaps what a server said instead of the "
+                                 "file"),
+    "HDF5": (b"\x89HDF\r\n\x1a\n" + b"\xff" * 99,
+             "it begins like an HDF5 file (as netCDF-4 files do), and is damaged or no dataset "
+             "(107 bytes)"),
+    "text": ("a\033[31m\n".encode(), "it begins with the bytes 61 1b 5b 33 31 6d 0a, which is no "
+                                      "format known here"),
+}
+
+
+@pytest.mark.parametrize(("content", "what"), WRONG.values(), ids=WRONG.keys())
+def test_a_file_that_is_no_dataset(capsys, tmp_path, content, what):
+    path = tmp_path / "wrong.nc"
+    path.write_bytes(content)
+    for arguments in (["info", path], ["check", path], ["copy", path, tmp_path / "a.nc"],
+                      ["plot", path, "v", "-o", tmp_path / "a.png"]):
+        line = one_line(run(capsys, *arguments))
+        assert line.startswith("Unable to open netCDF file, library error message ")
+        assert line.endswith(f": {path}: {what}")
+    assert os.listdir(tmp_path) == ["wrong.nc"]
+
+
+def test_the_file_that_an_error_is_about(capsys, field, tmp_path):
+    """Of several, the right one."""
+    missing = tmp_path / "missing" / "a.nc"
+    assert one_line(run(capsys, "copy", field, missing)).endswith(
+        f'"No such file or directory": {missing}: there is no folder {tmp_path}/missing')
+    assert one_line(run(capsys, "copy", missing, field)).endswith(
+        f'"No such file or directory": {missing}: there is no folder {tmp_path}/missing')
+    assert one_line(run(capsys, "copy", field, field)) == (
+        f"The target is the same file as the source: {field}")
+    assert one_line(run(capsys, "info", field, "none")).endswith(f"Variable not found\": {field}")
+    wide = generate(tmp_path / "wide.nc", "dimensions: x = 2 ; variables: ubyte a(x) ;", "cdf5")
+    line = one_line(run(capsys, "copy", wide, tmp_path / "new.nc", "--format", "classic"))
+    assert line.endswith(f": {tmp_path}/new.nc") and ".part" not in line
+    assert one_line(run(capsys, "copy", wide, tmp_path / "new.nc")).endswith(f": {wide}")
+    new = generate(tmp_path / "new-format.nc", "dimensions: x = 2 ;", "netCDF-4")
+    assert one_line(run(capsys, "copy", new, tmp_path / "new.nc")) == (
+        "Only files of the classic formats, 64-bit offset and 64-bit data are copied; this one has "
+        f"another format, such as that of HDF5: {new}")
+
+
+def test_memory_that_is_not_there(capsys, field, monkeypatch):
+    def exhausted(self):
+        raise MemoryError
+
+    monkeypatch.setattr(Dataset, "main_variable", exhausted)
+    assert one_line(run(capsys, "info", field)) == "There is not enough memory."
 
 
 @pytest.mark.parametrize("name", ["missing.nc", "\033[31mred\a.nc"])
@@ -297,8 +372,9 @@ def test_what_is_in_a_file_cannot_steer_a_terminal(capsys, tmp_path):
             char tttt(dddd) ;
         data: vvvv = 1, 2 ; tttt = "xx" ;"""))
     data = path.read_bytes()
-    for text in (b"dddd", b"vvvv", b"aaaa", b"bbbb", b"uuuu", b"tttt"):
+    for text in (b"dddd", b"vvvv", b"aaaa", b"uuuu", b"tttt"):
         data = data.replace(text, b"\033[" + text[:1] + b"\a")
+    data = data.replace(b"bbbb", b"\xc2\x9bJ\r")  # the one character that begins a sequence alone
     evil = path.with_name("\033[2Jevil\r.nc")
     evil.write_bytes(data)
     target = tmp_path / "\033[31m.png"
@@ -309,7 +385,7 @@ def test_what_is_in_a_file_cannot_steer_a_terminal(capsys, tmp_path):
                       ["copy", evil, tmp_path / "copy.nc"], ["ops", "\033[x"]):
         _, output, errors = run(capsys, *arguments)
         assert output or errors
-        assert not re.search(r"[\x00-\x09\x0b-\x1f\x7f]", output + errors)
+        assert not re.search(r"[\x00-\x09\x0b-\x1f\x7f-\x9f]", output + errors)
 
 
 def test_a_reader_that_has_seen_enough(field):

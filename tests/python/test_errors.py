@@ -17,6 +17,7 @@ import numpy
 import pytest
 import tessel
 import tessel.sample
+from made_files import generate
 from tessel import beginning, errors, netcdf, notes
 from tessel.errors import BUILT_INS, CLASSES, SYSTEM_ERRORS, WITHOUT_BUILT_IN, Error
 
@@ -128,7 +129,7 @@ PROTOCOLS = range(pickle.HIGHEST_PROTOCOL + 1)
 
 @pytest.mark.parametrize("word", WORDS)
 def test_copies_and_pickles(word: str) -> None:
-    error = Error(f"TESSEL:netcdf:op:{word}", "the message", "op")
+    error = Error(f"TESSEL:netcdf:op:{word}", "the message", "op", path="/folder/file.nc")
     error.add_note("a note")
     if isinstance(error, OSError):
         error.filename = "file.nc"
@@ -137,6 +138,7 @@ def test_copies_and_pickles(word: str) -> None:
         assert made is not error and type(made) is type(error)
         assert str(made) == made.message == "the message" and made.identifier == error.identifier
         assert (made.operation, made.word, made.args) == ("op", word, error.args)
+        assert made.path == "/folder/file.nc"
         assert made.__notes__ == ["a note"]
         if isinstance(error, OSError):
             assert (made.errno, made.strerror, made.filename) == (error.errno, error.strerror,
@@ -246,6 +248,26 @@ def test_is_raised_as(ncid: int, built_in: type[Exception],
     note_of(caught.value)
 
 
+DAMAGED: dict[str, typing.Callable[[bytes], bytes]] = {
+    "cut off": lambda whole: whole[:len(whole) // 2],
+    "only the mark": lambda whole: whole[:20],
+    "zeros behind the mark": lambda whole: whole[:48] + bytes(len(whole) - 48),
+    "noise behind the mark": lambda whole: whole[:8] + b"\xff" * 100,
+}
+
+
+@pytest.mark.parametrize("damaged", DAMAGED.values(), ids=DAMAGED.keys())
+def test_damaged_hdf5(damaged: typing.Callable[[bytes], bytes]) -> None:
+    """The library has a status of its own for it, which the module does not know."""
+    path = Path(generate(Path.cwd() / "h.nc", "dimensions: x = 3 ;", "netCDF-4"))
+    path.write_bytes(damaged(path.read_bytes()))
+    with pytest.raises(OSError) as caught:
+        nc.open("h.nc", "NOWRITE")
+    assert caught.value.identifier == "TESSEL:netcdf:open:unknownErrorStatus"
+    assert (caught.value.errno, caught.value.filename) == (None, "h.nc")
+    assert "HDF5" in note_of(caught.value)[2]
+
+
 def test_permission(monkeypatch: pytest.MonkeyPatch) -> None:
     """As somebody who may not read the file; root may read everything."""
     Path("closed.nc").touch()
@@ -274,7 +296,7 @@ def test_note_is_shown_below_the_message() -> None:
 def test_note_of_a_block(ncid: int) -> None:
     assert note_of(failure(nc.get_vara_double, ncid, 5, [0, 0], [4, 1])) == [
         f"in get_vara_double(ncid={ncid}, varid=5, start=[0, 0], count=[4, 1])",
-        f"ncid {ncid}: opened as 'sample.nc'",
+        f"ncid {ncid}: opened as '{Path.cwd()}/sample.nc'",
         "varid 5: double double(x=3, y=2)"]
 
 
@@ -325,8 +347,9 @@ def test_note_of_two_datasets(ncid: int) -> None:
     other = tessel.sample.dataset(nc, "other.nc")
     lines = note_of(failure(nc.copy_att, ncid, -1, "nothing", other, 6))
     assert lines[1:] == [
-        f"ncid_in {ncid}: opened as 'sample.nc'", "varid_in -1: the dataset itself",
-        f"ncid_out {other}: opened as 'other.nc'", "varid_out 6: double series(time=2 unlimited)"]
+        f"ncid_in {ncid}: opened as '{Path.cwd()}/sample.nc'", "varid_in -1: the dataset itself",
+        f"ncid_out {other}: opened as '{Path.cwd()}/other.nc'",
+        "varid_out 6: double series(time=2 unlimited)"]
     nc.close(other)
 
 
@@ -350,7 +373,7 @@ def test_paths_are_remembered_while_open(ncid: int, opening: typing.Callable[[],
     nc.close(ncid)
     before = dict(netcdf._opened)
     made = opening()
-    assert netcdf.path_of(made) == "sample.nc"
+    assert netcdf.path_of(made) == f"{Path.cwd()}/sample.nc"
     failure(nc.open, "missing.nc", "NOWRITE")
     ending(made)
     assert netcdf.path_of(made) is None and netcdf._opened == before
@@ -363,8 +386,57 @@ def test_nothing_is_remembered_of_what_failed(ncid: int) -> None:
     failure(nc.close, [])
     failure(nc, "close")
     failure(nc, "open", "missing.nc")
-    assert netcdf._opened == before and netcdf.path_of(ncid) == "sample.nc"
+    assert netcdf._opened == before and netcdf.path_of(ncid) == f"{Path.cwd()}/sample.nc"
 
+
+def test_paths_stay_true_in_another_folder(ncid: int, tmp_path: Path,
+                                           monkeypatch: pytest.MonkeyPatch) -> None:
+    monkeypatch.chdir("/")
+    error = failure(nc.inq_varid, ncid, "nothing")
+    assert note_of(error)[1] == f"ncid {ncid}: opened as '{tmp_path}/sample.nc'"
+    assert error.path == f"{tmp_path}/sample.nc"
+
+
+def test_a_folder_that_is_gone(tmp_path: Path, monkeypatch: pytest.MonkeyPatch) -> None:
+    """There is no path from the root on, and no other error because of that."""
+    gone = tmp_path / "gone"
+    gone.mkdir()
+    monkeypatch.chdir(gone)
+    gone.rmdir()
+    assert netcdf._text("sample.nc") == "sample.nc"
+    assert failure(nc.open, "sample.nc", "NOWRITE").word == "noSuchFileOrDirectory"
+
+
+@pytest.mark.parametrize("call, path", [
+    (lambda n, m: nc.open("missing.nc", "NOWRITE"), "missing.nc"),
+    (lambda n, m: nc.create("missing/new.nc", 0), "missing/new.nc"),
+    (lambda n, m: nc.inq_varid(n, "nothing"), "sample.nc"),
+    (lambda n, m: nc.copy_att(n, -1, "nothing", m, -1), "other.nc"),
+    (lambda n, m: nc.put_var1_int(n, 3, [0, 0], 0.5), "sample.nc"),
+    (lambda n, m: nc.inq(99), None), (lambda n, m: nc.param("nothing"), None),
+    (lambda n, m: nc.open("http://[", "NOWRITE"), None)])
+def test_path_of_an_error(ncid: int, call: typing.Callable[[int, int], object],
+                          path: str | None) -> None:
+    other = tessel.sample.dataset(nc, "other.nc")
+    error = failure(call, ncid, other)
+    assert error.path == (path and f"{Path.cwd()}/{path}")
+    nc.close(other)
+
+
+def test_names_from_files_cannot_steer_a_terminal(ncid: int) -> None:
+    path = Path("evil\033[2J.nc")
+    nc.close(tessel.sample.dataset(nc, "other.nc"))
+    path.write_bytes(Path("other.nc").read_bytes().replace(b"double", b"\033[31m\x07").replace(
+        b"series", b"\xc2\x9b31m\r"))
+    evil = nc.open(path, "NOWRITE")
+    for error in (failure(nc.get_var1_double, evil, 5, [9, 9]), failure(nc.inq_varid, evil, "no"),
+                  failure(nc.get_var1_double, evil, 6, [9]),
+                  failure(nc.create, path, "NOCLOBBER")):
+        shown = "".join(traceback.format_exception_only(error))
+        assert "evil" in shown
+        assert not re.search(r"[\x00-\x09\x0b-\x1f\x7f-\x9f]", shown)
+    assert "evil\\x1b[2J.nc" in error.__notes__[0]
+    nc.close(evil)
 
 def test_an_id_used_again_keeps_its_new_path(monkeypatch: pytest.MonkeyPatch) -> None:
     """Another thread may open a file between the end of a call of close and its record."""
@@ -383,9 +455,33 @@ def test_an_id_used_again_keeps_its_new_path(monkeypatch: pytest.MonkeyPatch) ->
     (numpy.arange(3), "<int64 array of shape (3,): [0, 1, 2]>"),
     (numpy.zeros((20, 30), "f4"), "<float32 array of shape (20, 30)>"),
     (numpy.zeros((0, 3)), "<float64 array of shape (0, 3)>"),
-    (["x" * 70], "['" + "x" * 58 + "...")], ids=lambda each: None)
+    (["x" * 70], "['" + "x" * 22 + "..." + "x" * 23 + "']"),
+    ([[1, 2], (3,)], "[[1, 2], (3,)]"), ([[[5]]], "[[[...]]]"), ({"a": [1]}, "{'a': [1]}"),
+    pytest.param(10**10000, "<int of 33220 bits>", id="no int that Python writes"),
+    pytest.param([10**10000], "[<int of 33220 bits>]", id="a list of such"),
+    (numpy.array([[1] * 99, None], object), "<object array of shape (2,): "
+     "[[1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, ...], None]>")], ids=lambda each: None)
 def test_arguments_are_shortened(value: object, shown: str) -> None:
     assert notes.shortened(value) == shown
+
+
+class Counted(str):
+    """A text that counts how often it was written."""
+
+    written = 0
+
+    def __repr__(self) -> str:
+        Counted.written += 1
+        return "x"
+
+
+@pytest.mark.parametrize("large", [
+    [[Counted()] * 10**6], ([Counted()] * 10**6,), {"a": [Counted()] * 10**6},
+    {i: Counted() for i in range(10**5)}, [[[Counted()] * 10**3] * 10**3]], ids=lambda each: None)
+def test_a_large_argument_is_never_written_whole(large: object) -> None:
+    Counted.written = 0
+    assert len(notes.shortened(large)) <= 63
+    assert Counted.written < 200
 
 
 def test_note_of_unknown_operation_and_surplus_arguments() -> None:
@@ -404,7 +500,8 @@ def test_notes_never_replace_the_error(ncid: int, monkeypatch: pytest.MonkeyPatc
             raise RuntimeError("no")
 
     error = failure(nc.inq, Awkward())
-    assert error.word == "unsupportedType" and not hasattr(error, "__notes__")
+    assert error.word == "unsupportedType"
+    assert note_of(error)[0].startswith("in inq(ncid=<Awkward instance at ")
     monkeypatch.setattr(notes, "_lines", lambda *given: 1 / 0)
     assert failure(nc.inq_var, ncid, 99).word == "variableNotFound"
 

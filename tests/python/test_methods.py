@@ -383,12 +383,16 @@ def test_numbers_that_are_exact(ncid: int, member: object) -> None:
     ("put_var1_short", 32768), ("put_var1_schar", 128), ("put_var1_schar", -129),
     ("put_var1_uchar", 256), ("put_var1_uchar", -1), ("put_var1_float", 0.1),
     ("put_var1_float", 1e39), ("put_var1_float", 2**24 + 1), ("put_var1_double", 2**53 + 1),
-    ("put_var1_double", 10**400), ("put_var1_int", 10**400), ("put_var1_int", [0.5])])
+    ("put_var1_double", 10**400), ("put_var1_int", 10**400), ("put_var1_int", [0.5]),
+    pytest.param("put_var1_int", 10**5000, id="beyond what Python writes")])
 def test_numbers_that_are_not(ncid: int, operation: str, value: object) -> None:
     with pytest.raises(ValueError, match="not exact") as caught:
         getattr(nc, operation)(ncid, 3, [0, 0], value)
     assert caught.value.identifier == "TESSEL:python:notExact"
     assert caught.value.operation == operation
+    [note] = caught.value.__notes__
+    assert note.startswith(f"in {operation}(ncid={ncid}, varid=3, index=[0, 0], data=")
+    assert note.endswith("\nvarid 3: int int(x=3, y=2)")
     assert nc.get_var1_int(ncid, 3, [0, 0]).item() == 0
 
 
@@ -447,7 +451,7 @@ def test_completion() -> None:
     names = set(dir(nc))
     assert {name for _, name in NAMES} <= names
     public = {name for name in names if not name.startswith("__")}
-    assert public - {name for _, name in NAMES} == {"file"}
+    assert public - {name for _, name in NAMES} == {"file", "guarded"}
 
 
 def test_members_do_not_share_anything() -> None:

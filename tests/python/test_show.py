@@ -2,6 +2,7 @@
 
 from __future__ import annotations
 
+import os
 import subprocess
 import sys
 from pathlib import Path
@@ -36,7 +37,8 @@ def test_the_real_file(tmp_path: Path) -> None:
         values = dataset.variables["SST"][:].astype(np.float64)
     values = np.ma.masked_equal(values, np.float32(-1e34).astype(np.float64))
     for text in ("COADSX  180", "TIME     12  unlimited", "float SST(TIME, COADSY, COADSX)",
-                 "SEA SURFACE TEMPERATURE", f"range    {values.min():.7g} to {values.max():.7g} Deg C",
+                 "SEA SURFACE TEMPERATURE",
+                 f"range    {values.min():.7g} to {values.max():.7g} Deg C",
                  f"mean     {values.mean():.7g} Deg C",
                  f"missing  {100 * values.mask.mean():.1f} %"):
         assert text in done.stdout, text
@@ -56,6 +58,24 @@ def test_errors_are_the_modules_own_message(tmp_path: Path, arguments: list[str]
     done = show(*arguments, folder=tmp_path)
     assert (done.returncode, done.stdout, done.stderr) == (1, "", message + "\n")
     assert list(tmp_path.iterdir()) == []
+
+
+def test_a_file_that_was_cut_off_is_named(tmp_path: Path) -> None:
+    """The message is not the module's, and nothing else says which file."""
+    path = generate(tmp_path / "cut.nc", "dimensions: x = 9 ; variables: int v(x) ; data: v = 1 ;")
+    size = Path(path).stat().st_size
+    os.truncate(path, size - 8)
+    done = show(path, folder=tmp_path)
+    assert (done.returncode, done.stdout) == (1, "")
+    assert done.stderr == (f"The file is cut off: it has {size - 8} bytes, and what is in it needs "
+                           f"{size}: {path}\n")
+
+
+def test_wrong_usage_is_one_line(tmp_path: Path) -> None:
+    done = show("a", "b", "\033[31mc", folder=tmp_path)
+    assert (done.returncode, done.stdout) == (1, "")
+    assert done.stderr == ("tessel.show: unrecognized arguments: \\x1b[31mc; "
+                           "try tessel.show --help\n")
 
 
 ODD = {

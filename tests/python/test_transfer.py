@@ -123,9 +123,71 @@ def test_bad_selections(everything, start, count, word):
         f"TESSEL:python:{word}"
 
 
-def test_places_are_integers(everything):
-    with pytest.raises(TypeError):
-        tessel.read(everything, "r3", (0.5, 0, 0))
+WRONG_TYPES = {
+    # how it is called: what is wrong with it, and the message
+    "start of fractions": (lambda f, g: tessel.read(f, "r3", (0.5, 0, 0)),
+                           "each element of start is a whole number, not of the type float."),
+    "count of texts": (lambda f, g: tessel.read(f, "r3", None, ("1", 1, 1)),
+                       "each element of count is a whole number, not of the type str."),
+    "start is one number": (lambda f, g: tessel.read(f, "r2", 1),
+                            "start is a sequence of whole numbers, not of the type int."),
+    "size of blocks in words": (lambda f, g: tessel.read(f, "r3", block_bytes="1 MiB"),
+                                "block_bytes is a whole number, not of the type str."),
+    "size of blocks in fractions": (lambda f, g: tessel.copy(f, g, block_bytes=1e6),
+                                    "block_bytes is a whole number, not of the type float."),
+    "out is a list": (lambda f, g: tessel.read(f, "r3", out=[]),
+                      "out is an array of NumPy's, not of the type list."),
+    "progress is a number": (lambda f, g: tessel.copy(f, g, progress=5),
+                             "progress is a function of two numbers, not of the type int."),
+    "source is a number": (lambda f, g: tessel.copy(5, g),
+                           "A path is a str, bytes or a path object, not of the type int."),
+    "target is nothing": (lambda f, g: tessel.copy(f, None),
+                          "A path is a str, bytes or a path object, not of the type NoneType."),
+}
+
+
+@pytest.mark.parametrize(("call", "message"), WRONG_TYPES.values(), ids=WRONG_TYPES.keys())
+def test_wrong_types(everything, tmp_path, call, message):
+    with pytest.raises(TypeError) as raised:
+        call(everything, tmp_path / "copy.nc")
+    assert raised.value.identifier == "TESSEL:python:unsupportedType"
+    assert raised.value.message == message
+    assert raised.value.operation in ("read", "copy")
+    assert os.listdir(tmp_path) == ["everything.nc"]
+
+
+def test_numbers_may_be_of_any_class(everything):
+    expected = tessel.read(everything, "r3", (1, 0, 0), (2, 1, 3))
+    assert same(tessel.read(everything, "r3", np.array([1, 0, 0]), iter([2, 1, np.int8(3)]),
+                            block_bytes=np.int16(40)), expected)
+
+
+@pytest.mark.parametrize("form", [bytes, Path, str])
+def test_paths_of_every_kind(everything, tmp_path, monkeypatch, form):
+    """A name beyond ASCII is the same file in each, and one that begins with a blank too."""
+    monkeypatch.chdir(tmp_path)
+    for name in ("größe.nc", " blank.nc"):
+        given = os.fsencode(name) if form is bytes else form(name)
+        tessel.copy(everything, given)
+        assert sorted(os.listdir(tmp_path)) == sorted(["everything.nc", name])
+        assert same(tessel.read(given, "r3"), tessel.read(everything, "r3"))
+        assert tessel.check(given) == tessel.check(tmp_path / name)
+        tessel.copy(given, os.fsencode(tmp_path / "back.nc") if form is bytes else "back.nc")
+        assert dump("back.nc") == dump(everything)
+        os.unlink("back.nc")
+        os.unlink(name)
+
+
+@pytest.mark.parametrize("path", [b"\xff.nc", "a\0.nc", b"\xff/a.nc"])
+def test_paths_that_the_module_would_take_for_others(everything, tmp_path, path, monkeypatch):
+    monkeypatch.chdir(tmp_path)
+    os.mkdir(b"\xff")
+    for call in (lambda: tessel.copy(everything, path), lambda: tessel.copy(path, "copy.nc"),
+                 lambda: tessel.read(path, "r3"), lambda: tessel.check(path)):
+        assert identifier_of(call) == "TESSEL:python:badPath"
+    monkeypatch.chdir(b"\xff")
+    assert identifier_of(lambda: tessel.copy(everything, "copy.nc")) == "TESSEL:python:badPath"
+    assert len(os.listdir(tmp_path)) == 2
 
 
 def test_read_errors_are_the_modules(everything, tmp_path):
@@ -149,6 +211,9 @@ def test_read_into_an_array(everything, tmp_path, block_bytes):
     text = np.zeros((5, 1), "U1")
     tessel.read(everything, "word", out=text)
     assert text.tobytes().decode("utf-32-le") == "a b\0\0"
+    out.flags.writeable = False
+    assert identifier_of(lambda: tessel.read(everything, "r3", out=out)) == \
+        "TESSEL:python:readOnlyArray"
     assert identifier_of(lambda: tessel.read(everything, "r3", out=np.empty((5, 3)))) == \
         "TESSEL:python:badShape"
     assert identifier_of(lambda: tessel.read(everything, "r3", out=np.empty((5, 3, 3), "f4"))) == \
@@ -296,6 +361,110 @@ def test_other_sources_and_formats_are_refused(everything, tmp_path):
     assert identifier_of(lambda: tessel.copy(tmp_path / "no.nc", tmp_path / "copy.nc")) == \
         "TESSEL:netcdf:open:noSuchFileOrDirectory"
     assert sorted(os.listdir(tmp_path)) == ["everything.nc", "new.nc"]
+
+
+def test_records_that_no_variable_has(tmp_path):
+    """The library counts them as the header does, and a copy could not."""
+    source = Path(generate(tmp_path / "r.nc", "dimensions: r = UNLIMITED ; x = 2 ; "
+                           "variables: int a(x) ; data: a = 1, 2 ;"))
+    tessel.copy(source, tmp_path / "none.nc")
+    data = bytearray(source.read_bytes())
+    data[4:8] = (5).to_bytes(4, "big")
+    source.write_bytes(data)
+    with Dataset(source) as dataset:
+        assert dataset.dimensions[0].length == 5
+    with pytest.raises(ValueError) as raised:
+        tessel.copy(source, tmp_path / "copy.nc")
+    assert raised.value.identifier == "TESSEL:python:recordsWithoutVariables"
+    assert "counts 5 records along r" in raised.value.message
+    assert sorted(os.listdir(tmp_path)) == ["none.nc", "r.nc"]
+
+
+# Notes
+
+OWN = {
+    # how it is called: the word, the function, and what a note says beside the call and the file
+    "badStartLength": (lambda f, g: tessel.read(f, "r3", (0, 0)), "read",
+                       "double r3(wide=5, high=3, record=3 unlimited)"),
+    "badCountLength": (lambda f, g: tessel.read(f, "scalar", None, (1,)), "read",
+                       "double scalar, a single value"),
+    "indexExceedsDimensionBound": (lambda f, g: tessel.read(f, "r3", (9, 9, 9)), "read",
+                                   "double r3(wide=5, high=3, record=3 unlimited)"),
+    "badShape": (lambda f, g: tessel.read(f, "r2", out=np.empty(9)), "read",
+                 "short r2(record=3 unlimited)"),
+    "unsupportedDtype": (lambda f, g: tessel.read(f, "r2", out=np.empty((3, 1))), "read",
+                         "short r2(record=3 unlimited)"),
+    "badBlockSize": (lambda f, g: tessel.read(f, "r3", block_bytes=0), "read", None),
+    "fileExists": (lambda f, g: tessel.copy(f, g.parent / "there.nc"), "copy", None),
+    "sameFile": (lambda f, g: tessel.copy(f, f), "copy", None),
+    "badFormat": (lambda f, g: tessel.copy(f, g, "netCDF-4"), "copy", None),
+    "notARegularFile": (lambda f, g: tessel.copy(f, g.parent, overwrite=True), "copy", None),
+}
+
+
+@pytest.mark.parametrize(("word", "call", "function", "more"),
+                         [(word, *row) for word, row in OWN.items()], ids=OWN.keys())
+def test_notes_of_this_packages_errors(tmp_path, word, call, function, more):
+    source = generate(tmp_path / "everything.nc", EVERYTHING)
+    (tmp_path / "there.nc").touch()
+    with pytest.raises(tessel.Error) as raised:
+        call(source, tmp_path / "copy.nc")
+    error = raised.value
+    assert (error.identifier, error.operation) == (f"TESSEL:python:{word}", function)
+    lines = "\n".join(error.__notes__).splitlines()
+    assert [line for line in lines if line.startswith(f"in tessel.{function}(")]
+    assert f"{'file' if function == 'read' else 'source'}: {source}" in lines
+    if function == "copy":
+        assert any(line.startswith(f"target: {tmp_path}") for line in lines)
+    assert more is None or more in lines
+
+
+def test_notes_of_the_modules_errors_say_what_they_were_for(everything):
+    with pytest.raises(KeyError) as raised:
+        tessel.read(everything, "nothing", [0])
+    assert raised.value.operation == "inq_varid"
+    first, last = raised.value.__notes__
+    assert first.startswith("in inq_varid(ncid=")
+    assert last.startswith("in tessel.read(path=") and "variable='nothing', start=[0])" in last
+
+
+FAILING = {
+    # how the copy fails, given its target: the arguments, and the folder that it is made in
+    "no folder": ({}, "missing/copy.nc"),
+    "a type that the format lacks": ({"format": "classic"}, "copy.nc"),
+}
+
+
+@pytest.mark.parametrize(("more", "name"), FAILING.values(), ids=FAILING.keys())
+@pytest.mark.parametrize("relative", [False, True])
+def test_notes_of_a_failed_copy_name_its_target(tmp_path, monkeypatch, more, name, relative):
+    monkeypatch.chdir(tmp_path)
+    source = generate(tmp_path / "wide.nc", "dimensions: x = 2 ; variables: ubyte a(x) ;", "cdf5")
+    target = name if relative else str(tmp_path / name)
+    with pytest.raises(tessel.Error) as raised:
+        tessel.copy(source, target, **{"format": "64bit-offset", **more})
+    error = raised.value
+    notes = "\n".join(error.__notes__)
+    assert ".part" not in notes + str(error.args) and f"{tmp_path}/{name}" in notes
+    assert error.path == f"{tmp_path}/{name}"
+    if isinstance(error, FileNotFoundError):
+        assert error.filename == target
+        assert f"there is no folder {tmp_path}/missing" in notes
+
+
+def test_notes_of_a_failed_copy_after_a_change_of_folder(everything, tmp_path, monkeypatch):
+    """A note is about the folder that the copy was asked for in."""
+    monkeypatch.chdir(tmp_path)
+
+    def leave(done, total):
+        os.chdir("/")
+        Path(tmp_path, "copy.nc").touch()
+
+    with pytest.raises(tessel.Error) as raised:
+        tessel.copy("everything.nc", "copy.nc", progress=leave)
+    assert raised.value.path == f"{tmp_path}/copy.nc"
+    assert f"\nsource: {tmp_path}/everything.nc\ntarget: {tmp_path}/copy.nc" in (
+        raised.value.__notes__[-1])
 
 
 # Targets

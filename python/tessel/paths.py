@@ -1,0 +1,65 @@
+# python/tessel/paths.py: names of files: as they were given, where they lead, what to call them.
+"""Paths for the module, and for people.
+
+The module takes a path as text and makes UTF-8 of it. A name that cannot make that way unchanged
+would lead to another file, so it is refused here.
+"""
+
+from __future__ import annotations
+
+import contextlib
+import os
+from collections.abc import Iterator
+from typing import Any, Union
+
+from tessel.errors import Error
+
+Path = Union[str, bytes, "os.PathLike[str]", "os.PathLike[bytes]"]
+
+_called: dict[str, str] = {}
+"""Files that have a name for the time being only, and the name that they are to have."""
+
+
+def given(path: Any) -> str:
+    """A path as text: of str, bytes and path objects; an error for everything else, and for what
+    the module would take for another path."""
+    try:
+        text = os.fsdecode(path)
+    except TypeError:
+        raise Error("TESSEL:python:unsupportedType",
+                    "A path is a str, bytes or a path object, not of the type "
+                    f"{type(path).__name__}.") from None
+    if "\0" in text:
+        raise Error("TESSEL:python:badPath", "A path has no NUL in it.")
+    try:
+        text.encode()
+    except UnicodeEncodeError:
+        raise Error("TESSEL:python:badPath", "The path is not UTF-8, and the module takes no "
+                    f"other: {text!r}", path=absolute(text)) from None
+    return text if text[:1] > " " or not text else f"./{text}"  # the library skips blanks there
+
+
+def absolute(path: str, folder: str | None = None) -> str:
+    """Where a path leads from a folder, the current one unless given; what is no path of a file
+    stays as it is."""
+    if "\0" in path or "://" in path:
+        return path
+    try:
+        return os.path.abspath(path if folder is None else os.path.join(folder, path))
+    except OSError:  # the current folder has been removed
+        return path
+
+
+@contextlib.contextmanager
+def called(temporary: str, target: str) -> Iterator[None]:
+    """While the `with` block runs, notes call the file `temporary` by the name of its target."""
+    _called[temporary] = target
+    try:
+        yield
+    finally:
+        del _called[temporary]
+
+
+def shown(path: Any) -> Any:
+    """What to call a file; what is none stays as it is."""
+    return _called.get(path, path) if isinstance(path, str) else path
