@@ -1,13 +1,52 @@
-# Installs into PREFIX, builds PROGRAM against nothing but that, and runs it on FILE.
+# Installs BUILD into PREFIX, and then uses nothing but that: builds PROGRAM by pkg-config, and the
+# projects of EXAMPLES by the CMake package, and runs all of it on FILE.
 file(REMOVE_RECURSE ${PREFIX})
-execute_process(COMMAND ${CMAKE_COMMAND} --install ${BUILD} --prefix ${PREFIX}
+execute_process(COMMAND ${CMAKE_COMMAND} --install ${BUILD} --prefix ${PREFIX}/usr
     OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
-execute_process(
-    COMMAND ${COMPILER} -std=c++20 ${PROGRAM} -I${PREFIX}/include -L${PREFIX}/${LIBDIR} -ltessel
-        -Wl,-rpath,${PREFIX}/${LIBDIR} -o ${PREFIX}/embed
+set(lib ${PREFIX}/usr/${LIBDIR})
+
+function(expect printed)
+    execute_process(COMMAND ${ARGN} OUTPUT_VARIABLE found COMMAND_ERROR_IS_FATAL ANY)
+    if(NOT found STREQUAL printed)
+        message(FATAL_ERROR "${ARGN} printed: ${found}")
+    endif()
+endfunction()
+
+set(ENV{PKG_CONFIG_PATH} ${lib}/pkgconfig)
+execute_process(COMMAND pkg-config --define-prefix --cflags --libs tessel
+    OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
+separate_arguments(flags)
+execute_process(COMMAND ${COMPILER} -std=c++20 ${PROGRAM} ${flags} -Wl,-rpath,${lib}
+        -o ${PREFIX}/embed
     COMMAND_ERROR_IS_FATAL ANY)
-execute_process(COMMAND ${PREFIX}/embed ${FILE} COADSY OUTPUT_VARIABLE printed
+expect("90 values, from -89 to 89\n" ${PREFIX}/embed ${FILE} COADSY)
+
+foreach(project second_module embedding)
+    execute_process(COMMAND ${CMAKE_COMMAND} -S ${EXAMPLES}/${project} -B ${PREFIX}/${project}
+            -G Ninja -DCMAKE_PREFIX_PATH=${PREFIX}/usr -DCMAKE_CXX_COMPILER=${COMPILER}
+            -DCMAKE_CXX_FLAGS=-Werror
+        OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+    execute_process(COMMAND ${CMAKE_COMMAND} --build ${PREFIX}/${project}
+        OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+endforeach()
+
+set(line "COADSY: 90 values from -89 to 89, mean 0\n")
+set(arguments ${PREFIX}/second_module/series.tsx ${FILE} COADSY)
+expect("${line}" ${PREFIX}/embedding/means ${arguments})
+set(ENV{TESSEL_MODULE_PATH} ${lib}/tessel) # beside a program in one piece there are no modules
+expect("${line}" ${PREFIX}/embedding/means_static ${arguments})
+
+# What they want of the system at run time has neither the build tree in it nor, where the host is
+# linked into the program, the host's library.
+execute_process(COMMAND objdump -p ${PREFIX}/embedding/means_static OUTPUT_VARIABLE wanted
     COMMAND_ERROR_IS_FATAL ANY)
-if(NOT printed STREQUAL "90 values, from -89 to 89\n")
-    message(FATAL_ERROR "it printed: ${printed}")
+if(wanted MATCHES "libtessel")
+    message(FATAL_ERROR "the static program wants the shared library")
 endif()
+foreach(file libtessel.so tessel/netcdf.tsx)
+    execute_process(COMMAND objdump -p ${lib}/${file} OUTPUT_VARIABLE wanted
+        COMMAND_ERROR_IS_FATAL ANY)
+    if(wanted MATCHES "R(UN)?PATH")
+        message(FATAL_ERROR "${file} has a path of the build in it")
+    endif()
+endforeach()

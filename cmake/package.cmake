@@ -1,0 +1,21 @@
+# What other projects find the installation by: a CMake package and a pkg-config file.
+include(CMakePackageConfigHelpers)
+
+set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/tessel)
+install(EXPORT tessel NAMESPACE tessel:: FILE tessel-targets.cmake
+    DESTINATION ${package_dir} COMPONENT development)
+configure_package_config_file(${CMAKE_CURRENT_LIST_DIR}/tessel-config.cmake.in
+    ${CMAKE_BINARY_DIR}/tessel-config.cmake
+    INSTALL_DESTINATION ${package_dir}
+    PATH_VARS CMAKE_INSTALL_LIBDIR)
+write_basic_package_version_file(${CMAKE_BINARY_DIR}/tessel-config-version.cmake
+    COMPATIBILITY SameMinorVersion)
+install(FILES
+    ${CMAKE_BINARY_DIR}/tessel-config.cmake
+    ${CMAKE_BINARY_DIR}/tessel-config-version.cmake
+    ${CMAKE_CURRENT_LIST_DIR}/tessel-add-module.cmake
+    DESTINATION ${package_dir} COMPONENT development)
+
+configure_file(${CMAKE_CURRENT_LIST_DIR}/tessel.pc.in ${CMAKE_BINARY_DIR}/tessel.pc @ONLY)
+install(FILES ${CMAKE_BINARY_DIR}/tessel.pc
+    DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)
