@@ -10,8 +10,8 @@ measured as it comes, with masking and scaling, and without, as its users who wa
 Before anything is measured, the sides must give the same values and write the same file.
 
 --write puts the table between the marks in the document. --quick does everything once, on small
-data: it shows that the program works, and measures nothing. Run it on a machine that does nothing
-else.
+data, and prints its table: it shows that the program works, and its numbers say nothing. Run it on
+a machine that does nothing else.
 """
 
 from __future__ import annotations
@@ -283,20 +283,23 @@ def main() -> int:
     parser.add_argument("--write", type=Path, metavar="DOCUMENT",
                         help="put the table between the marks in this document")
     parser.add_argument("--quick", action="store_true",
-                        help="do everything once, on small data, and measure nothing")
+                        help="do everything once, on small data; the numbers say nothing")
     options = parser.parse_args()
+    if options.quick and options.write:
+        parser.error("numbers that say nothing belong into no document")
     length, times, repetitions = (2, 10, 1) if options.quick else (256, 1000, 45)
     with tempfile.TemporaryDirectory() as folder:
         bench = Bench(Path(folder), length, times)
         try:
             bench.check()
-            if options.quick:
-                return 0
             lines, good = table(bench, repetitions)
         finally:
             bench.close()
     text = "\n".join([*lines, "", circumstances()])
     print(text)
+    if options.quick:
+        print("\nOnce, on small data: these numbers are no measurement.")
+        return 0
     if options.write:
         put_between_marks(options.write, text)
     return 0 if good else 1

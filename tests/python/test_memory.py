@@ -43,13 +43,6 @@ def resident() -> int:
     return status("VmRSS")
 
 
-@pytest.fixture
-def real_heap() -> None:
-    """Leaves out what the address sanitizer makes meaningless: it keeps memory that was freed."""
-    if "libasan" in Path("/proc/self/maps").read_text():
-        pytest.skip("the sanitizer's heap keeps what was freed")
-
-
 class Observed:
     """A module of its own that calls the library through the observer, and a variable of SHAPE."""
 
@@ -175,7 +168,7 @@ def test_the_counter_of_copies_counts(observed: Observed) -> None:
     assert cost.kept == pytest.approx(1, abs=0.01)
 
 
-@pytest.mark.usefixtures("real_heap")
+@pytest.mark.without_sanitizers  # the sanitizer keeps memory that was freed
 @pytest.mark.parametrize("layout", ["column-major", "row-major"])
 def test_nothing_but_numpy_copies_an_input(observed: Observed, layout: str) -> None:
     """The whole process never needs more at once than the copies that NumPy is seen to make."""
@@ -249,7 +242,7 @@ def mixed_calls(folder: Path) -> list[tuple[Callable[[], object], str | None]]:
     return calls
 
 
-@pytest.mark.usefixtures("real_heap")
+@pytest.mark.without_sanitizers  # the sanitizer keeps memory that was freed
 def test_mixed_calls_leave_nothing_behind(tmp_path: Path) -> None:
     calls = mixed_calls(tmp_path)
     assert 3 * sum(identifier is not None for _, identifier in calls) == len(calls)

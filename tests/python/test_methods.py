@@ -107,7 +107,6 @@ def prototypes() -> dict[str, list[tuple[str, str]]]:
     return found
 
 
-@pytest.mark.skipif(not Path("/usr/include/netcdf.h").exists(), reason="no header of the library")
 def test_parameters_have_the_librarys_names() -> None:
     """Those that go in, without the p of a pointer; op is called data, and lengths that an array
     knows itself are left out."""

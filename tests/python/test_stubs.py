@@ -15,9 +15,8 @@ PACKAGE = ROOT / "python" / "tessel"
 EXAMPLE = Path(__file__).with_name("typed_example.py")
 MODULES = ["tessel.netcdf", "tessel.errors", "tessel._runtime"]
 
-# The types do not depend on how the extension was compiled.
-pytestmark = pytest.mark.skipif("libasan" in os.environ.get("LD_PRELOAD", ""),
-                                reason="the sanitizer would slow mypy down for nothing")
+# The types do not depend on how the extension was compiled, and mypy would take very long.
+pytestmark = pytest.mark.without_sanitizers
 
 # What a stub cannot say: pybind11 makes its classes with a metaclass of its own.
 ALLOWED = "tessel.netcdf.Netcdf\ntessel._runtime.Module\n"
