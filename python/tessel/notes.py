@@ -223,8 +223,7 @@ class _Subject:
         path = paths.shown(path_of(ncid))
         if path is None:
             return f"{name} {ncid}: no dataset that was opened here is known by this id"
-        if name != "ncid_in":  # of two datasets, the one that is written
-            self._error.path = path
+        self._error.path = path  # of two datasets, the one that is written, which comes last
         return f"{name} {ncid}: opened as {path!r}"
 
     def _variable(self, name: str, ncid: int, varid: int) -> str:

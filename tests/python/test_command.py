@@ -295,7 +295,7 @@ def test_help(capsys, arguments):
     [], ["frob"], ["info"], ["info", "a", "b", "c"], ["plot", "a", "b"], ["copy", "a"], ["check"],
     ["copy", "a", "b", "--format", "netCDF-4"], ["plot", "a", "b", "-o", "c", "--index", "x"],
     ["plot", "a", "b", "-o", "c", "--index", "x=-1"], ["ops", "a", "b"],
-    ["info", "\033[31m", "a", "b"]])
+    ["info", "a", "b", "\033[31m\n"]])
 def test_wrong_usage(capsys, arguments):
     line = one_line(run(capsys, *arguments))
     assert re.search(r"; try tessel( info| plot| copy| check| ops)? --help$", line)

@@ -9,6 +9,7 @@ import os
 import signal
 import subprocess
 import sys
+import tempfile
 import textwrap
 from concurrent.futures import ThreadPoolExecutor
 from pathlib import Path
@@ -450,6 +451,15 @@ def test_notes_of_a_failed_copy_name_its_target(tmp_path, monkeypatch, more, nam
     if isinstance(error, FileNotFoundError):
         assert error.filename == target
         assert f"there is no folder {tmp_path}/missing" in notes
+
+
+def test_calls_in_notes_have_the_targets_name(everything):
+    """In a folder whose name is short enough for the whole of the call to be shown."""
+    with tempfile.TemporaryDirectory() as folder:
+        target = f"{folder}/no/copy.nc"
+        with pytest.raises(FileNotFoundError) as raised:
+            tessel.copy(everything, target)
+    assert raised.value.__notes__[0].startswith(f"in create(path={target!r}, cmode=")
 
 
 def test_notes_of_a_failed_copy_after_a_change_of_folder(everything, tmp_path, monkeypatch):
