@@ -11,9 +11,6 @@
 #include <algorithm>
 #include <array>
 #include <cctype>
-#include <fstream>
-#include <functional>
-#include <numeric>
 #include <string_view>
 
 namespace tessel {
@@ -66,26 +63,27 @@ void lookAtName(std::string_view path, const GuardOptions &options) {
     }
 }
 
-void lookAtOpening(std::string_view path, int flags) {
+/// Whether the file is of a classic format.
+bool lookAtOpening(std::string_view path, int flags) {
     if ((flags & inMemory) != 0 && (flags & answeredBefore) == 0) {
         refuse(mode, "the flag 32768 (NC_INMEMORY) is set");
     }
-    if (const auto claim = distrusted(std::string(path))) {
-        refuse(header, "the header of " + inQuotes(path) + " " + *claim);
+    const Header found = headerOf(std::string(path));
+    if (found.claim) {
+        refuse(header, "the header of " + inQuotes(path) + " " + *found.claim);
     }
+    return found.classic;
 }
 
-void lookAtCreation(int flags) {
+/// Whether the file will be of a classic format.
+bool lookAtCreation(int flags) {
     if ((flags & userFormats) != 0) {
         refuse(mode, "the flag " + std::to_string(flags & userFormats) +
                          " (a user-defined format) is set");
     }
-}
-
-bool isClassicFile(const std::string &path) {
-    std::array<char, 3> magic{};
-    std::ifstream(path, std::ios::binary).read(magic.data(), magic.size());
-    return std::string_view(magic.data(), magic.size()) == "CDF";
+    const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
+                                         datasets().defaultFormat) != hdf5Formats.end();
+    return (flags & hdf5) == 0 && !hdf5ByDefault;
 }
 
 void lookAtAlignment(Inputs inputs, int ncid, const Dataset *dataset, const Ask &ask) {
@@ -248,7 +246,7 @@ class Guard : public Watcher {
             lookAtName(path, options);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
-            kind == Kind::open ? lookAtOpening(path, flags) : lookAtCreation(flags);
+            classic = kind == Kind::open ? lookAtOpening(path, flags) : lookAtCreation(flags);
             return;
         }
         const auto ncid = integer(inputs[1]);
@@ -300,14 +298,10 @@ class Guard : public Watcher {
 
     void rememberOpened(Inputs inputs, const Results &results) const {
         const auto name = fileName(inputs[1]);
-        const int flags = integer(inputs[2]).value_or(0);
         Dataset dataset;
         dataset.path = withoutBlanks(name.value_or(""));
         dataset.defining = kind == Kind::create;
-        const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
-                                             datasets().defaultFormat) != hdf5Formats.end();
-        dataset.classic = kind == Kind::create ? (flags & hdf5) == 0 && !hdf5ByDefault
-                                               : isClassicFile(dataset.path);
+        dataset.classic = classic;
         datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
     }
 
@@ -339,6 +333,7 @@ class Guard : public Watcher {
 
     GuardOptions options;
     Kind kind = Kind::other;      // of the call in progress
+    bool classic = false;         // whether what it opens is
     std::uint64_t recordsEnd = 0; // where it ends, if it writes records
 };
 

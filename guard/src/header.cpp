@@ -94,15 +94,15 @@ class Reader {
     std::uint64_t position = 0;
     std::uint64_t start = 0;
     std::uint64_t buffered = 0;
-    std::array<unsigned char, 8192> buffer{};
+    std::array<unsigned char, 8192> buffer; // of which `buffered` bytes have values
 };
 
 /// Walks through a header and looks at its claims.
-class Header {
+class Walk {
   public:
-    explicit Header(const std::string &path) : reader(path) {}
+    explicit Walk(const std::string &path) : reader(path) {}
 
-    void look() {
+    void go(Header &found) {
         if (reader.number(3) != 0x434446) { // "CDF"
             throw Ended{};
         }
@@ -112,6 +112,7 @@ class Header {
         if (version != 1 && version != 2 && version != 5) {
             throw Ended{};
         }
+        found.classic = true;
         reader.skip(countSize); // the number of records
         for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0; --n) {
             name();
@@ -186,15 +187,16 @@ class Header {
 
 } // namespace
 
-std::optional<std::string> distrusted(const std::string &path) {
+Header headerOf(const std::string &path) {
+    Header found;
     try {
-        Header(path).look();
+        Walk(path).go(found);
     } catch (const Ended &) {
-        return std::nullopt;
-    } catch (const Distrusted &found) {
-        return found.claim;
+        return found;
+    } catch (const Distrusted &distrusted) {
+        found.claim = distrusted.claim;
     }
-    return std::nullopt;
+    return found;
 }
 
 } // namespace tessel::guard

@@ -6,13 +6,18 @@
 
 namespace tessel::guard {
 
-/// What in the header of a file is not to be trusted, as part of a sentence; nothing for a file
-/// that may be opened, which any other kind of file is as well. Looks at the header only, and never
-/// takes more memory than the file is long.
+/// What the header of a file is like.
+struct Header {
+    bool classic = false;             ///< whether it is one of the classic formats'
+    std::optional<std::string> claim; ///< what is not to be trusted in it, as part of a sentence
+};
+
+/// Looks at the header of a file and at nothing else of it. What is not of the classic formats, and
+/// what the library says itself, is no claim.
 ///
 /// Refused are counts above the number of bytes that are left of the file, names longer than
 /// NC_MAX_NAME and variables of more than NC_MAX_VAR_DIMS dimensions (both overflow the buffers
 /// that the library's documentation tells programs to use).
-std::optional<std::string> distrusted(const std::string &path);
+Header headerOf(const std::string &path);
 
 } // namespace tessel::guard
