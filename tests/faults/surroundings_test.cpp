@@ -1,0 +1,363 @@
+// tests/faults/surroundings_test.cpp: disks that are full or not to be written to, files that
+// change under an open dataset, and limits of the process. A row each: what is done, and what comes
+// of it.
+#include "support.hpp"
+
+#include <gtest/gtest.h>
+#include <sched.h>
+#include <sys/mount.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <array>
+#include <csignal>
+#include <fstream>
+#include <ostream>
+#include <span>
+#include <vector>
+
+namespace tessel::test {
+namespace {
+
+using Lines = std::vector<std::string>;
+
+/// What was done, and the identifiers that it raised.
+class Story {
+  public:
+    explicit Story(const Folder &place) : folder(place) {}
+
+    /// Does something and notes how it went; true if it raised nothing.
+    template <class Call>
+    bool tell(const std::string &what, const Call &call) {
+        const std::string raised = raisedBy(call);
+        note(what, raised == "nothing" ? "done" : raised);
+        return raised == "nothing";
+    }
+
+    void note(const std::string &what, const std::string &came) {
+        said += what + ": " + came + '\n';
+    }
+
+    /// Notes whether the first records of a file are as they were written.
+    void look(const std::string &name, std::size_t records) {
+        const std::string fault = log::faultIn(file(name), records);
+        note(std::to_string(records) + " records of " + name, fault.empty() ? "intact" : fault);
+    }
+
+    /// A closed log of three records.
+    void makeLog(const std::string &name) const { netcdf()("close", openLog(name)); }
+
+    /// An open log of three records, synchronised.
+    [[nodiscard]] int openLog(const std::string &name) const {
+        const int ncid = log::create(file(name));
+        log::appendSynchronised(ncid, 0, 3);
+        return ncid;
+    }
+
+    void appendAndClose(int ncid) {
+        tell("append", [&] { log::append(ncid, 3); });
+        tell("sync", [&] { netcdf()("sync", ncid); });
+        tell("close", [&] { netcdf()("close", ncid); });
+    }
+
+    [[nodiscard]] std::string file(const std::string &name) const { return folder.file(name); }
+    [[nodiscard]] const std::string &text() const { return said; }
+
+    const Folder &folder;
+
+  private:
+    std::string said;
+};
+
+/// Thrown where the system does not allow what a row needs.
+struct NotAllowed : std::runtime_error {
+    using std::runtime_error::runtime_error;
+};
+
+void allowed(bool holds, const std::string &what) {
+    if (!holds) {
+        throw NotAllowed(what);
+    }
+}
+
+void limit(int resource, rlim_t most) {
+    const rlimit wanted = {most, most};
+    allowed(setrlimit(static_cast<decltype(RLIMIT_AS)>(resource), &wanted) == 0, "no limit");
+}
+
+/// A user that permissions hold for, as they do not for the superuser.
+void becomeOrdinary() {
+    constexpr uid_t nobody = 65534;
+    allowed(geteuid() != 0 || setuid(nobody) == 0, "cannot become another user");
+}
+
+void write(const std::string &file, const std::string &text) {
+    std::ofstream(file) << text;
+}
+
+/// A mount namespace of the child's own, in which it may mount what it likes.
+void ownMounts() {
+    const uid_t user = geteuid();
+    allowed(unshare(user == 0 ? CLONE_NEWNS : CLONE_NEWUSER | CLONE_NEWNS) == 0,
+            "no mount namespace of one's own");
+    if (user != 0) {
+        write("/proc/self/uid_map", "0 " + std::to_string(user) + " 1");
+    }
+    allowed(mount("none", "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0, "no private mounts");
+}
+
+/// A file system that has room for three records and some of the next, beside what is on it.
+void smallDisk(const Folder &folder, std::size_t ballast = 0) {
+    ownMounts();
+    const std::string size = "size=" + std::to_string(65536 + ballast);
+    allowed(mount("tmpfs", folder.folder().c_str(), "tmpfs", 0, size.c_str()) == 0, "no mount");
+    write(folder.file("ballast"), std::string(ballast, 'b'));
+}
+
+constexpr rlim_t roomForThree = 3 * log::recordBytes + 4096;
+
+/// Reads that want more than the limit of memory: four members, since each has memory of its own.
+void readTooMuch(Story &story) {
+    constexpr double elements = 300e6;
+    constexpr int noFill = 256;
+    const int ncid = idOf(netcdf()("create", story.file("large.nc"), "CLOBBER"));
+    netcdf()("set_fill", ncid, noFill);
+    const Results x = netcdf()("def_dim", ncid, "x", elements);
+    const Results chars = netcdf()("def_var", ncid, "text", 2, x[0]);
+    const Results bytes = netcdf()("def_var", ncid, "bytes", 1, x[0]);
+    netcdf()("enddef", ncid);
+    limit(RLIMIT_AS, rlim_t{400} << 20U);
+    story.tell("get_var_double", [&] { netcdf()("get_var_double", ncid, bytes[0]); });
+    story.tell("get_vara_float", [&] { netcdf()("get_vara_float", ncid, bytes[0], 0, elements); });
+    story.tell("get_vars_int",
+               [&] { netcdf()("get_vars_int", ncid, bytes[0], 0, elements / 2, 2); });
+    story.tell("get_var_text", [&] { netcdf()("get_var_text", ncid, chars[0]); });
+    story.tell("get_var1_double", [&] { netcdf()("get_var1_double", ncid, bytes[0], 7); });
+    story.tell("close", [&] { netcdf()("close", ncid); });
+}
+
+struct Row {
+    const char *name;
+    Lines expected;
+    void (*run)(Story &story);
+};
+
+void PrintTo(const Row &row, std::ostream *out) {
+    *out << row.name;
+}
+
+// clang-format off
+const Row rows[] = {
+    {"TheDiskIsFull",
+     {"append: TESSEL:netcdf:putVara:noSpaceLeftOnDevice",
+      "sync: TESSEL:netcdf:sync:noSpaceLeftOnDevice",
+      "close: TESSEL:netcdf:close:noSpaceLeftOnDevice",
+      "3 records of log.nc: intact",
+      "create: TESSEL:netcdf:create:noSpaceLeftOnDevice"},
+     [](Story &story) {
+         smallDisk(story.folder);
+         story.appendAndClose(story.openLog("log.nc"));
+         story.look("log.nc", 3);
+         story.tell("create", [&] { log::create(story.file("other.nc")); });
+     }},
+    {"ThereIsRoomAgain",
+     {"append: TESSEL:netcdf:putVara:noSpaceLeftOnDevice",
+      "append again: done",
+      "sync: done",
+      "4 records of log.nc: intact"},
+     [](Story &story) {
+         smallDisk(story.folder, 65536);
+         const int ncid = story.openLog("log.nc");
+         story.tell("append", [&] { log::append(ncid, 3); });
+         unlink(story.file("ballast").c_str());
+         story.tell("append again", [&] { log::append(ncid, 3); });
+         story.tell("sync", [&] { netcdf()("sync", ncid); });
+         story.look("log.nc", 4);
+     }},
+    {"TheFileMayNotGrow",
+     {"append: TESSEL:netcdf:putVara:fileTooLarge",
+      "sync: TESSEL:netcdf:sync:fileTooLarge",
+      "close: TESSEL:netcdf:close:fileTooLarge",
+      "3 records of log.nc: intact"},
+     [](Story &story) {
+         const int ncid = story.openLog("log.nc");
+         std::signal(SIGXFSZ, SIG_IGN); // it would end the process, and the call with it
+         limit(RLIMIT_FSIZE, roomForThree);
+         story.appendAndClose(ncid);
+         story.look("log.nc", 3);
+     }},
+    {"TheFileSystemIsReadOnly",
+     {"create: TESSEL:netcdf:create:readOnlyFileSystem",
+      "open to write: TESSEL:netcdf:open:readOnlyFileSystem",
+      "3 records of log.nc: intact"},
+     [](Story &story) {
+         ownMounts();
+         const char *const place = story.folder.folder().c_str();
+         allowed(mount("tmpfs", place, "tmpfs", 0, "size=1m") == 0, "no mount");
+         story.makeLog("log.nc");
+         allowed(mount(nullptr, place, nullptr, MS_REMOUNT | MS_RDONLY, nullptr) == 0, "no remount");
+         story.tell("create", [&] { log::create(story.file("other.nc")); });
+         story.tell("open to write", [&] { netcdf()("open", story.file("log.nc"), "WRITE"); });
+         story.look("log.nc", 3);
+     }},
+    {"TheFolderIsReadOnly",
+     {"create: TESSEL:netcdf:create:permissionDenied",
+      "create over: TESSEL:netcdf:create:permissionDenied",
+      "open to write: TESSEL:netcdf:open:permissionDenied",
+      "3 records of log.nc: intact"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         chmod(story.file("log.nc").c_str(), 0444);
+         chmod(story.folder.folder().c_str(), 0555);
+         becomeOrdinary();
+         story.tell("create", [&] { log::create(story.file("other.nc")); });
+         story.tell("create over", [&] { log::create(story.file("log.nc")); });
+         story.tell("open to write", [&] { netcdf()("open", story.file("log.nc"), "WRITE"); });
+         story.look("log.nc", 3);
+     }},
+    {"TheFileMayNotBeRead",
+     {"open: TESSEL:netcdf:open:permissionDenied"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         chmod(story.file("log.nc").c_str(), 0);
+         becomeOrdinary();
+         story.tell("open", [&] { netcdf()("open", story.file("log.nc"), "NOWRITE"); });
+     }},
+    {"AFolderAndAFileChangePlaces",
+     {"create: TESSEL:netcdf:create:isDirectory",
+      "open below a file: TESSEL:netcdf:open:notADirectory"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         story.tell("create", [&] { log::create(story.folder.folder()); });
+         story.tell("open below a file", [&] { netcdf()("open", story.file("log.nc") + "/a.nc", "NOWRITE"); });
+     }},
+    {"TooManyFilesAreOpen",
+     {"open: TESSEL:netcdf:open:tooManyOpenFiles",
+      "create: TESSEL:netcdf:create:tooManyOpenFiles",
+      "open after a close: done",
+      "3 records of log.nc: intact"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         limit(RLIMIT_NOFILE, 40);
+         std::vector<int> ids;
+         const auto open = [&] { ids.push_back(idOf(netcdf()("open", story.file("log.nc"), "NOWRITE"))); };
+         std::string raised = "nothing";
+         while (raised == "nothing" && ids.size() < 100) {
+             raised = raisedBy(open);
+         }
+         story.note("open", raised);
+         story.tell("create", [&] { log::create(story.file("other.nc")); });
+         netcdf()("close", ids.back());
+         ids.pop_back();
+         story.tell("open after a close", open);
+         for (const int ncid : ids) {
+             netcdf()("close", ncid);
+         }
+         story.look("log.nc", 3);
+     }},
+    {"TheFileIsDeleted", // it lives on as long as it is open, as files do here
+     {"append: done", "sync: done", "close: done", "open: TESSEL:netcdf:open:noSuchFileOrDirectory"},
+     [](Story &story) {
+         const int ncid = story.openLog("log.nc");
+         unlink(story.file("log.nc").c_str());
+         story.appendAndClose(ncid);
+         story.tell("open", [&] { netcdf()("open", story.file("log.nc"), "NOWRITE"); });
+     }},
+    {"TheFileIsReplaced", // who has it open goes on with the old one
+     {"sync: done", "open before: 3 records", "open anew: 5 records", "read: done", "5 records of log.nc: intact"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         const int before = idOf(netcdf()("open", story.file("log.nc"), "NOWRITE"));
+         const int ncid = story.openLog("aside.nc");
+         log::appendSynchronised(ncid, 3, 5);
+         netcdf()("close", ncid);
+         std::filesystem::rename(story.file("aside.nc"), story.file("log.nc"));
+         story.tell("sync", [&] { netcdf()("sync", before); });
+         const int anew = idOf(netcdf()("open", story.file("log.nc"), "NOWRITE"));
+         story.note("open before", std::to_string(log::recordsOf(before)) + " records");
+         story.note("open anew", std::to_string(log::recordsOf(anew)) + " records");
+         story.tell("read", [&] { netcdf()("get_var_double", before, 0); });
+         story.look("log.nc", 5);
+     }},
+    {"TheFileIsOverwritten",
+     {"sync: TESSEL:netcdf:sync:notANetcdfFile", "close: done", "open: TESSEL:netcdf:open:notANetcdfFile"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         const int ncid = idOf(netcdf()("open", story.file("log.nc"), "NOWRITE"));
+         write(story.file("log.nc"), std::string(3 * log::recordBytes, 'z'));
+         story.tell("sync", [&] { netcdf()("sync", ncid); });
+         story.tell("close", [&] { netcdf()("close", ncid); });
+         story.tell("open", [&] { netcdf()("open", story.file("log.nc"), "NOWRITE"); });
+     }},
+    {"TheFileIsCutOff", // what is gone reads as 0: the library sees the end of the file and goes on
+     {"read: done", "the last value: 0", "2 records of log.nc: intact", "close: done"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         const int ncid = idOf(netcdf()("open", story.file("log.nc"), "NOWRITE"));
+         std::filesystem::resize_file(story.file("log.nc"), roomForThree - log::recordBytes);
+         Results read;
+         story.tell("read", [&] { read = netcdf()("get_var_double", ncid, 0); });
+         story.note("the last value", read[0].elements<double>().back() == 0 ? "0" : "another");
+         story.look("log.nc", 2);
+         story.tell("close", [&] { netcdf()("close", ncid); });
+     }},
+    {"TheFileIsEmptied",
+     {"read: done", "close: done", "open: TESSEL:netcdf:open:notANetcdfFile"},
+     [](Story &story) {
+         story.makeLog("log.nc");
+         const int ncid = idOf(netcdf()("open", story.file("log.nc"), "NOWRITE"));
+         std::filesystem::resize_file(story.file("log.nc"), 0);
+         story.tell("read", [&] { netcdf()("get_var_double", ncid, 0); });
+         story.tell("close", [&] { netcdf()("close", ncid); });
+         story.tell("open", [&] { netcdf()("open", story.file("log.nc"), "NOWRITE"); });
+     }},
+    {"TheMemoryIsLimited",
+     {"get_var_double: TESSEL:host:outOfMemory",
+      "get_vara_float: TESSEL:host:outOfMemory",
+      "get_vars_int: TESSEL:host:outOfMemory",
+      "get_var_text: TESSEL:host:outOfMemory",
+      "get_var1_double: done",
+      "close: done"},
+     readTooMuch},
+};
+// clang-format on
+
+class Surroundings : public testing::TestWithParam<Row> {};
+
+TEST_P(Surroundings, AreSurvived) {
+    constexpr bool sanitized =
+#ifdef __SANITIZE_ADDRESS__
+        true; // its own memory is far beyond any limit
+#else
+        false;
+#endif
+    const Row &row = GetParam();
+    if (sanitized && row.run == readTooMuch) {
+        GTEST_SKIP() << "the sanitizer's own memory is beyond the limit";
+    }
+    const Folder folder;
+    std::string expected;
+    for (const std::string &line : row.expected) {
+        expected += line + '\n';
+    }
+    const std::string said = inChild([&] {
+        Story story(folder);
+        try {
+            row.run(story);
+        } catch (const NotAllowed &why) {
+            return std::string("not allowed: ") + why.what();
+        }
+        return story.text();
+    });
+    if (said.starts_with("not allowed: ")) {
+        GTEST_SKIP() << said;
+    }
+    EXPECT_EQ(said, expected);
+}
+
+INSTANTIATE_TEST_SUITE_P(Rows, Surroundings, testing::ValuesIn(rows),
+                         [](const auto &row) { return row.param.name; });
+
+} // namespace
+} // namespace tessel::test
