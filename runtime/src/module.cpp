@@ -8,6 +8,7 @@
 
 #include <cxxabi.h>
 #include <dlfcn.h>
+#include <pthread.h>
 
 #include <algorithm>
 #include <cstdlib>
@@ -36,6 +37,21 @@ std::unique_lock<std::mutex> serialised() {
     return CallFrame::current() == nullptr ? std::unique_lock(callLock)
                                            : std::unique_lock<std::mutex>();
 }
+
+/// A fork waits for the call in progress, so that no child begins with a lock that nobody will open
+/// or with a library that has stopped halfway. A thread that forks within its own call has the lock.
+void lockForFork() {
+    if (CallFrame::current() == nullptr) {
+        callLock.lock();
+    }
+}
+void unlockAfterFork() {
+    if (CallFrame::current() == nullptr) {
+        callLock.unlock();
+    }
+}
+[[maybe_unused]] const int forkHandlers =
+    pthread_atfork(lockForFork, unlockAfterFork, unlockAfterFork);
 
 [[noreturn]] void raiseLoadError(const HostError &error, const std::string &name,
                                  std::string_view detail = {}) {

@@ -1,0 +1,169 @@
+// tests/threads/loading.cpp: modules that come and go, and two at once.
+// Usage: threads_loading [TIMES]
+//
+// The netCDF module is loaded and unloaded by threads that end afterwards, which is when functions
+// run that the library has left behind. Memory and descriptors must not grow with the number of
+// times.
+#include "tessel/runtime.hpp"
+
+#include <unistd.h>
+
+#include <array>
+#include <atomic>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <stdexcept>
+#include <string>
+#include <thread>
+#include <vector>
+
+namespace {
+
+using tessel::Module;
+using tessel::Results;
+
+void want(bool holds, const char *what) {
+    if (!holds) {
+        throw std::runtime_error(what);
+    }
+}
+
+std::size_t openDescriptors() {
+    const std::filesystem::directory_iterator descriptors("/proc/self/fd");
+    return static_cast<std::size_t>(std::distance(begin(descriptors), end(descriptors)));
+}
+
+/// The resident memory in megabytes.
+double residentMegabytes() {
+    std::size_t total = 0;
+    std::size_t resident = 0;
+    std::ifstream("/proc/self/statm") >> total >> resident;
+    return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / 1e6;
+}
+
+/// A folder that is removed with what is in it.
+class Folder {
+  public:
+    Folder() {
+        std::string pattern = (std::filesystem::temp_directory_path() / "loading-XXXXXX").string();
+        want(mkdtemp(pattern.data()) != nullptr, "cannot make a temporary folder");
+        path = pattern;
+    }
+    ~Folder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(path, ignored);
+    }
+    Folder(const Folder &) = delete;
+    Folder &operator=(const Folder &) = delete;
+
+    std::filesystem::path path;
+};
+
+/// A new dataset with one dimension of the given length; open.
+double create(const Module &netcdf, const std::string &file, double length) {
+    const double ncid = netcdf("create", file, "CLOBBER")[0].number();
+    netcdf("def_dim", ncid, "x", length);
+    netcdf("enddef", ncid);
+    return ncid;
+}
+
+double lengthIn(const Module &netcdf, double ncid) {
+    return netcdf("inq_dim", ncid, 0)[1].number();
+}
+
+void loadUseAndUnload(const std::string &file) {
+    const Module netcdf{TESSEL_NETCDF_MODULE};
+    const double ncid = create(netcdf, file, 7);
+    want(lengthIn(netcdf, ncid) == 7, "another length");
+    netcdf("close", ncid);
+}
+
+/// Loads and unloads, in one thread and then in several, while others call another module.
+void comeAndGo(const std::filesystem::path &folder, std::size_t times) {
+    for (std::size_t i = 0; i < 20; ++i) { // what is allocated once is there afterwards
+        loadUseAndUnload(folder / "warm.nc");
+    }
+    const std::size_t descriptors = openDescriptors();
+    const double before = residentMegabytes();
+    const Module counter{TESSEL_COUNTER_MODULE};
+    std::atomic<bool> done = false;
+    std::atomic<std::size_t> counted = 0;
+    std::atomic<std::size_t> faults = 0;
+    std::thread calling([&] {
+        while (!done) {
+            counter("count");
+            ++counted;
+        }
+    });
+    std::vector<std::thread> loading;
+    for (std::size_t thread = 0; thread < 2; ++thread) {
+        loading.emplace_back([&, thread] {
+            try {
+                for (std::size_t i = 0; i < times / 2; ++i) {
+                    loadUseAndUnload(folder / (std::to_string(thread) + ".nc"));
+                }
+            } catch (const std::exception &error) {
+                std::fprintf(stderr, "%s\n", error.what());
+                ++faults;
+            }
+        });
+    }
+    for (std::thread &thread : loading) {
+        thread.join();
+    }
+    done = true;
+    calling.join();
+    const double grown = residentMegabytes() - before;
+    std::printf("loaded and unloaded %zu times beside %zu calls of another module: %.1f MB more\n",
+                times, counted.load(), grown);
+    want(faults == 0, "a thread has met a fault");
+    want(counted > 0, "the other module was never called");
+    want(counter("count")[0].number() == static_cast<double>(counted + 1), "a call was lost");
+    want(openDescriptors() == descriptors, "descriptors are open that were not");
+    // What other threads' heaps keep is some megabytes; a leak would be as much each time.
+    want(grown < 8 + 0.01 * static_cast<double>(times), "memory grows with each loading");
+}
+
+/// Two files with the same module are two modules over one library: an id belongs to the process,
+/// and either may close what the other has opened.
+void twoAtOnce(const std::filesystem::path &folder) {
+    const std::filesystem::path copy = folder / "copy.tsx";
+    std::filesystem::copy_file(TESSEL_NETCDF_MODULE, copy);
+    auto second = std::make_unique<const Module>(copy);
+    const Module first{TESSEL_NETCDF_MODULE};
+    std::atomic<std::size_t> faults = 0;
+    const auto work = [&](const Module &one, const Module &other, const std::string &file,
+                          double length) {
+        for (std::size_t i = 0; i < 200; ++i) {
+            const double ncid = create(one, file, length);
+            faults += lengthIn(other, ncid) == length ? 0 : 1;
+            other("close", ncid);
+        }
+    };
+    std::thread ahead([&] { work(first, *second, folder / "ahead.nc", 3); });
+    std::thread back([&] { work(*second, first, folder / "back.nc", 5); });
+    ahead.join();
+    back.join();
+    want(faults == 0, "a module does not see the other's dataset");
+    const double ncid = create(*second, folder / "left.nc", 4);
+    second.reset();
+    want(lengthIn(first, ncid) == 4, "a dataset went with the module that had opened it");
+    first("close", ncid);
+    std::printf("two modules at once: 400 datasets of one closed by the other\n");
+}
+
+} // namespace
+
+int main(int argc, char **argv) try {
+    const std::size_t times = argc > 1 ? std::stoul(argv[1]) : 200;
+    const Folder folder;
+    comeAndGo(folder.path, times);
+    twoAtOnce(folder.path);
+    return EXIT_SUCCESS;
+} catch (const std::exception &error) {
+    std::fprintf(stderr, "%s\n", error.what());
+    return EXIT_FAILURE;
+}
