@@ -156,7 +156,11 @@ class Dataset:
         self._netcdf = tessel.load("netcdf")
         self.path = paths.given(path)
         self.place = paths.absolute(self.path)
-        self.ncid = self._netcdf("open", self.path, "NOWRITE")
+        self.ncid = self._open()
+
+    def _open(self) -> int:
+        """Opens the file for reading."""
+        return self._netcdf.open(self.path, "NOWRITE")
 
     def __enter__(self) -> Dataset:
         return self

@@ -55,10 +55,10 @@ BUILT_INS: dict[type[Exception], str] = {
         unlimitedDimensionInTheWrongIndex onlyOneUnlimitedDimensionAllowed libraryMaxDimsExceeded
         maximumNumberOfAttributesExceeded maximumNumberOfVariablesExceeded
         actionProhibitedOnGlobalVarid mathArgumentOutOfDomainOfFunc
-        badBlockSize badDimensions badFormat badModuleName badOutputCount badShape
-        badGuard badPath characterTooLarge differentFields dimensionsTooLarge missingInput
+        badBlockSize badDimensions badEncoding badFormat badMode badModuleName badOutputCount
+        badShape badGuard badPath characterTooLarge differentFields dimensionsTooLarge missingInput
         nestedTooDeeply notExact nothingToDraw notText readOnlyArray recordsWithoutVariables
-        shapeTooLarge tooManyDimensions
+        shapeTooLarge tooManyDimensions valueDoesNotFit
         """,
     OverflowError: """
         mathResultNotRepresentable packUpSizetScalar integerTooLarge notRepresentable
@@ -75,8 +75,8 @@ BUILT_INS: dict[type[Exception], str] = {
     # An unknown status is one that the module's table of statuses leaves out: those of the HDF5
     # layer, which all come from what is in a file or from reading and writing it.
     OSError: """
-        notANetcdfFile notAClassicFile notARegularFile corruptedFile fileTooShort sameFile
-        unknownErrorStatus
+        notANetcdfFile notAClassicFile notARegularFile corruptedFile fileChanged fileTooShort
+        sameFile unknownErrorStatus
         """,
     ModuleNotFoundError: "moduleNotFound",
     ImportError: "notAModule noEntryPoint",

@@ -3,59 +3,95 @@
 
 from __future__ import annotations
 
+from collections.abc import Callable
 from typing import Any
 
 import numpy as np
 from xarray.backends import BackendArray, CachingFileManager
 from xarray.core import indexing
 
+import tessel
 from tessel.dataset import Variable
+from tessel.xarray import planning
+from tessel.xarray.opening import FileWasClosed, OpenFile
 
 DTYPES = {"schar": "i1", "text": "S1", "short": "i2", "int": "i4", "float": "f4", "double": "f8"}
 """The dtype by the member of the typed families that reads a variable."""
 
+# A character takes two bytes in the host, one in its buffer, and four in Python.
+_MEMORY_OF_CHARACTER = 12
+
 
 class LazyArray(BackendArray):
-    """A variable of a file."""
+    """A variable of a file: a `planning.Reader`. It reads from whatever open file the manager has
+    for it, so it can be pickled, and the file can be closed and opened in between."""
 
-    def __init__(self, manager: CachingFileManager, variable: Variable) -> None:
+    def __init__(self, manager: CachingFileManager, variable: Variable, mapped: bool) -> None:
         self._manager = manager
-        self._varid = variable.varid
-        self._member = variable.type.member
+        self._name = variable.name
+        self._type = variable.type
+        self._in_records = any(each.unlimited for each in variable.dimensions[:1])
         self.shape = variable.shape
-        self.dtype = np.dtype(DTYPES[self._member])
+        self.dtype = np.dtype(DTYPES[str(variable.type.member)])
+        self.memory = _MEMORY_OF_CHARACTER if variable.is_text else self.dtype.itemsize
+        self.costs = planning.COSTS[mapped, variable.is_text]
 
     def __getitem__(self, key: indexing.ExplicitIndexer) -> np.ndarray:
-        return indexing.explicit_indexing_adapter(
-            key, self.shape, indexing.IndexingSupport.BASIC, self._read)
+        if isinstance(key, indexing.VectorizedIndexer):
+            return indexing.explicit_indexing_adapter(
+                key, self.shape, indexing.IndexingSupport.OUTER, self._read)
+        return self._read(key.tuple)
 
-    def _read(self, key: tuple[Any, ...]) -> np.ndarray:
-        start, count, step, dropped = [], [], [], []
-        for axis, (each, length) in enumerate(zip(key, self.shape)):
-            if not isinstance(each, slice):
-                each = slice(int(each), int(each) + 1)
-                dropped.append(axis)
-            places = range(length)[each]
-            start.append(places.start)
-            count.append((len(places) - 1) * places.step + 1 if places else 0)
-            step.append(slice(None, None, places.step))
-        values = self._block(start, count)[tuple(step)]
-        return values.squeeze(tuple(dropped))
+    def _read(self, key: tuple[planning.Selector, ...]) -> np.ndarray:
+        return planning.read(self, key)
 
-    def _block(self, start: list[int], count: list[int]) -> np.ndarray:
-        if 0 in count:
-            return np.empty(count, self.dtype)
-        while True:
-            file = self._manager.acquire()
-            with file.lock:
-                if file.is_open:
-                    break
-        if count:
-            values = file.call(f"get_vara_{self._member}", self._varid, start[::-1], count[::-1])
-        else:
-            values = file.call(f"get_var_{self._member}", self._varid)
-        if self._member == "text":
-            if isinstance(values, str):
-                values = np.array(list(values), "U1")
-            values = values.view(np.uint32).astype(np.uint8).view("S1")
+    def block(self, start: list[int], count: list[int]) -> np.ndarray:
+        """The values of a block."""
+        if not count:
+            return self._values(count, "get_var")
+        return self._values(count, "get_vara", start, count)
+
+    def strided(self, start: list[int], count: list[int], step: list[int]) -> np.ndarray:
+        """Every n-th value from a start on."""
+        return self._values(count, "get_vars", start, count, step)
+
+    def _values(self, count: list[int], family: str, *places: list[int]) -> np.ndarray:
+        def read(file: OpenFile) -> Any:
+            return file.read(f"{family}_{self._type.member}", self._varid(file), *places)
+
+        values = self._with_file(read)
+        if self._type.member == "text":
+            values = _bytes(values)
         return values.reshape(count[::-1], order="F").T
+
+    def _with_file(self, use: Callable[[OpenFile], Any]) -> Any:
+        """What a use of the open file gives. The cache may close the file for another one before it
+        begins, but not while it goes on."""
+        while True:
+            try:
+                return use(self._manager.acquire())
+            except FileWasClosed:
+                continue
+
+    def _varid(self, file: OpenFile) -> int:
+        """The number of the variable, which must be what it was: since the dataset was opened, the
+        file may have been opened again, and be another one. More records do not matter."""
+        place = file.place_of(self._name)
+        shape = place.shape
+        if self._in_records and shape[:1] >= self.shape[:1]:
+            shape = self.shape[:1] + shape[1:]
+        if place.xtype != self._type.number or shape != self.shape:
+            raise tessel.Error("TESSEL:python:fileChanged",
+                               f"The variable {self._name} is not any more what it was when the "
+                               "dataset was opened.", path=file.place)
+        return place.varid
+
+
+def _bytes(characters: str | np.ndarray) -> np.ndarray:
+    """Characters as bytes: the low byte of a host character is the byte in the file."""
+    if isinstance(characters, str):
+        encoded = characters.encode("utf-16-le", "surrogatepass")
+        codes = np.frombuffer(encoded, np.uint16)
+    else:
+        codes = characters.ravel(order="F").view(np.uint32)
+    return codes.astype(np.uint8).view("S1").reshape(np.shape(characters) or -1, order="F")

@@ -14,9 +14,10 @@ from xarray.core import indexing
 from xarray.core.utils import FrozenDict
 
 import tessel
+from tessel import paths
 from tessel.dataset import Attribute, Variable
 from tessel.xarray.array import LazyArray
-from tessel.xarray.opening import OpenFile, normalized
+from tessel.xarray.opening import OpenFile
 
 
 class TesselDataStore(AbstractDataStore):
@@ -29,8 +30,10 @@ class TesselDataStore(AbstractDataStore):
     @classmethod
     def open(cls, path: str | os.PathLike[Any]) -> TesselDataStore:
         """The store of a file."""
-        path = normalized(path)
-        return cls(CachingFileManager(OpenFile, path), path)
+        given = paths.given(path)
+        if "://" not in given:
+            given = paths.absolute(os.path.expanduser(given))
+        return cls(CachingFileManager(OpenFile, given), given)
 
     @property
     def file(self) -> OpenFile:
@@ -43,7 +46,7 @@ class TesselDataStore(AbstractDataStore):
                           for name, each in self.file.variables.items())
 
     def _variable(self, variable: Variable) -> XarrayVariable:
-        array = LazyArray(self._manager, variable)
+        array = LazyArray(self._manager, variable, self.file.mapped)
         attributes = _values(variable.attributes)
         if variable.is_text and isinstance(attributes.get("_FillValue"), str):
             # Beside characters, which are bytes, it is bytes.
