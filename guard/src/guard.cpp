@@ -8,6 +8,8 @@
 
 #include "tessel/array.h"
 
+#include <sys/mman.h>
+
 #include <algorithm>
 #include <array>
 #include <cctype>
@@ -21,6 +23,7 @@ namespace {
 constexpr int userFormats = 0x40 | 0x80; // what belongs to them cannot be registered here
 constexpr int inMemory = 0x8000;         // the file's name stands for memory that is not there
 constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fails by itself
+constexpr int mapped = 0x10;                              // the file is kept in memory
 constexpr int hdf5 = 0x1000;
 constexpr int noFill = 0x100;
 constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
@@ -75,11 +78,22 @@ bool lookAtOpening(std::string_view path, int flags) {
     return found.classic;
 }
 
+/// Whether so much memory can be mapped.
+bool isMappable(std::uint64_t bytes) {
+    void *const memory =
+        mmap(nullptr, bytes, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    return memory != MAP_FAILED && munmap(memory, bytes) == 0;
+}
+
 /// Whether the file will be of a classic format.
-bool lookAtCreation(int flags) {
+bool lookAtCreation(int flags, std::uint64_t initialSize) {
     if ((flags & userFormats) != 0) {
         refuse(mode, "the flag " + std::to_string(flags & userFormats) +
                          " (a user-defined format) is set");
+    }
+    if ((flags & mapped) != 0 && initialSize > 0 && !isMappable(initialSize)) {
+        refuse(mode, "the flag 16 (NC_MMAP) is set, and there is no memory for " +
+                         std::to_string(initialSize) + " bytes");
     }
     const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
                                          datasets().defaultFormat) != hdf5Formats.end();
@@ -246,7 +260,10 @@ class Guard : public Watcher {
             lookAtName(path, options);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
-            classic = kind == Kind::open ? lookAtOpening(path, flags) : lookAtCreation(flags);
+            classic =
+                kind == Kind::open
+                    ? lookAtOpening(path, flags)
+                    : lookAtCreation(flags, inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0);
             return;
         }
         const auto ncid = integer(inputs[1]);

@@ -25,8 +25,8 @@ enum : std::uint32_t { dimensionList = 10, variableList = 11, attributeList = 12
 /// The bytes of an element of each external type; the numbers of the types begin with 1.
 constexpr std::array<unsigned, 12> typeSizes = {0, 1, 1, 2, 4, 4, 8, 1, 2, 4, 8, 8};
 
-/// Nothing more can be said: the file ends within its header, or is not of these formats. The
-/// library says so itself.
+/// Nothing more can be said: the file is not of these formats, or cannot be read. The library says
+/// so itself.
 struct Ended {};
 
 /// The claim that is not to be trusted.
@@ -62,15 +62,14 @@ class Reader {
         return value;
     }
 
-    void skip(std::uint64_t bytes) {
-        if (bytes > left()) {
-            throw Ended{};
-        }
-        position += bytes;
-    }
+    /// The library reads on behind the end of the file, where it finds zeros.
+    void skip(std::uint64_t bytes) noexcept { position += std::min(bytes, left()); }
 
   private:
     unsigned char byte() {
+        if (left() == 0) {
+            return 0;
+        }
         if (position < start || position >= start + buffered) {
             fill();
         }
@@ -78,9 +77,6 @@ class Reader {
     }
 
     void fill() {
-        if (left() == 0) {
-            throw Ended{};
-        }
         const ssize_t got = pread(file, buffer.data(), buffer.size(), static_cast<off_t>(position));
         if (got <= 0) {
             throw Ended{};
@@ -114,12 +110,12 @@ class Walk {
         }
         found.classic = true;
         reader.skip(countSize); // the number of records
-        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0; --n) {
+        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.left() > 0; --n) {
             name();
             reader.skip(countSize);
         }
         attributes();
-        for (std::uint64_t n = list(variableList, "variables"); n > 0; --n) {
+        for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.left() > 0; --n) {
             variable();
         }
     }
@@ -138,7 +134,7 @@ class Walk {
     std::uint64_t list(std::uint32_t tag, std::string_view what) {
         const std::uint64_t found = reader.number(4);
         const std::uint64_t n = count(what);
-        if (found != tag && (found != 0 || n != 0)) {
+        if (found != tag && n != 0) { // of an empty list the library looks at no tag
             throw Ended{};
         }
         return n;
@@ -154,13 +150,10 @@ class Walk {
     }
 
     void attributes() {
-        for (std::uint64_t n = list(attributeList, "attributes"); n > 0; --n) {
+        for (std::uint64_t n = list(attributeList, "attributes"); n > 0 && reader.left() > 0; --n) {
             name();
-            const std::uint64_t type = reader.number(4);
+            const std::uint64_t type = externalType();
             const std::uint64_t values = count("values in an attribute");
-            if (type >= typeSizes.size()) {
-                throw Ended{};
-            }
             reader.skip(padded(values * typeSizes[static_cast<std::size_t>(type)]));
         }
     }
@@ -175,7 +168,21 @@ class Walk {
         }
         reader.skip(dimensions * countSize);
         attributes();
-        reader.skip(4 + countSize + offsetSize); // type, size, place
+        externalType();
+        reader.skip(countSize + offsetSize); // size and place
+    }
+
+    /// The type after the last one is known to the library, which gives it the size 0 and divides
+    /// by that. Others that the formats do not have are refused by the library.
+    std::uint64_t externalType() {
+        const std::uint64_t type = reader.number(4);
+        if (type == typeSizes.size()) {
+            throw Distrusted{"has the type " + std::to_string(type) + ", which has no size"};
+        }
+        if (type > typeSizes.size()) {
+            throw Ended{};
+        }
+        return type;
     }
 
     static std::uint64_t padded(std::uint64_t bytes) noexcept { return (bytes + 3) / 4 * 4; }

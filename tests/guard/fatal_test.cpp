@@ -12,6 +12,8 @@
 namespace tessel::test {
 namespace {
 
+using namespace std::string_literals;
+
 constexpr double wraps = -1; // as a count: 2^64-1
 
 struct Fatal {
@@ -48,6 +50,10 @@ void writeStrided(const Module &netcdf, const Folder &folder, const char *operat
     }
 }
 
+int open(const Module &netcdf, const Folder &folder, const std::string &bytes) {
+    return intOf(netcdf("open", folder.with("a.nc", bytes), "NOWRITE"));
+}
+
 /// In define mode, with a variable.
 int definingDataset(const Module &netcdf, const Folder &folder) {
     const int ncid = newDataset(netcdf, folder.file("a.nc"));
@@ -81,6 +87,27 @@ const Fatal rows[] = {
     {"TunedOpenInMemory", "TESSEL:guard:mode", "the flag 32768",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("nc__open", folder.file("a.nc"), 32768 + 1, 1024);
+     }},
+    {"CreateInMoreMemoryThanThereIs", "TESSEL:guard:mode",
+     "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
+     }},
+    {"OpenOfATypeWithoutSize", "TESSEL:guard:header", "has the type 12",
+     [](const Module &netcdf, const Folder &folder) {
+         open(netcdf, folder,
+              "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) +
+                  "v\0\0\0"s + words({1, 0, 0, 0, 12, 4, 100}));
+     }},
+    {"OpenOfVariablesBehindAnEmptyListWithAnotherTag", "TESSEL:guard:header",
+     "has 268435456 variables",
+     [](const Module &netcdf, const Folder &folder) {
+         open(netcdf, folder, "CDF\1" + words({0, 0, 0, 11, 0, 11, 0x10000000}));
+     }},
+    {"NameWhoseLengthTheFileEndsIn", "TESSEL:guard:header", "characters in a name",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),
+                0);
      }},
     {"CloseAfterACloseThatFailed", "TESSEL:guard:closed", "a.nc\"",
      [](const Module &netcdf, const Folder &folder) {

@@ -12,36 +12,19 @@ namespace {
 
 using namespace std::string_literals;
 
-/// A number as the formats store it: four bytes, the highest first.
-std::string big(std::uint32_t value) {
-    std::string bytes;
-    for (const unsigned shift : {24U, 16U, 8U, 0U}) {
-        bytes += static_cast<char>(value >> shift & 0xFFU);
-    }
-    return bytes;
-}
-
-std::string words(std::initializer_list<std::uint32_t> values) {
-    std::string bytes;
-    for (const std::uint32_t value : values) {
-        bytes += big(value);
-    }
-    return bytes;
-}
-
-const std::string classic = "CDF\1"s + big(0); // no records
+const std::string classic = "CDF\1"s + words({0}); // no records
 const std::string nothing = words({0, 0});
-const std::string oneDimension = words({10, 1, 1}) + "x\0\0\0"s + big(1);
+const std::string oneDimension = words({10, 1, 1}) + "x\0\0\0"s + words({1});
 const std::string room(600, '\0');
 
 /// A variable of n dimensions, all of them the one of length 1.
-std::string variableOf(std::uint32_t n) {
+std::string variableOf(std::uint32_t n, std::uint32_t type = 4) {
     std::string ids;
     for (std::uint32_t i = 0; i < n; ++i) {
-        ids += big(0);
+        ids += words({0});
     }
-    return classic + oneDimension + nothing + words({11, 1, 1}) + "v\0\0\0"s + big(n) + ids +
-           nothing + words({4, 4, 20000}) + room;
+    return classic + oneDimension + nothing + words({11, 1, 1}) + "v\0\0\0"s + words({n}) + ids +
+           nothing + words({type, 4, 20000}) + room;
 }
 
 /// An attribute of the dataset, with its name, and its type and number of values.
@@ -87,7 +70,14 @@ const std::vector<Claim> claims = {
     {"VariableOf1024Dimensions", variableOf(1024), opens},
     {"VariableOf1025Dimensions", variableOf(1025), refused,
      "has a variable of 1025 dimensions, where 1024 are the most"},
-    {"LargeOffsets", "CDF\2"s + big(0) + words({10, 0x40000000}) + room, refused, "dimensions"},
+    {"VariableOfATypeWithoutSize", variableOf(1, 12), refused, "has the type 12"},
+    {"VariableOfNoType", variableOf(1, 13), "TESSEL:netcdf:open:invalidArgument"},
+    {"AttributeOfATypeWithoutSize", attributeNamed("long", 12, 1), refused, "has the type 12"},
+    {"EmptyListWithAnotherTag", classic + nothing + words({7, 0}) + words({11, 0x10000000}) + room,
+     refused, "has 268435456 variables"},
+    {"CountThatTheFileEndsIn", classic + words({10}) + "\0\x20"s, refused,
+     "has 2097152 dimensions, where the file has 0 bytes left"},
+    {"LargeOffsets", "CDF\2"s + words({0}) + words({10, 0x40000000}) + room, refused, "dimensions"},
     {"LargeCounts", "CDF\5"s + words({0, 0, 10, 1, 0}) + room, refused,
      "has 4294967296 dimensions"},
     {"OtherFormat", "CDF\7"s + words({10, 0x40000000}) + room, "TESSEL:netcdf:open:notANetcdfFile"},

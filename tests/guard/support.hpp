@@ -5,8 +5,10 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdint>
 #include <filesystem>
 #include <fstream>
+#include <initializer_list>
 #include <string>
 #include <string_view>
 
@@ -58,6 +60,17 @@ class Folder {
 
 inline int intOf(const Results &results) {
     return static_cast<int>(results[results.size() - 1].number());
+}
+
+/// Numbers as the formats store them: four bytes, the highest first.
+inline std::string words(std::initializer_list<std::uint32_t> values) {
+    std::string bytes;
+    for (const std::uint32_t value : values) {
+        for (const unsigned shift : {24U, 16U, 8U, 0U}) {
+            bytes += static_cast<char>(value >> shift & 0xFFU);
+        }
+    }
+    return bytes;
 }
 
 constexpr double ncDouble = 6;
