@@ -101,11 +101,13 @@ void writeCoordinates(int ncid, const char *name, const std::vector<std::size_t>
     for (std::size_t i = 0; i < size; ++i) {
         std::size_t rest = i;
         std::size_t block = size;
+        std::size_t number = 0;
         for (const std::size_t length : lengths) {
             block /= length;
-            values[i] = values[i] * 100.0 + static_cast<double>(rest / block);
+            number = number * 100 + rest / block;
             rest %= block;
         }
+        values[i] = static_cast<double>(number);
     }
     const std::vector<std::size_t> start(lengths.size());
     want(nc_put_vara_double(ncid, variableID(ncid, name), start.data(), lengths.data(),
