@@ -196,7 +196,7 @@ Results Module::call(std::span<const tsArray *> inputs, const CallOptions &optio
     if (!watcher) {
         return run(inputs, options);
     }
-    watcher->before(inputs, Ask(*this));
+    orOutOfMemory([&] { watcher->before(inputs, Ask(*this)); });
     try {
         Results results = run(inputs, options);
         watcher->after(inputs, results, nullptr);
