@@ -1,12 +1,16 @@
 // tests/faults/killed.cpp: a writer is killed at random moments, and nothing is lost that it had
-// synchronised. Usage: faults_killed [--kills N] [--seed S] [--early 1]
+// synchronised. Usage: faults_killed [--kills N] [--seed S] [--writer NAME]
 //
-// A child appends records to a log and synchronises, and says through a pipe how many records are
-// synchronised. It is killed while it does so. Then the file is opened and every record that the
-// child had said to be synchronised must be there with its values. What the file has beyond them is
-// counted: records that were being written when the end came, which are promised to nobody.
+// A child writes to a log and says through a pipe how many records are synchronised. It is killed
+// while it does so. Then the file is opened, and every record that the child had said to be
+// synchronised must be there with its values. What the file has beyond them is counted: records
+// that were being written when the end came, which are promised to nobody. The writers:
 //
-// With --early 1 the writer speaks of a record before it is synchronised. That must be noticed.
+//   append    appends records and synchronises
+//   early     speaks of a record before it is synchronised, which must be noticed
+//   redefine  changes the length of the header of a log all the time, so that its data move; that
+//             loses records, which must be noticed too
+//   roomy     does the same with a header that was given room to grow, which loses nothing
 #include "support.hpp"
 
 #include <sys/wait.h>
@@ -25,23 +29,98 @@
 namespace tessel::test {
 namespace {
 
+/// Where a writer says how many records are synchronised.
+class Report {
+  public:
+    explicit Report(int pipeEnd) : end(pipeEnd) {}
+
+    void operator()(std::size_t synchronised) const {
+        if (write(end, &synchronised, sizeof synchronised) != sizeof synchronised) {
+            throw std::runtime_error("nobody listens");
+        }
+    }
+
+  private:
+    int end;
+};
+
+/// Synchronises after two records, after one, after two, and so on.
+void append(const std::string &file, const Report &report) {
+    const int ncid = log::create(file);
+    netcdf()("sync", ncid);
+    for (std::size_t record = 0;; ++record) {
+        log::append(ncid, record);
+        if (record % 3 != 1) {
+            netcdf()("sync", ncid);
+            report(record + 1);
+        }
+    }
+}
+
+void early(const std::string &file, const Report &report) {
+    const int ncid = log::create(file);
+    netcdf()("sync", ncid);
+    for (std::size_t record = 0;; ++record) {
+        log::append(ncid, record);
+        report(record + 1);
+        netcdf()("sync", ncid);
+    }
+}
+
+void redefineFor(const std::string &file, const Report &report, std::size_t headerRoom) {
+    constexpr std::size_t records = 3;
+    const int ncid = log::create(file, headerRoom);
+    log::appendSynchronised(ncid, 0, records);
+    for (std::size_t length = 500;; length += 10) {
+        report(records);
+        netcdf()("redef", ncid);
+        netcdf()("put_att_text", ncid, -1, "title", std::string(length % 3000, 't'));
+        netcdf()("enddef", ncid);
+        netcdf()("sync", ncid);
+    }
+}
+
+void redefine(const std::string &file, const Report &report) {
+    redefineFor(file, report, 0);
+}
+
+void roomy(const std::string &file, const Report &report) {
+    redefineFor(file, report, 4000);
+}
+
+struct Writer {
+    std::string_view name;
+    void (*write)(const std::string &file, const Report &report);
+};
+constexpr Writer writers[] = {
+    {"append", append}, {"early", early}, {"redefine", redefine}, {"roomy", roomy}};
+
 struct Options {
     std::size_t kills = 20;
     unsigned seed = 1;
-    bool early = false;
+    Writer writer = writers[0];
 };
+
+Writer writerOf(std::string_view name) {
+    for (const Writer &writer : writers) {
+        if (writer.name == name) {
+            return writer;
+        }
+    }
+    throw std::invalid_argument("unknown writer " + std::string(name));
+}
 
 Options optionsOf(int argc, char **argv) {
     Options options;
     for (int i = 1; i + 1 < argc; i += 2) {
         const std::string_view name = argv[i];
-        const unsigned long value = std::stoul(argv[i + 1]);
+        const char *const value = argv[i + 1];
         if (name == "--kills") {
-            options.kills = value;
+            options.kills = std::stoul(value);
         } else if (name == "--seed") {
-            options.seed = static_cast<unsigned>(value);
-        } else if (name == "--early") {
-            options.early = value != 0;
+            options.seed = static_cast<unsigned>(std::stoul(value));
+        } else if (name == "--writer") {
+            options.writer = writerOf(value);
         } else {
             throw std::invalid_argument("unknown option " + std::string(name));
         }
@@ -55,35 +134,8 @@ struct Killed {
     bool byUs = false;            ///< it was killed, and did not end by itself
 };
 
-/// Appends for ever. Every third synchronisation comes after several records.
-[[noreturn]] void writeForEver(const std::string &file, int report, bool early) {
-    try {
-        const int ncid = log::create(file);
-        netcdf()("sync", ncid);
-        for (std::size_t record = 0;; ++record) {
-            log::append(ncid, record);
-            if (record % 3 == 1) {
-                continue;
-            }
-            const std::size_t synchronised = record + 1;
-            if (!early) {
-                netcdf()("sync", ncid);
-            }
-            if (write(report, &synchronised, sizeof synchronised) != sizeof synchronised) {
-                _exit(2);
-            }
-            if (early) {
-                netcdf()("sync", ncid);
-            }
-        }
-    } catch (const std::exception &error) {
-        std::fprintf(stderr, "%s\n", error.what());
-        _exit(1);
-    }
-}
-
 /// Starts a writer and kills it some time after its first report.
-Killed kill(const std::string &file, std::chrono::microseconds after, bool early) {
+Killed kill(const Writer &writer, const std::string &file, std::chrono::microseconds after) {
     std::array<int, 2> ends{};
     if (pipe(ends.data()) != 0) {
         throw std::runtime_error("no pipe");
@@ -91,7 +143,12 @@ Killed kill(const std::string &file, std::chrono::microseconds after, bool early
     const pid_t child = fork();
     if (child == 0) {
         close(ends[0]);
-        writeForEver(file, ends[1], early);
+        try {
+            writer.write(file, Report(ends[1]));
+        } catch (const std::exception &error) {
+            std::fprintf(stderr, "%s\n", error.what());
+        }
+        _exit(1); // it was to go on until it is killed
     }
     close(ends[1]);
     Killed killed;
@@ -137,7 +194,7 @@ int run(const Options &options) {
         const Folder folder;
         const std::string file = folder.file("log.nc");
         const auto after = std::chrono::microseconds(microseconds(lot));
-        const Killed killed = kill(file, after, options.early);
+        const Killed killed = kill(options.writer, file, after);
         if (!killed.byUs || killed.synchronised == 0) {
             std::printf("kill %zu: the writer ended by itself\n", n);
             ++faults;

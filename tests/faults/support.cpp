@@ -48,12 +48,13 @@ Array pair(std::size_t first, std::size_t second) {
 
 } // namespace
 
-int create(const std::string &file) {
+int create(const std::string &file, std::size_t headerRoom) {
     const int ncid = idOf(netcdf()("create", file, "CLOBBER"));
     const Results time = netcdf()("def_dim", ncid, "time", 0);
     const Results x = netcdf()("def_dim", ncid, "x", static_cast<double>(width));
     netcdf()("def_var", ncid, "log", ncDouble, Array::row({x[0].number(), time[0].number()}));
-    netcdf()("enddef", ncid);
+    constexpr int alignment = 4; // of the data, as the format wants it
+    netcdf()("_enddef", ncid, static_cast<double>(headerRoom), alignment, 0, alignment);
     return ncid;
 }
 

@@ -52,8 +52,9 @@ namespace log {
 constexpr std::size_t width = 2500;
 constexpr std::size_t recordBytes = width * sizeof(double);
 
-/// A new file with a log without records; its id, out of define mode.
-int create(const std::string &file);
+/// A new file with a log without records; its id, out of define mode. The header may be given room
+/// to grow, in bytes.
+int create(const std::string &file, std::size_t headerRoom = 0);
 
 void append(int ncid, std::size_t record);
 
