@@ -322,10 +322,16 @@ class Guard : public Watcher {
         datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
     }
 
+    /// In data mode, a classic dataset whose end failed (the disk is full) is as it was, and can be
+    /// ended again.
+    static bool survivesItsEnd(const Dataset &dataset) noexcept {
+        return dataset.classic && !dataset.defining;
+    }
+
     static void rememberEnd(int ncid, Dataset &dataset, const Error *error) {
         if (error == nullptr || error->identifier().ends_with(":notNetcdfID")) {
             datasets().remove(ncid);
-        } else if (error->identifier().starts_with("TESSEL:netcdf:")) {
+        } else if (error->identifier().starts_with("TESSEL:netcdf:") && !survivesItsEnd(dataset)) {
             dataset.dead = true;
             datasets().anyDead = true;
         }

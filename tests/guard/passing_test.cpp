@@ -2,6 +2,9 @@
 // watcher itself.
 #include "support.hpp"
 
+#include <sys/resource.h>
+
+#include <csignal>
 #include <cstddef>
 #include <functional>
 #include <ostream>
@@ -222,6 +225,38 @@ TEST(ClosedDatasets, AreRefusedToEveryOperation) {
               "TESSEL:guard:closed");
     EXPECT_EQ(identifierOf([&] { netcdf("inq", other); }), "");
     netcdf("close", other);
+}
+
+/// What a call raises while files cannot grow beyond 64 KiB.
+template <class Call>
+std::string identifierOnFullDisk(const Call &call) {
+    rlimit before{};
+    getrlimit(RLIMIT_FSIZE, &before);
+    const rlimit full = {rlim_t{1} << 16U, before.rlim_max};
+    auto *const handler = std::signal(SIGXFSZ, SIG_IGN);
+    setrlimit(RLIMIT_FSIZE, &full);
+    std::string identifier = identifierOf(call);
+    setrlimit(RLIMIT_FSIZE, &before);
+    std::signal(SIGXFSZ, handler);
+    return identifier;
+}
+
+TEST(ClosedDatasets, CanBeClosedAgainWhenTheDiskWasFull) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
+    netcdf("def_var", ncid, "v", ncDouble, x);
+    netcdf("set_fill", ncid, 256);
+    netcdf("enddef", ncid);
+    netcdf("put_var1_double", ncid, 0, 0, 7);
+    const auto close = [&] { netcdf("close", ncid); };
+    EXPECT_TRUE(identifierOnFullDisk(close).starts_with("TESSEL:netcdf:close:"));
+    EXPECT_EQ(netcdf("inq_dim", ncid, 0)[1].number(), 20000) << "it is open still";
+    EXPECT_EQ(identifierOf(close), "");
+    const int again = intOf(netcdf("open", folder.file("a.nc"), "NOWRITE"));
+    EXPECT_EQ(netcdf("get_var1_double", again, 0, 0)[0].number(), 7);
+    netcdf("close", again);
 }
 
 /// Notes what it sees.
