@@ -33,6 +33,7 @@ class NewDataset:
                                f"{', '.join(FORMATS)}, not {notes.shortened(form)}.")
         self._netcdf = tessel.load("netcdf")
         self._defining = True
+        self._closed = False
         self.path = path
         self.ncid = self._create(FORMATS[form])
 
@@ -56,19 +57,29 @@ class NewDataset:
 
     def __exit__(self, kind: type[BaseException] | None, error: BaseException | None,
                  traceback: TracebackType | None) -> None:
+        if kind is not None:
+            self._give_up()
+            return
+        self.close()
+
+    def close(self) -> None:
+        """Ends the definitions and closes the file, or gives it up on an error. A file that was
+        closed stays as it is."""
+        if self._closed:
+            return
         try:
-            if kind is None:
-                self._end_definitions()
-                self.call("sync")  # what cannot be written shows here, where giving up is possible
+            self.end_definitions()
+            self.call("sync")  # what cannot be written shows here, where giving up is possible
         except BaseException:
             self._give_up()
             raise
-        if kind is None:
-            self.call("close")
-        else:
-            self._give_up()
+        self._closed = True
+        self.call("close")
 
     def _give_up(self) -> None:
+        if self._closed:
+            return
+        self._closed = True
         try:
             self.call("abort")
         except tessel.Error:
@@ -91,7 +102,8 @@ class NewDataset:
         """Copies an attribute as it is."""
         source.call("copy_att", from_varid, name, self.ncid, to_varid)
 
-    def _end_definitions(self) -> None:
+    def end_definitions(self) -> None:
+        """Ends the definitions, if they have not been ended yet."""
         if self._defining:
             self.call("set_fill", self.parameter("NOFILL"))  # everything is put anyway
             self.call("enddef")
@@ -99,5 +111,5 @@ class NewDataset:
 
     def put(self, operation: str, *arguments: object) -> None:
         """Puts values."""
-        self._end_definitions()
+        self.end_definitions()
         self.call(operation, *arguments)

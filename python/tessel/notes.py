@@ -56,6 +56,7 @@ def told(function: _Function) -> _Function:
     """Has a function of this package say in every error how it was called, and about which
     files."""
     signature = inspect.signature(function)
+    public = f"{function.__module__.rpartition('.')[0]}.{function.__name__}"
 
     @functools.wraps(function)
     def telling(*given: Any, **named: Any) -> Any:
@@ -69,7 +70,7 @@ def told(function: _Function) -> _Function:
                 if error.operation is None:
                     error.operation = function.__name__
                 values = signature.bind(*given, **named).arguments
-                _add(error, _lines_of_function(error, function.__name__, values, folder))
+                _add(error, _lines_of_function(error, public, values, folder))
             raise
 
     return telling  # type: ignore[return-value]
@@ -78,7 +79,7 @@ def told(function: _Function) -> _Function:
 def _lines_of_function(error: Error, name: str, values: dict[str, Any],
                        folder: str | None) -> Iterator[str]:
     written = (f"{each}={shortened(value)}" for each, value in values.items())
-    yield f"in tessel.{name}({', '.join(written)})"
+    yield f"in {name}({', '.join(written)})"
     before = "\n".join(getattr(error, "__notes__", ())).splitlines()
     for each, title in (("path", "file"), ("source", "source"), ("target", "target")):
         value = values.get(each)

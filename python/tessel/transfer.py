@@ -52,7 +52,7 @@ def read(path: Path, variable: str, start: Sequence[int] | None = None,
     called with the bytes done and all bytes, before the first block and after each. Ctrl-C is
     heard between blocks. A file that was cut off is refused unless `check` is False.
     """
-    size, tell = _block_size(block_bytes), _progress(progress)
+    size, tell = block_size(block_bytes), listener(progress)
     with Dataset(path) as dataset:
         if check:
             integrity.verify(dataset)
@@ -76,7 +76,7 @@ def copy(source: Path, target: Path,
 
     `progress`, `block_bytes` and `check` are as in `read`.
     """
-    size, tell = _block_size(block_bytes), _progress(progress)
+    size, tell = block_size(block_bytes), listener(progress)
     with Dataset(source) as dataset:
         own = integrity.format_of(dataset)
         if own is None:
@@ -97,13 +97,15 @@ def _ignore(_done: int, _total: int) -> None:
     """The progress that nobody wants to know."""
 
 
-def _progress(progress: Progress | None) -> Progress:
+def listener(progress: Progress | None) -> Progress:
+    """Who is told the progress; an error for what cannot be told anything."""
     if progress is not None and not callable(progress):
         raise _bad_type("progress", "a function of two numbers", progress)
     return progress or _ignore
 
 
-def _block_size(block_bytes: int) -> int:
+def block_size(block_bytes: int) -> int:
+    """The memory of a block; an error for what is none."""
     size = _whole_number("block_bytes", block_bytes)
     if size < 1:
         raise tessel.Error("TESSEL:python:badBlockSize", "A block has at least one byte.")

@@ -74,7 +74,7 @@ def test_every_word_is_in_the_table() -> None:
     statuses = words_in([module / "call" / "status.cpp"], r'"(\w+)"')
     host = words_in((ROOT / "runtime").rglob("*.?pp"), r'"TESSEL:host:(\w+)"')
     own = words_in((ROOT / "python" / "src").glob("*.cpp"), r'refuse\(\s*"(\w+)"')
-    own |= words_in((ROOT / "python" / "tessel").glob("*.py"), r'"TESSEL:python:(\w+)"')
+    own |= words_in((ROOT / "python" / "tessel").rglob("*.py"), r'"TESSEL:python:(\w+)"')
     assert len(full) > 50 and len(statuses) > 60 and len(host) > 10 and len(own) > 15
     assert (full | statuses | host | own) - set(WORDS) == set()
 

@@ -20,6 +20,12 @@ from tessel.xarray.array import LazyArray
 from tessel.xarray.opening import OpenFile
 
 
+def _opened(path: str, mode: str) -> OpenFile:  # pylint: disable=unused-argument
+    """The open file. The mode is there because xarray gives one to a manager that was pickled,
+    whether it had one or not."""
+    return OpenFile(path)
+
+
 class TesselDataStore(AbstractDataStore):
     """A file for xarray. It is opened again when xarray's cache of open files has dropped it."""
 
@@ -33,7 +39,7 @@ class TesselDataStore(AbstractDataStore):
         given = paths.given(path)
         if "://" not in given:
             given = paths.absolute(os.path.expanduser(given))
-        return cls(CachingFileManager(OpenFile, given), given)
+        return cls(CachingFileManager(_opened, given, mode="r"), given)
 
     @property
     def file(self) -> OpenFile:
