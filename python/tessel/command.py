@@ -67,21 +67,18 @@ def _check(options: argparse.Namespace) -> None:
 
 def _ops(options: argparse.Namespace) -> None:
     # Here, because only this needs the whole table.
-    from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS
+    from tessel import operations, reference
 
     if options.name is None:
-        width = max(len(each.short) for each in OPERATIONS)
-        for each in OPERATIONS:
+        width = max(len(each.short) for each in operations.OPERATIONS)
+        for each in operations.OPERATIONS:
             print(f"{each.short:{width}}  {each.purpose}")
         return
-    wanted = options.name.lower()
-    for each in OPERATIONS:
-        if wanted in each.names:
-            arguments = ", ".join(argument.name for argument in each.arguments)
-            print(f"{each.short}({arguments})\n\n{each.documentation(EXAMPLE_BEGINNING)}", end="")
-            return
-    raise tessel.Error("TESSEL:python:unknownOperation",
-                       f"There is no operation {options.name}; tessel ops lists all.")
+    operation = operations.find(options.name)
+    if operation is None:
+        raise tessel.Error("TESSEL:python:unknownOperation",
+                           f"There is no operation {options.name}; tessel ops lists all.")
+    print(reference.text_of(operation), end="")
 
 
 def _position(text: str) -> tuple[str, int]:
@@ -96,9 +93,10 @@ def _add_check(parser: argparse.ArgumentParser) -> None:
                         help="do not refuse a file that was cut off")
 
 
-def _parser() -> argparse.ArgumentParser:
-    parser = terminal.Parser(prog="tessel", description=__doc__)
-    commands = parser.add_subparsers(metavar="COMMAND", required=True)
+def parser() -> argparse.ArgumentParser:
+    """The command line as its arguments are read; the manual page is made of it as well."""
+    whole = terminal.Parser(prog="tessel", description=__doc__)
+    commands = whole.add_subparsers(metavar="COMMAND", required=True)
 
     def command(name: str, action: Callable[[argparse.Namespace], None],
                 text: str) -> argparse.ArgumentParser:
@@ -135,7 +133,7 @@ def _parser() -> argparse.ArgumentParser:
 
     ops = command("ops", _ops, "explain the operations of the module")
     ops.add_argument("name", metavar="NAME", nargs="?", help="the operation; else all are listed")
-    return parser
+    return whole
 
 
 def _line(error: Exception, options: argparse.Namespace) -> str:
@@ -150,5 +148,5 @@ def _line(error: Exception, options: argparse.Namespace) -> str:
 
 def main(arguments: list[str] | None = None) -> int:
     """The command line; returns its exit status."""
-    options = _parser().parse_args(arguments)
+    options = parser().parse_args(arguments)
     return terminal.run(lambda: options.action(options), lambda error: _line(error, options))

@@ -88,7 +88,7 @@ def _read(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, s
         return Operation(
             short=f"{name}_{of.suffix}", long=f"nc_{name}_{of.suffix}",
             purpose=of.filled(purpose), notes=notes, arguments=(NCID, VARID, *arguments),
-            results=(Result("data", data_result(of.dtype, text_row),
+            results=(Result("data", data_result(of.dtype, of.host_class, text_row),
                             text_shape if of.is_text else shape),),
             errors=((f"TESSEL:netcdf:{tag}:badInputParameterCount", "the number of arguments"),
                     *errors, *_conversion(tag, of)),
@@ -113,7 +113,7 @@ def _write(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, 
             found = tuple((identifier.replace(":putAtt:", ":putAttText:"), cause)
                           for identifier, cause in errors)
         empty = () if may_be_empty else (("TESSEL:netcdf:emptyVariableData", "data is empty"),)
-        data = Argument("data", data_kind(of.dtype), size)
+        data = Argument("data", data_kind(of.dtype, of.host_class), size)
         return Operation(
             short=short, long=f"nc_{short}", purpose=of.filled(purpose), notes=notes,
             arguments=(NCID, VARID, *given, data), results=(),

@@ -5,74 +5,84 @@ from __future__ import annotations
 
 from tessel.operation import Argument, Kind, ResultKind
 
+_NUMBER = "double or int32, of which the first element counts"
+
 IDENTIFIER = Kind(
-    "SupportsIndex", "int", "{name} if type({name}) is int else integer({name})",
+    "SupportsIndex", "int", _NUMBER, "{name} if type({name}) is int else integer({name})",
     (("TESSEL:netcdf:emptySetID", "has no elements"),
      ("TESSEL:netcdf:badIDDatatype", "is no whole number")))
 NAME = Kind(
-    "str", "str", "{name}",
+    "str", "str", "char", "{name}",
     (("TESSEL:netcdf:argumentWasNotChar", "is no str"),))
-PATH_NAME = Kind("str | os.PathLike[str]", "str or path object", NAME.conversion, NAME.errors)
+PATH_NAME = Kind("str | os.PathLike[str]", "str or path object", NAME.host, NAME.conversion,
+                 NAME.errors)
 MODE = Kind(
     "str | SupportsIndex", "str or int",
+    "char; or double or int32, of which the first element counts",
     "{name} if type({name}) is str else integer({name})",
     (("TESSEL:netcdf:emptySetMode", "has no elements"),
      ("TESSEL:netcdf:badModeDatatype", "is neither a name nor a whole number"),
      ("TESSEL:netcdf:unrecognizedFileMode", "is no name of a mode")))
 TYPE = Kind(
-    "SupportsIndex", "int", IDENTIFIER.conversion,
+    "SupportsIndex", "int", "double, of which the first element counts", IDENTIFIER.conversion,
     (("TESSEL:netcdf:unpack_xtype:emptySetDatatype", "has no elements"),
      ("TESSEL:netcdf:unpack_xtype:badDatatype", "is no number"),
      ("TESSEL:netcdf:invalidNetcdfDatatype", "is not from 0 to 6")))
 SIZE = Kind(
-    "SupportsIndex", "int", IDENTIFIER.conversion,
+    "SupportsIndex", "int", "any numeric class; the first element counts", IDENTIFIER.conversion,
     (("TESSEL:netcdf:emptySetSizeParameter", "has no elements"),
      ("TESSEL:netcdf:badSizeArgumentDatatype", "is no number"),
      ("TESSEL:netcdf:sizeArgumentIsInfOrNaN", "is infinite or no number"),
      ("TESSEL:netcdf:negativeSize", "is negative")))
-ANYTHING = Kind(SIZE.annotation, SIZE.wording, SIZE.conversion, ())
+ANYTHING = Kind(SIZE.annotation, SIZE.wording, "anything", SIZE.conversion, ())
 CODE = Kind(
-    "SupportsIndex", "int", IDENTIFIER.conversion,
+    "SupportsIndex", "int", _NUMBER, IDENTIFIER.conversion,
     (("TESSEL:netcdf:unpackIntSingleton:argumentIsEmptySet", "has no elements"),
      ("TESSEL:netcdf:unpackIntSingleton:badNumericType", "is no number")))
 DIMENSIONS = Kind(
-    "Indices", "sequence of int", "identifiers({name})",
+    "Indices", "sequence of int", "double, an element a dimension; empty for none",
+    "identifiers({name})",
     (("TESSEL:netcdf:unpackDimids:badDimidsType", "are no numbers"),
      ("TESSEL:netcdf:ndimsLargerThanNetcdfLimits", "are more than 1024")))
 POSITIONS = Kind(
-    "Indices", "sequence of int", "{name} if type({name}) in PLAIN else vector({name})",
+    "Indices", "sequence of int", "any numeric class, an element a dimension",
+    "{name} if type({name}) in PLAIN else vector({name})",
     (("TESSEL:netcdf:{label}ArgumentIsEmpty", "has no elements"),
      ("TESSEL:netcdf:{label}ArgumentHasBadDatatype", "has elements that are no numbers"),
      ("TESSEL:netcdf:indexArgumentHasInf", "has an infinite element"),
      ("TESSEL:netcdf:indexArgumentHasNaN", "has an element that is no number")))
 
 
-def data_kind(dtype: str) -> Kind:
+def data_kind(dtype: str, host_class: str) -> Kind:
     """Data to write: an array of the dtype, or Python's numbers that are exact in it; text without
     a dtype."""
     if not dtype:
         return Kind("str | bytes | NDArray[numpy.str_]", "str, bytes or array of characters",
-                    "{name}", ())
+                    "char", "{name}", ())
     return Kind(f"Numbers | NDArray[numpy.{dtype}]", f"array of {dtype}, or numbers exact in it",
-                f"{{name}} if type({{name}}) is ndarray else "
+                host_class, f"{{name}} if type({{name}}) is ndarray else "
                 f"numbers({{name}}, dtypes['{dtype}'])",
                 (("TESSEL:python:notExact", f"has a number of Python's that no {dtype} is"),))
 
 
-NUMBER = ResultKind("int", "int", "int({value}.item())")
-TEXT = ResultKind("str", "str", "{value}")
-CONSTANT = ResultKind("Any", "int or float", "constant({value})")  # as a union, of use to nobody
-NAMES = ResultKind("list[str]", "list of str", "{value}.ravel().tolist()")
-DIMENSION_LIST = ResultKind("tuple[int, ...]", "tuple of int", "tuple(map(int, {value}.flat))")
+NUMBER = ResultKind("int", "int", "double, 1-by-1", "int({value}.item())")
+TEXT = ResultKind("str", "str", "char, a row", "{value}")
+CONSTANT = ResultKind("Any", "int or float", "double, 1-by-1",
+                      "constant({value})")  # as a union, of use to nobody
+NAMES = ResultKind("list[str]", "list of str", "cell of char rows, n-by-1",
+                   "{value}.ravel().tolist()")
+DIMENSION_LIST = ResultKind("tuple[int, ...]", "tuple of int", "double, a row; 0-by-0 for none",
+                            "tuple(map(int, {value}.flat))")
 
 
-def data_result(dtype: str, row: bool) -> ResultKind:
+def data_result(dtype: str, host_class: str, row: bool) -> ResultKind:
     """Data that were read; text without a dtype, which with `row` is a row for certain."""
     if dtype:
-        return ResultKind(f"NDArray[numpy.{dtype}]", f"array of {dtype}", "{value}")
+        return ResultKind(f"NDArray[numpy.{dtype}]", f"array of {dtype}", host_class, "{value}")
     if row:
         return TEXT
-    return ResultKind("str | NDArray[numpy.str_]", "str or array of characters", "{value}")
+    return ResultKind("str | NDArray[numpy.str_]", "str or array of characters", "char",
+                      "{value}")
 
 
 NCID = Argument("ncid", IDENTIFIER, "The dataset.")

@@ -24,6 +24,9 @@ class Kind:
     wording: str
     """The type, as documents write it."""
 
+    host: str
+    """The class and shape of the host array that the module takes."""
+
     conversion: str
     """The expression that a method hands on; {name} is the argument's name."""
 
@@ -54,6 +57,10 @@ class ResultKind:
 
     annotation: str
     wording: str
+
+    host: str
+    """The class and shape of the host array that the module gives."""
+
     conversion: str
     """The expression that makes it of {value}, what the call form gives."""
 

@@ -1,0 +1,212 @@
+# tests/python/test_reference.py: the reference says of every operation what there is to say.
+"""Its errors are those that the code can raise, each is provoked by a test, its calls compile, and
+it is the same on every kind of page."""
+
+import functools
+import re
+import subprocess
+import sys
+from pathlib import Path
+
+import pytest
+from tessel import catalogue, command, meanings, reference
+from tessel.errors import CLASSES, WITHOUT_BUILT_IN, word_of
+from tessel.operation import Operation
+from tessel.operations import OPERATIONS, find
+
+ROOT = Path(__file__).parents[2]
+sys.path.insert(0, str(ROOT / "tools"))
+import make_catalogue  # noqa: E402
+import make_reference  # noqa: E402
+
+each_operation = pytest.mark.parametrize("operation", OPERATIONS, ids=lambda each: each.short)
+PAGES = {each.short: reference.page_of(each) for each in OPERATIONS}
+MAN, RST = make_reference.man(), make_reference.rst_pages()
+
+# Guards whose conditions cannot be met, not even by calling the function behind them.
+UNPROVOKED = {"TESSEL:netcdf:packUpSizetScalar", "TESSEL:netcdf:defVar"}
+
+
+@functools.cache
+def files() -> tuple[str, ...]:
+    """The texts of the conformance tests and of what they share."""
+    return tuple(each.read_text() for folder in ("conformance", "support")
+                 for each in (ROOT / "tests" / folder).glob("*.[ch]pp"))
+
+
+@functools.cache
+def is_expected(*literals: str) -> bool:
+    """Whether one of the tests' files has all of these."""
+    return any(all(each in text for each in literals) for text in files())
+
+
+def identifiers(short: str) -> set[str]:
+    """All identifiers on a page but for the statuses without a cause of their own."""
+    page = PAGES[short]
+    return {each.identifier for each in (*page.raised, *page.guards)}
+
+
+def test_the_catalogue_is_the_modules() -> None:
+    """What is committed is what the module's sources say now."""
+    assert make_catalogue.made() == make_catalogue.TARGET.read_text()
+    assert len(catalogue.ROWS) > 150 and len(catalogue.STATUSES) > 60
+
+
+def test_every_text_of_the_catalogue_is_a_row() -> None:
+    """Nothing in the module's table escapes the reading of it."""
+    text = (ROOT / "module" / "call" / "catalogue.hpp").read_text()
+    literals = re.findall(r'"(TESSEL:[^"]*)"', text)
+    read = [identifier for identifier, _ in catalogue.ROWS.values()]
+    assert len(literals) > 90 and set(literals) <= set(read)
+    assert sum(not each.endswith(":") and "{" not in each for each in read) == len(literals)
+    tags = re.findall(r'\{"(\w+(?::\w+)?)",\s+"[^"%]*"\}', text)
+    assert {f"TESSEL:netcdf:{tag}:" for tag in tags} == {each for each in read
+                                                         if each.endswith(":")}
+
+
+def test_every_row_is_on_a_page() -> None:
+    on_pages = {row for each in OPERATIONS for row in reference.rows_of(each)}
+    assert on_pages | set(reference.EVERY_CALL) == set(catalogue.ROWS)
+    assert len(on_pages) == len(catalogue.ROWS) - len(reference.EVERY_CALL)
+    assert set(catalogue.RAISES) == {each.short if each.short in catalogue.RAISES
+                                     else each.short.rpartition("_")[0] for each in OPERATIONS}
+
+
+@each_operation
+def test_page_has_what_the_code_can_raise(operation: Operation) -> None:
+    """The handler's rows, expanded by names and labels, and the causes that the table has for
+    statuses of its library calls: no more and no less."""
+    page = PAGES[operation.short]
+    tags = {each.identifier for each in page.statuses}
+    words = set(catalogue.STATUSES.values())
+    expected = set()
+    for row in reference.rows_of(operation):
+        template = catalogue.ROWS[row][0]
+        if template.endswith(":"):
+            assert template in tags
+        elif "{label}" in template:
+            expected |= {template.format(label=each.label or each.name)
+                         for each in operation.arguments
+                         if each.name in ("index", "start", "count", "stride")}
+        else:
+            expected.add(template.format(short=operation.short))
+    own = {each for each in identifiers(operation.short)
+           if not each.startswith("TESSEL:python:")}
+    caused = {each for each in own - expected
+              if each[:-len(word_of(each))] in tags and word_of(each) in words}
+    assert own == expected | caused
+    for each in (*page.raised, *page.statuses, *page.guards, *page.refused):
+        assert each.cause and each.message and not re.search(r"%[sduf]|[{}]", each.message)
+
+
+@each_operation
+def test_page_is_provoked(operation: Operation) -> None:
+    """Each identifier is one that a test of the module expects; statuses are forced into every
+    library call, tag by tag."""
+    for identifier in identifiers(operation.short) - UNPROVOKED:
+        if identifier.startswith("TESSEL:python:"):
+            assert identifier in (ROOT / "tests" / "python" / "test_methods.py").read_text()
+            continue
+        rest = identifier.removeprefix("TESSEL:netcdf:")
+        word = word_of(identifier)
+        tag = rest[:-len(word)]
+        ways = [(f'"{rest}',), (f"netcdf:{rest}",), (f'netcdf:{tag}"', f'"{word}"'),
+                (re.sub(r"^(start|count|stride)", '"', rest),)]
+        if word in catalogue.STATUSES.values():
+            ways.append((f'"{tag}"',))
+        if tag == f"{operation.short}:":
+            ways.append((f'":{word}"',))
+        assert any(is_expected(*each) for each in ways), identifier
+    for each in PAGES[operation.short].statuses:
+        assert is_expected(f'"{each.identifier.removeprefix("TESSEL:netcdf:")}"')
+
+
+def test_every_status_is_forced() -> None:
+    text = (ROOT / "tests" / "conformance" / "library_failures.cpp").read_text()
+    for status, word in catalogue.STATUSES.items():
+        assert f'{{{status}, "{word}"}}' in text
+
+
+def test_every_word_is_explained() -> None:
+    """Those that errors.py knows, and the guard's; each once."""
+    guard = set(re.findall(r'"TESSEL:guard:(\w+)"',
+                           (ROOT / "guard" / "src" / "refusals.hpp").read_text()))
+    assert len(guard) >= 7
+    assert set(meanings.MEANINGS) == {*CLASSES, *WITHOUT_BUILT_IN, *guard}
+    assert sum(map(len, meanings.GROUPS.values())) == len(meanings.MEANINGS)
+    for meaning, remedy in meanings.MEANINGS.values():
+        assert meaning.endswith(".") and remedy.endswith(".") and meaning != remedy
+
+
+@each_operation
+def test_the_same_everywhere(operation: Operation) -> None:
+    """The text, the manual page and the page of the book have all errors, arguments and results."""
+    page = PAGES[operation.short]
+    text = reference.text_of(operation)
+    man = MAN[f"man3/tessel-{operation.short}.3"].replace("\\-", "-").replace("\\e", "\\")
+    rst = RST[f"{operation.short}.rst"]
+    for form in (text, man, rst):
+        for each in (*page.raised, *page.statuses, *page.guards, *page.refused):
+            assert each.identifier in form
+        for each in (*operation.arguments, *operation.results):
+            assert each.name in form and each.kind.host in form
+        for line in operation.example.splitlines():
+            assert line.replace("'", "\\(aq") in form or line in form
+    assert operation.purpose in text
+
+
+def test_the_index_has_all() -> None:
+    index = RST["errors.rst"]
+    for word in meanings.MEANINGS:
+        assert f"\n   {word}\n" in index
+    for short in PAGES:
+        for identifier in identifiers(short):
+            assert f"\n``{identifier}``\n" in index
+    for each in reference.every_call():
+        assert f"\n``{each.identifier}``\n" in index
+    assert {f"{each.short}.rst" for each in OPERATIONS} < set(RST)
+    assert sum(map(len, make_reference.by_subject().values())) == 102
+    assert all(make_reference.by_subject().values())
+
+
+def test_manual_pages_are_clean(tmp_path: Path) -> None:
+    """The formatter has nothing to complain of in any of them."""
+    make_reference.write(MAN, tmp_path)
+    assert len(MAN) == 104
+    run = subprocess.run(["groff", "-man", "-ww", "-Tutf8", "-z", *(str(tmp_path / each)
+                                                                  for each in MAN)],
+                         capture_output=True, text=True, check=True)
+    assert run.stdout + run.stderr == ""
+    whole = MAN["man1/tessel.1"]
+    for name in ("info", "plot", "copy", "check", "ops"):
+        assert f".SS {name}\n" in whole
+    assert command.parser().prog == "tessel"
+
+
+def test_calls_in_cpp_compile(tmp_path: Path) -> None:
+    """Every call as the pages have it, with a declaration for each argument."""
+    types = {"char": "std::string", "double": "tessel::Array"}
+    functions = []
+    for operation in OPERATIONS:
+        parameters = "".join(
+            f", const {types.get(each.kind.host, 'tessel::Array')} &{each.name}"
+            for each in operation.arguments)
+        used = "".join(f"\n(void){name};" for name in
+                       re.findall(r"const auto (\w+)", reference.cpp_call(operation)))
+        functions.append(f"void call_{operation.short}(const tessel::Module &netcdf{parameters}) "
+                         f"{{\n{reference.cpp_call(operation)}{used}\n}}")
+    source = tmp_path / "calls.cpp"
+    source.write_text("#include \"tessel/runtime.hpp\"\n#include <cstdint>\n#include <string>\n"
+                      + "\n".join(functions))
+    run = subprocess.run(["c++", "-std=c++20", "-fsyntax-only", "-Wall", "-Werror",
+                          f"-I{ROOT / 'runtime' / 'include'}", f"-I{ROOT / 'host'}", str(source)],
+                         capture_output=True, text=True, check=False)
+    assert run.returncode == 0, run.stderr
+    assert len(functions) == 102
+
+
+def test_ops_prints_the_page(capsys: pytest.CaptureFixture[str]) -> None:
+    assert command.main(["ops", "nc_OPEN"]) == 0
+    operation = find("open")
+    assert operation is not None
+    assert capsys.readouterr().out == reference.text_of(operation)
