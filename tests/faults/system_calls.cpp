@@ -91,6 +91,7 @@ bool faultMet() {
 
 using namespace tessel::test;
 
+// NOLINTBEGIN(readability-inconsistent-declaration-parameter-name): the system's own are reserved
 extern "C" {
 
 int open64(const char *path, int flags, ...) {
@@ -137,3 +138,4 @@ int close(int descriptor) {
     });
 }
 }
+// NOLINTEND(readability-inconsistent-declaration-parameter-name)

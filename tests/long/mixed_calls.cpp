@@ -4,7 +4,7 @@
 //   long_mixed_calls [--calls N] [--hours H] [--leak]
 //
 // The run ends after N calls or H hours, whichever is given and comes last. It is looked at in
-// twenty parts of the calls, or every three minutes of the hours. With --leak a result of every
+// twenty parts. With --leak a result of every
 // hundredth call is kept, and one descriptor in a part; that must be noticed.
 #include "tessel/runtime.hpp"
 
@@ -32,7 +32,6 @@ namespace {
 using tessel::Array;
 using tessel::Error;
 using tessel::Module;
-using tessel::Results;
 using Clock = std::chrono::steady_clock;
 
 struct Options {
@@ -85,6 +84,7 @@ class Folder {
     std::filesystem::path path;
 };
 
+constexpr int partCount = 20;
 constexpr std::size_t columns = 8;
 constexpr std::size_t rows = 4;
 
@@ -204,7 +204,7 @@ double residentMegabytes() {
 struct Part {
     std::size_t calls = 0;
     std::size_t errors = 0;
-    double cpuSeconds = 0; ///< of this part: what other programs do meanwhile does not count
+    double cpuSeconds = 0; ///< of this part, whatever other programs did meanwhile
     double megabytes = 0;
     std::size_t descriptors = 0;
 
@@ -226,9 +226,8 @@ class Run {
             const auto began = Clock::now();
             const bool counted = calls < options.calls;
             Part part = next([&](const Part &now) {
-                return counted
-                           ? now.calls >= partCalls
-                           : Clock::now() - began >= std::chrono::minutes(3) || elapsed() >= hours;
+                return counted ? now.calls >= partCalls
+                               : Clock::now() - began >= hours / partCount || elapsed() >= hours;
             });
             calls += part.calls;
             std::printf("%10zu %10zu %16.0f %6.1f %12zu\n", calls, part.errors, part.speed(),
@@ -288,7 +287,7 @@ class Run {
     std::mt19937 lot{1};
     std::vector<Array> kept;
     std::chrono::duration<double> hours{options.hours * 3600};
-    std::size_t partCalls = std::max<std::size_t>(options.calls / 20, 1000);
+    std::size_t partCalls = std::max<std::size_t>(options.calls / partCount, 1000);
 };
 
 /// The mean over some of the parts.
