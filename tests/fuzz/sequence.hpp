@@ -30,7 +30,7 @@ struct Value {
     tsClassID classID = tsDOUBLE;
     bool complex = false;
     std::vector<std::size_t> dims = {1, 1};
-    std::vector<double> elements; ///< repeated as needed; none are zeros
+    std::vector<double> elements = {}; ///< repeated as needed; none are zeros
 };
 
 struct Step {
