@@ -20,7 +20,9 @@ FORKS = 20
 CALLERS = 3
 PATIENCE = 30  # seconds, then the alarm ends the child
 
-pytestmark = pytest.mark.filterwarnings("ignore:.*multi-threaded.*:DeprecationWarning")
+# The sanitizer's own allocator may be locked at the moment of a fork, and stays so in the child.
+pytestmark = [pytest.mark.filterwarnings("ignore:.*multi-threaded.*:DeprecationWarning"),
+              pytest.mark.without_sanitizers]
 
 netcdf = tessel.load("netcdf")
 
