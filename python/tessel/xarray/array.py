@@ -3,17 +3,13 @@
 
 from __future__ import annotations
 
-from collections.abc import Callable
-from typing import Any
-
 import numpy as np
 from xarray.backends import BackendArray, CachingFileManager
 from xarray.core import indexing
 
-import tessel
 from tessel.dataset import Variable
 from tessel.xarray import planning
-from tessel.xarray.opening import FileWasClosed, OpenFile
+from tessel.xarray.opening import FileWasClosed, OpenFile, refusal
 
 DTYPES = {"schar": "i1", "text": "S1", "short": "i2", "int": "i4", "float": "f4", "double": "f8"}
 """The dtype by the member of the typed families that reads a variable."""
@@ -30,6 +26,8 @@ class LazyArray(BackendArray):
         self._manager = manager
         self._name = variable.name
         self._type = variable.type
+        # xarray reads these when it opens the dataset, and keeps them.
+        self._once = variable.is_coordinate
         self._in_records = any(each.unlimited for each in variable.dimensions[:1])
         self.shape = variable.shape
         self.dtype = np.dtype(DTYPES[str(variable.type.member)])
@@ -56,22 +54,19 @@ class LazyArray(BackendArray):
         return self._values(count, "get_vars", start, count, step)
 
     def _values(self, count: list[int], family: str, *places: list[int]) -> np.ndarray:
-        def read(file: OpenFile) -> Any:
-            return file.read(f"{family}_{self._type.member}", self._varid(file), *places)
-
-        values = self._with_file(read)
+        while True:
+            file = self._manager.acquire()
+            try:
+                varid = file.varids.get(self._name)
+                if varid is None:
+                    varid = self._varid(file)
+                values = file.read(f"{family}_{self._type.member}", varid, *places, once=self._once)
+                break
+            except FileWasClosed:  # the cache has closed it, for another one, before we began
+                continue
         if self._type.member == "text":
             values = _bytes(values)
-        return values.reshape(count[::-1], order="F").T
-
-    def _with_file(self, use: Callable[[OpenFile], Any]) -> Any:
-        """What a use of the open file gives. The cache may close the file for another one before it
-        begins, but not while it goes on."""
-        while True:
-            try:
-                return use(self._manager.acquire())
-            except FileWasClosed:
-                continue
+        return values.T.reshape(count)  # a view of what the module gave
 
     def _varid(self, file: OpenFile) -> int:
         """The number of the variable, which must be what it was: since the dataset was opened, the
@@ -81,9 +76,9 @@ class LazyArray(BackendArray):
         if self._in_records and shape[:1] >= self.shape[:1]:
             shape = self.shape[:1] + shape[1:]
         if place.xtype != self._type.number or shape != self.shape:
-            raise tessel.Error("TESSEL:python:fileChanged",
-                               f"The variable {self._name} is not any more what it was when the "
-                               "dataset was opened.", path=file.place)
+            raise refusal("fileChanged", f"The variable {self._name} is not any more what it was "
+                          "when the dataset was opened.", file.place)
+        file.varids[self._name] = place.varid
         return place.varid
 
 

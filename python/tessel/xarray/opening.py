@@ -1,15 +1,18 @@
 # python/tessel/xarray/opening.py: files that are open for reading, and which files those may be.
 """A file as the engine has it open.
 
-The library maps the file into memory (its mode flag 16), which makes every access faster, most of
-all those of few values in many places; where it cannot, it reads through a small buffer. Both have
-a trap: where a mapped file is cut off later, looking at what is gone ends the process, and from
-behind the end of a file that is not mapped the library reads zeros. So
+The library has it open twice. One way is for what is read once, in many places, when a dataset is
+opened: through the smallest buffer. The other is for the data, from the first time that they are
+asked for: mapped into memory, which makes every later access faster, most of all those of few values
+in many places. What was measured is in docs/xarray.md.
 
-- a file must be as long as what is in it needs when it is opened (`tessel.check`),
+Both have a trap: where a mapped file is cut off later, looking at what is gone ends the process, and
+from behind the end of a file that is not mapped the library reads zeros. So
+
+- a file must be as long as what is in it needs when it is opened (`tessel.check`);
 - while a mapped file is being read, what is gone is zeros instead of the end of the process
-  (`tessel._faults`), and such a read is an error, as is every one after it,
-- after each read the file must still be as long as it has to be.
+  (`tessel._faults`), and such a read is an error, as is every one after it;
+- after each read, the file must still be as long as it has to be.
 """
 
 from __future__ import annotations
@@ -27,10 +30,13 @@ FORMATS = (b"CDF\1", b"CDF\2")
 """How the files begin that the engine opens: the classic format and the one of 64-bit offsets."""
 
 MAPPED = 16
-"""The library's mode flag for mapping the file (NC_MMAP). It is none of the module's constants."""
+"""The library's mode flag for mapping the file (NC_MMAP), which is none of its named constants."""
 
-BUFFER_HINT = 8192
-"""The size of the library's buffer for a file that is not mapped; see docs/xarray.md."""
+SMALL_BUFFER = 512
+"""The bytes of the library's buffer for what is read in many places."""
+
+LARGE_BUFFER = 8192
+"""The bytes of the library's buffer for the data of a file that cannot be mapped."""
 
 
 def is_ours(path: object) -> bool:
@@ -56,35 +62,58 @@ class Place(NamedTuple):
 class OpenFile(Dataset):
     """An open file that several threads may read, while another may close it.
 
-    `mapped` tells whether the library has it mapped into memory, which is tried unless told not to.
+    `mapped` tells whether the data are read from memory that the file is mapped into, which is
+    tried unless told not to.
     """
 
     def __init__(self, path: str, mapped: bool = True) -> None:
         self._lock = threading.RLock()
-        self._is_open = False
+        self._ids: list[int] = []
+        self._data: int | None = None
         self._gone = False
-        self._places: dict[str, Place] = {}
-        # Beside the library's, a descriptor of our own: the path can lead to another file by now.
+        self.varids: dict[str, int] = {}
+        """The numbers of the variables that were found to be what they are expected to be."""
+
+        # A descriptor of our own: the path can lead to another file by now.
         self._descriptor = _descriptor_of(path)
         try:
             self.mapped = mapped
             super().__init__(path)
-            self._is_open = True
             self._least = integrity.verify(self) or 0
-            if not os.path.samestat(os.fstat(self._descriptor), os.stat(path)):
+            if not self._is_at_its_path():
                 raise self._error("fileChanged", "The file was replaced while it was being opened.")
         except BaseException:
             self.close()
             raise
 
     def _open(self) -> int:
-        """The library's number for the file."""
-        if self.mapped:
+        return self._opened("NOWRITE", SMALL_BUFFER)
+
+    def _opened(self, mode: str | int, hint: int) -> int:
+        """Another number of the library's for this very file."""
+        path = self.path
+        if not self._is_at_its_path():  # it was renamed or removed, but is still there for us
+            path = f"/proc/self/fd/{self._descriptor}"
+        self._ids.append(self._guarded(self._netcdf._open, path, mode, hint).ncid)
+        return self._ids[-1]
+
+    def _is_at_its_path(self) -> bool:
+        try:
+            return os.path.samestat(os.fstat(self._descriptor), os.stat(self.place))
+        except OSError:
+            return False
+
+    @property
+    def _id_for_data(self) -> int:
+        """The library's number for reading the data, from the first time that they are read."""
+        if self._data is None and self.mapped:
             try:
-                return self._guarded(self._netcdf._open, self.path, MAPPED, BUFFER_HINT).ncid
+                self._data = self._opened(MAPPED, LARGE_BUFFER)
             except tessel.Error:
-                self.mapped = False  # as the file system cannot, or for what is named next
-        return self._netcdf._open(self.path, "NOWRITE", BUFFER_HINT).ncid
+                self.mapped = False  # the file system, or what memory there is, does not have it
+        if self._data is None:
+            self._data = self._opened("NOWRITE", LARGE_BUFFER)
+        return self._data
 
     def _guarded(self, method: Callable[..., Any], *arguments: object) -> Any:
         """A call that may look at what is gone from a mapped file."""
@@ -95,16 +124,18 @@ class OpenFile(Dataset):
             self._gone |= _faults.end()
 
     def _error(self, word: str, message: str) -> tessel.Error:
-        return tessel.Error(f"TESSEL:python:{word}", message, path=self.place)
+        return refusal(word, message, self.place)
 
-    def read(self, operation: str, varid: int, *places: list[int]) -> Any:
-        """What an operation that reads gives. The places are in the library's order."""
+    def read(self, operation: str, varid: int, *places: list[int], once: bool = False) -> Any:
+        """What an operation that reads gives. The places are in the library's order. `once` is for
+        what is not going to be read again."""
         method = getattr(self._netcdf, operation)
         with self._lock:
-            if not self._is_open:
+            if not self._ids:
                 raise FileWasClosed
-            values = self._guarded(method, self.ncid, varid, *(each[::-1] for each in places))
-            self._gone |= os.fstat(self._descriptor).st_size < self._least
+            ncid = self.ncid if once else self._id_for_data
+            values = self._guarded(method, ncid, varid, *[each[::-1] for each in places])
+            self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
             if self._gone:
                 raise self._error("fileTooShort", "The file became shorter while it was open.")
             return values
@@ -112,22 +143,18 @@ class OpenFile(Dataset):
     def place_of(self, name: str) -> Place:
         """Where a variable is."""
         with self._lock:
-            if not self._is_open:
+            if not self._ids:
                 raise FileWasClosed
-            if name not in self._places:
-                varid = self._netcdf.inq_varid(self.ncid, name)
-                found = self._netcdf.inq_var(self.ncid, varid)
-                shape = tuple(self._netcdf.inq_dim(self.ncid, each).len
-                              for each in reversed(found.dimids))
-                self._places[name] = Place(varid, found.xtype, shape)
-            return self._places[name]
+            varid = self._netcdf.inq_varid(self.ncid, name)
+            found = self._netcdf.inq_var(self.ncid, varid)
+            return Place(varid, found.xtype, tuple(self._netcdf.inq_dim(self.ncid, each).len
+                                                   for each in reversed(found.dimids)))
 
     def close(self) -> None:
         """Closes the file after the calls in progress; more than once does no harm."""
         with self._lock:
-            if self._is_open:
-                self._is_open = False
-                super().close()
+            while self._ids:
+                self._netcdf.close(self._ids.pop())
             if self._descriptor >= 0:
                 os.close(self._descriptor)
                 self._descriptor = -1
@@ -145,6 +172,12 @@ def _descriptor_of(path: str) -> int:
 
 
 def _not_ours(path: str) -> tessel.Error:
-    return tessel.Error("TESSEL:python:notAClassicFile",
-                        "The engine \"tessel\" opens files of the classic and of the 64-bit offset "
-                        "format, and this is none of them.", path=path)
+    return refusal("notAClassicFile", "The engine \"tessel\" opens files of the classic and of the "
+                   "64-bit offset format, and this is none of them.", path)
+
+
+def refusal(word: str, message: str, path: str) -> tessel.Error:
+    """The error for what cannot be done with a file."""
+    error = tessel.Error(f"TESSEL:python:{word}", message, path=path)
+    error.add_note(f"file: {path}")
+    return error

@@ -1,0 +1,439 @@
+# tests/python/test_xarray_engine.py: datasets through the engine "tessel" of xarray.
+"""The engine beside xarray's own, and what happens to files while they are open."""
+
+from __future__ import annotations
+
+import gc
+import os
+import pickle
+import shutil
+import signal
+import subprocess
+import sys
+import threading
+from concurrent.futures import ThreadPoolExecutor
+from pathlib import Path
+
+import netCDF4
+import numpy as np
+import pytest
+import tessel
+import xarray
+from made_files import EVERYTHING, generate, open_descriptors
+from scipy.io import netcdf_file
+from tessel.xarray import TesselBackendEntrypoint, opening, planning
+from tessel.xarray.opening import OpenFile
+from xarray.backends.plugins import guess_engine, list_engines
+
+KINDS = ("classic", "64-bit offset")
+OTHERS = ("netcdf4", "scipy")
+DECODING = ({}, {"decode_times": False}, {"decode_cf": False},
+            {"mask_and_scale": False, "concat_characters": False, "decode_times": False})
+
+MORE = EVERYTHING.replace("variables:", """variables:
+    char marked(wide) ;
+        marked:_FillValue = "x" ;
+    int time(record) ;
+        time:units = "days since 2001-02-03" ;
+    short packed(high) ;
+        packed:scale_factor = 0.5 ; packed:add_offset = 10.f ; packed:_FillValue = -1s ;
+        packed:missing_value = -1s ; packed:coordinates = "scalar" ;
+    double empty(high) ;
+        empty:summer = "SUMMER" ; empty:blank = " a \\n" ;
+        empty:letter = "a" ; empty:a1 = -1b, 2b ; empty:a2 = 5 ; empty:a3 = 1.5f ;
+        empty:a4 = 2.5, 3.5, NaN ; empty:a5 = 3s ; empty:a6 = 7b ; empty:a7 = 2.5 ;
+""").replace("data:", """data:
+    marked = "axbx" ; time = 1, 2, 4 ; packed = 1, -1, 3 ;
+""").replace("SUMMER", "\u00e9t\u00e9".encode().decode("latin-1"))
+"""Everything, and what CF conventions are about."""
+
+
+def ferret_files() -> list[str]:
+    """The files of the package ferret-datasets."""
+    listed = subprocess.run(["dpkg", "-L", "ferret-datasets"], check=True, capture_output=True)
+    return [each for each in listed.stdout.decode().split() if each.endswith((".cdf", ".nc"))]
+
+
+def opened(path: str, engine: str, **options: object) -> xarray.Dataset | str:
+    """A dataset in memory, or why xarray cannot decode it."""
+    try:
+        with xarray.open_dataset(path, engine=engine, **options) as dataset:
+            return dataset.load()
+    except ValueError as error:
+        return str(error)
+
+
+@pytest.fixture(params=KINDS)
+def everything(request: pytest.FixtureRequest, tmp_path: Path) -> str:
+    return generate(tmp_path / "everything.nc", MORE, request.param)
+
+
+@pytest.fixture
+def cubes(tmp_path: Path) -> list[str]:
+    """Four files of records that follow each other."""
+    paths = []
+    for number in range(4):
+        paths.append(str(tmp_path / f"cube{number}.nc"))
+        with netcdf_file(paths[-1], "w", version=2) as file:
+            for name, length in (("time", None), ("y", 30), ("x", 40)):
+                file.createDimension(name, length)
+            file.createVariable("time", "d", ("time",))[:] = np.arange(5.0) + 5 * number
+            file.createVariable("v", "f", ("time", "y", "x"))[:] = \
+                np.arange(5 * 30 * 40, dtype="f4").reshape(5, 30, 40) + 10000 * number
+            file.variables["time"].units = "days since 2000-01-01"
+    return paths
+
+
+def python(code: str, *arguments: str) -> subprocess.CompletedProcess[str]:
+    """A program in an interpreter of its own."""
+    return subprocess.run([sys.executable, "-B", "-c", code, *arguments], text=True,
+                          capture_output=True, check=False)
+
+
+# Being found.
+
+
+def test_xarray_finds_the_engine_by_itself() -> None:
+    done = python("import sys, xarray\n"
+                  "assert 'tessel' not in sys.modules\n"
+                  "print(type(xarray.backends.list_engines()['tessel']))")
+    assert done.stdout == "<class 'tessel.xarray.engine.TesselBackendEntrypoint'>\n", done.stderr
+    assert "warn" not in done.stderr.lower()
+
+
+def test_the_package_itself_needs_no_xarray() -> None:
+    done = python("import sys, tessel\nassert 'xarray' not in sys.modules")
+    assert done.returncode == 0, done.stderr
+
+
+def test_the_default_engines_stay_what_they_are(everything: str) -> None:
+    engines = list(list_engines())
+    assert "tessel" in engines
+    assert all(engines.index(each) < engines.index("tessel") for each in ("netcdf4", *OTHERS))
+    assert guess_engine(everything) == "netcdf4"
+
+
+def test_the_engine_is_guessed_where_there_is_no_other(everything: str,
+                                                       monkeypatch: pytest.MonkeyPatch) -> None:
+    only = {"tessel": list_engines()["tessel"]}
+    monkeypatch.setattr("xarray.backends.plugins.list_engines", lambda: only)
+    with xarray.open_dataset(everything, decode_times=False) as dataset:
+        assert dataset.title == "everything"
+
+
+# What is in a file.
+
+
+@pytest.mark.parametrize("options", DECODING, ids=str)
+@pytest.mark.parametrize("path", ferret_files(), ids=os.path.basename)
+def test_real_files_are_what_the_other_engines_say(path: str, options: dict[str, object]) -> None:
+    ours = opened(path, "tessel", **options)
+    for engine in OTHERS:
+        theirs = opened(path, engine, **options)
+        if isinstance(ours, str):
+            assert ours == theirs
+        else:
+            xarray.testing.assert_identical(ours, theirs)
+            same_details(ours, theirs, engine)
+
+
+def same_details(ours: xarray.Dataset, theirs: xarray.Dataset, engine: str) -> None:
+    """What `assert_identical` does not look at."""
+    assert list(ours.variables) == list(theirs.variables)
+    assert ours.encoding["unlimited_dims"] == theirs.encoding["unlimited_dims"]
+    for name in ours.variables:
+        mine, other = ours[name], theirs[name]
+        assert mine.dtype == other.dtype and mine.dims == other.dims
+        same_attributes(mine.attrs, other.attrs, engine)
+        for key in ("source", "original_shape") if engine == "netcdf4" else ():
+            assert mine.encoding[key] == other.encoding[key]
+        for key in ("dtype", "_FillValue", "missing_value", "scale_factor", "add_offset", "units",
+                    "calendar", "coordinates"):
+            assert (key in mine.encoding) == (key in other.encoding), (name, key)
+            np.testing.assert_equal(mine.encoding.get(key), other.encoding.get(key))
+    same_attributes(ours.attrs, theirs.attrs, engine)
+
+
+def same_attributes(ours: dict[str, object], theirs: dict[str, object], engine: str) -> None:
+    assert list(ours) == list(theirs)
+    for name, value in ours.items():
+        other = theirs[name]
+        np.testing.assert_equal(value, other)
+        assert isinstance(value, np.ndarray) == isinstance(other, np.ndarray), name
+        if engine == "netcdf4":  # SciPy leaves numbers in the byte order of the file
+            assert type(value) is type(other), name
+            assert getattr(value, "dtype", None) == getattr(other, "dtype", None), name
+
+
+@pytest.mark.parametrize("options", DECODING, ids=str)
+def test_everything_is_what_the_other_engines_say(everything: str,
+                                                  options: dict[str, object]) -> None:
+    ours = opened(everything, "tessel", **options)
+    for engine in OTHERS:
+        theirs = opened(everything, engine, **options)
+        xarray.testing.assert_identical(ours, theirs)
+        same_details(ours, theirs, engine)
+
+
+def test_texts_that_are_not_utf8(tmp_path: Path) -> None:
+    """Where others lose the bytes, they come as Latin-1; a text ends at its first zero byte."""
+    path = generate(tmp_path / "latin.nc", """variables: int v ;
+        v:latin = "\\351t\\351" ; v:ended = "a\\000b" ; v:none = "" ;""")
+    with xarray.open_dataset(path, engine="tessel") as dataset:
+        assert dataset.v.attrs == {"latin": "\u00e9t\u00e9", "ended": "a", "none": ""}
+
+
+def test_names_in_utf8(tmp_path: Path) -> None:
+    path = str(tmp_path / "names.nc")
+    with netCDF4.Dataset(path, "w", format="NETCDF3_CLASSIC") as file:
+        file.createDimension("gr\u00f6\u00dfe", 2)
+        variable = file.createVariable("\u6e29\u5ea6", "f4", ("gr\u00f6\u00dfe",))
+        variable.setncattr("\u00e9t\u00e9", "\u00e9t\u00e9")
+        variable[:] = 1, 2
+    xarray.testing.assert_identical(opened(path, "tessel"), opened(path, "netcdf4"))
+
+
+def test_values_are_read_when_they_are_asked_for(cubes: list[str],
+                                                 monkeypatch: pytest.MonkeyPatch) -> None:
+    read = []
+    original = OpenFile.read
+
+    def spy(self: OpenFile, operation: str, varid: int, *places: list[int],
+            **options: bool) -> object:
+        read.append((varid, *places))
+        return original(self, operation, varid, *places, **options)
+
+    monkeypatch.setattr(OpenFile, "read", spy)
+    with xarray.open_dataset(cubes[0], engine="tessel", decode_times=False) as dataset:
+        assert read == [(0, [0], [5])]  # the coordinate, which xarray makes an index of
+        part = dataset.v.isel(time=2)[4:8]
+        assert len(read) == 1
+        part.load()
+        assert read[1:] == [(1, [2, 4, 0], [1, 4, 40])]
+
+
+def test_a_vectorised_selection(cubes: list[str]) -> None:
+    points = {"y": xarray.DataArray([3, 1, 29, 3], dims="p"),
+              "x": xarray.DataArray([0, 39, -1, 5], dims="p")}
+    with xarray.open_dataset(cubes[0], engine="tessel") as ours, \
+            xarray.open_dataset(cubes[0], engine="netcdf4") as theirs:
+        xarray.testing.assert_identical(ours.isel(points).load(), theirs.isel(points).load())
+
+
+def test_many_files_as_one(cubes: list[str]) -> None:
+    for options in ({}, {"parallel": True}, {"chunks": {"time": 2, "x": 7}}):
+        with xarray.open_mfdataset(cubes, engine="tessel", **options) as ours, \
+                xarray.open_mfdataset(cubes, engine="netcdf4", **options) as theirs:
+            assert ours.v.chunks and ours.sizes["time"] == 20
+            xarray.testing.assert_identical(ours.mean("time").load(), theirs.mean("time").load())
+            xarray.testing.assert_identical(ours.load(), theirs.load())
+
+
+# Files that are not for the engine.
+
+
+@pytest.mark.parametrize("beginning", [b"\x89HDF\r\n\x1a\n", b"CDF\5", b"CDF", b"", b"netcdf x {"])
+def test_a_file_of_another_format(tmp_path: Path, beginning: bytes) -> None:
+    path = tmp_path / "other.nc"
+    path.write_bytes(beginning + bytes(100) if len(beginning) > 3 else beginning)
+    assert not TesselBackendEntrypoint().guess_can_open(path)
+    descriptors = open_descriptors()
+    with pytest.raises(tessel.Error, match="The engine \"tessel\" opens files of the classic"):
+        xarray.open_dataset(path, engine="tessel")
+    assert open_descriptors() == descriptors
+
+
+def test_a_real_file_of_another_format(tmp_path: Path) -> None:
+    path = tmp_path / "four.nc"
+    with netCDF4.Dataset(path, "w") as file:
+        file.title = "four"
+    with pytest.raises(OSError, match="none of them"):
+        xarray.open_dataset(path, engine="tessel")
+    with xarray.open_dataset(path) as dataset:
+        assert dataset.title == "four"
+
+
+def test_what_is_no_file(tmp_path: Path) -> None:
+    guess = TesselBackendEntrypoint().guess_can_open
+    for each in (tmp_path, tmp_path / "missing.nc", "http://localhost/a.nc", b"CDF\1", None, 3,
+                 "nul\0", object()):
+        assert not guess(each)
+    with pytest.raises(FileNotFoundError):
+        xarray.open_dataset(tmp_path / "missing.nc", engine="tessel")
+    with pytest.raises(tessel.Error):
+        xarray.open_dataset(tmp_path, engine="tessel")
+    with pytest.raises(TypeError):
+        xarray.open_dataset(3, engine="tessel")
+
+
+def test_a_file_that_must_not_be_read(everything: str) -> None:
+    os.chmod(everything, 0)
+    done = python("""
+import os, sys
+from tessel.xarray import TesselBackendEntrypoint
+if os.geteuid() == 0:  # who may read everything
+    os.seteuid(65534)
+engine = TesselBackendEntrypoint()
+assert not engine.guess_can_open(sys.argv[1])
+try:
+    engine.open_dataset(sys.argv[1])
+except PermissionError as error:
+    print(error.filename)""", everything)
+    assert done.stdout == f"{everything}\n", done.stderr
+
+
+# Files that come and go.
+
+
+def test_all_is_closed_with_the_dataset(cubes: list[str]) -> None:
+    before = open_descriptors()
+    dataset = xarray.open_dataset(cubes[0], engine="tessel")
+    dataset.v[0].load()
+    assert cubes[0] in open_descriptors()
+    dataset.close()
+    assert open_descriptors() == before
+    assert dataset.v[1, 2, 3] == 1200 + 83  # it is opened again where it is needed
+    del dataset
+    gc.collect()
+    assert open_descriptors() == before
+
+
+def test_a_pickled_dataset_is_read_elsewhere(cubes: list[str], tmp_path: Path) -> None:
+    with xarray.open_dataset(cubes[1], engine="tessel") as dataset:
+        data = pickle.dumps(dataset)
+        assert len(data) < 20_000  # without the values
+        xarray.testing.assert_identical(pickle.loads(data).load(), dataset.load())
+    (tmp_path / "pickled").write_bytes(data)
+    done = python("import pickle, sys\n"
+                  "dataset = pickle.load(open(sys.argv[1], 'rb'))\n"
+                  "print(float(dataset.v[4, 29, 39]))", str(tmp_path / "pickled"))
+    assert done.stdout == "15999.0\n", done.stderr
+
+
+def test_files_that_the_cache_drops_are_opened_again(cubes: list[str]) -> None:
+    """Threads that read from four files, of which one at a time can be open."""
+    with xarray.set_options(file_cache_maxsize=1):
+        datasets = [xarray.open_dataset(path, engine="tessel", cache=False) for path in cubes]
+
+        def read(turn: int) -> None:
+            number = turn * 7 % 4
+            values = datasets[number].v[turn % 5, :, ::3].values
+            expected = np.arange(1200, dtype="f4").reshape(30, 40)[:, ::3] + 1200 * (turn % 5)
+            np.testing.assert_array_equal(values, expected + 10000 * number)
+
+        with ThreadPoolExecutor(6) as pool:
+            list(pool.map(read, range(400)))
+        assert len({each for each in open_descriptors() if each in cubes}) <= 1
+        for dataset in datasets:
+            dataset.close()
+
+
+def test_another_file_in_its_place(cubes: list[str], tmp_path: Path) -> None:
+    """While it is open, it is read on; when it has to be opened again, the other one is found."""
+    path = str(tmp_path / "place.nc")
+    shutil.copy(cubes[0], path)
+    dataset = xarray.open_dataset(path, engine="tessel", cache=False)
+    os.replace(generate(tmp_path / "other.nc", "dimensions: y = 2; variables: float v(y);"), path)
+    assert dataset.v[1, 0, 0] == 1200
+    os.remove(path)
+    assert dataset.v[2, 0, 0] == 2400
+    dataset.close()
+    generate(Path(path), "dimensions: y = 2; variables: float v(y);")
+    with pytest.raises(OSError, match="v is not any more what it was"):
+        dataset.v[1, 0, 0].load()
+    dataset.close()
+
+
+def test_a_file_that_grew(cubes: list[str]) -> None:
+    dataset = xarray.open_dataset(cubes[0], engine="tessel", cache=False)
+    with netcdf_file(cubes[0], "a") as file:
+        file.variables["v"][7] = np.full((30, 40), 5, "f4")
+    assert dataset.v[4, 0, 0] == 4800
+    dataset.close()
+    assert dataset.v[4, 0, 0] == 4800 and dataset.v.shape == (5, 30, 40)
+    dataset.close()
+
+
+@pytest.mark.parametrize("mapped", [True, False])
+def test_a_file_that_is_cut_off(cubes: list[str], mapped: bool) -> None:
+    size = os.path.getsize(cubes[0])
+    file = OpenFile(cubes[0], mapped)
+    assert file.read("get_vara_float", 1, [4, 29, 30], [1, 1, 10])[-1] == 5999
+    os.truncate(cubes[0], size - 5000)
+    for once in (False, True):
+        for start in (4, 0):
+            with pytest.raises(OSError, match="became shorter while it was open") as error:
+                file.read("get_vara_float", 1, [start, 29, 30], [1, 1, 10], once=once)
+            assert error.value.word == "fileTooShort" and error.value.path == cubes[0]
+            assert error.value.__notes__ == [f"file: {cubes[0]}"]
+    os.truncate(cubes[0], size)  # what is there now are zeros, which nobody wrote
+    with pytest.raises(OSError, match="became shorter while it was open"):
+        file.read("get_vara_float", 1, [4, 29, 30], [1, 1, 10])
+    assert file.mapped is mapped
+    file.close()
+    os.truncate(cubes[0], size - 5000)
+    with pytest.raises(tessel.Error, match="cut off"):
+        OpenFile(cubes[0], mapped)
+
+
+def test_a_file_that_is_cut_off_while_it_is_read(tmp_path: Path) -> None:
+    """In the middle of a call, too, it is an error, in every mapped page that is gone."""
+    path = tmp_path / "long.nc"
+    with netcdf_file(path, "w", version=2) as made:
+        made.createDimension("x", 50_000_000)
+        made.createVariable("v", "b", ("x",))[:] = 1
+    size = os.path.getsize(path)
+    for _ in range(5):
+        with OpenFile(str(path)) as file:
+            file.read("get_vara_schar", 0, [0], [1])
+            cutter = threading.Timer(0.003, os.truncate, (path, 4096))
+            cutter.start()
+            try:
+                values = file.read("get_vara_schar", 0, [0], [50_000_000])
+                assert values.all()  # the call was over before
+            except OSError as error:
+                assert "became shorter" in str(error)
+            cutter.join()
+            with pytest.raises(OSError, match="became shorter"):
+                file.read("get_vara_schar", 0, [0], [50_000_000])
+        path.write_bytes(path.read_bytes() + bytes([1]) * (size - 4096))
+
+
+@pytest.mark.without_sanitizers  # which answer signals themselves
+@pytest.mark.parametrize("before", ["", "faulthandler.enable()\n"])
+@pytest.mark.parametrize("after", ["", "faulthandler.enable()\n"])
+def test_signals_of_others_stay_what_they_are(tmp_path: Path, before: str, after: str) -> None:
+    """A look at what is gone from somebody else's mapping still ends the process."""
+    done = python(f"""
+import faulthandler, mmap, os, sys
+from tessel import _faults
+{before}
+_faults.begin(); assert not _faults.end()
+{after}
+with open(sys.argv[1], "w+b") as file:
+    file.truncate(8192)
+    mapping = mmap.mmap(file.fileno(), 8192)
+    file.truncate(0)
+    mapping[5000]
+print("survived")""", str(tmp_path / "mapped"))
+    assert done.returncode == -signal.SIGBUS and "survived" not in done.stdout
+    assert ("Bus error" in done.stderr) == bool(before or after)
+    sent = python("import os, signal\nfrom tessel import _faults\n_faults.begin()\n"
+                  "os.kill(os.getpid(), signal.SIGBUS)\nprint('survived')")
+    assert sent.returncode == -signal.SIGBUS and not sent.stdout
+
+
+def test_a_file_that_cannot_be_mapped(cubes: list[str], monkeypatch: pytest.MonkeyPatch) -> None:
+    monkeypatch.setattr(opening, "MAPPED", 16 | 64)  # a mode that the library refuses
+    with OpenFile(cubes[0]) as file:
+        values = file.read("get_vara_float", 1, [0, 0, 0], [5, 30, 40])
+        assert not file.mapped
+    np.testing.assert_array_equal(values.T.ravel(), np.arange(6000))
+
+
+def test_the_costs_are_those_of_the_file(cubes: list[str]) -> None:
+    with xarray.open_dataset(cubes[0], engine="tessel") as dataset:
+        array = dataset.v.variable._data
+        while not hasattr(array, "costs"):
+            array = array.array
+        assert array.costs is planning.COSTS[True, False]
