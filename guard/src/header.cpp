@@ -22,8 +22,11 @@ constexpr std::uint64_t maxDimensions = 1024;
 /// The lists of a header, by their tags.
 enum : std::uint32_t { dimensionList = 10, variableList = 11, attributeList = 12 };
 
-/// The bytes of an element of each external type; the numbers of the types begin with 1.
-constexpr std::array<unsigned, 12> typeSizes = {0, 1, 1, 2, 4, 4, 8, 1, 2, 4, 8, 8};
+/// The bytes of an element of each external type; the numbers of the types begin with 1. The last
+/// one is no type of these formats, and known to the library all the same, which divides by its
+/// size where it is a variable's. It refuses all beyond.
+constexpr std::array<unsigned, 13> typeSizes = {0, 1, 1, 2, 4, 4, 8, 1, 2, 4, 8, 8, 0};
+constexpr std::uint64_t typeWithoutSize = typeSizes.size() - 1;
 
 /// Nothing more can be said: the file is not of these formats, or cannot be read. The library says
 /// so itself.
@@ -152,8 +155,11 @@ class Walk {
     void attributes() {
         for (std::uint64_t n = list(attributeList, "attributes"); n > 0 && reader.left() > 0; --n) {
             name();
-            const std::uint64_t type = externalType();
+            const std::uint64_t type = reader.number(4);
             const std::uint64_t values = count("values in an attribute");
+            if (type >= typeSizes.size()) {
+                throw Ended{};
+            }
             reader.skip(padded(values * typeSizes[static_cast<std::size_t>(type)]));
         }
     }
@@ -168,21 +174,11 @@ class Walk {
         }
         reader.skip(dimensions * countSize);
         attributes();
-        externalType();
+        if (reader.number(4) == typeWithoutSize) {
+            throw Distrusted{"has a variable of the type " + std::to_string(typeWithoutSize) +
+                             ", which has no size"};
+        }
         reader.skip(countSize + offsetSize); // size and place
-    }
-
-    /// The type after the last one is known to the library, which gives it the size 0 and divides
-    /// by that. Others that the formats do not have are refused by the library.
-    std::uint64_t externalType() {
-        const std::uint64_t type = reader.number(4);
-        if (type == typeSizes.size()) {
-            throw Distrusted{"has the type " + std::to_string(type) + ", which has no size"};
-        }
-        if (type > typeSizes.size()) {
-            throw Ended{};
-        }
-        return type;
     }
 
     static std::uint64_t padded(std::uint64_t bytes) noexcept { return (bytes + 3) / 4 * 4; }

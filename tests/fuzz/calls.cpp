@@ -113,8 +113,8 @@ void keepInFolder(const Array &name) {
     }
 }
 
-/// Whether a call asks for a file that is based on HDF5, which does not survive the end of the
-/// process once it has failed to close one.
+/// Whether a call asks for a file that is based on HDF5. One whose closing fails stays open within
+/// HDF5, which needs its descriptor until the process ends, and the next run would find it open.
 bool asksForHdf5(std::string_view operation, const std::vector<Array> &inputs) {
     const bool creates = operation.ends_with("create") && inputs.size() > 2;
     const bool chooses = operation.ends_with("set_default_format") && inputs.size() > 1;
@@ -178,7 +178,8 @@ class Session {
             }
             const std::string after = called(netcdf, "inq", ncid).identifier;
             if (after.empty() || !isGone(after)) {
-                die("a dataset is still there after its end: " + identifier + " " + after);
+                die("a dataset is still there after its end: " +
+                    identifier.append(" ").append(after));
             }
         }
         called(netcdf, "set_default_format", 1);

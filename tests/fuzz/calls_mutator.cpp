@@ -4,7 +4,6 @@
 
 #include <algorithm>
 #include <cstdint>
-#include <cstring>
 
 extern "C" std::size_t LLVMFuzzerMutate(std::uint8_t *data, std::size_t size, std::size_t most);
 
@@ -24,6 +23,6 @@ extern "C" std::size_t LLVMFuzzerCustomMutator(std::uint8_t *data, std::size_t s
         sequence.pop_back();
         text = fuzz::printed(sequence);
     }
-    std::memcpy(data, text.data(), text.size());
+    std::copy(text.begin(), text.end(), data);
     return text.size();
 }

@@ -116,7 +116,7 @@ std::optional<Value> valueIn(std::string_view text) {
 
 std::string spelled(double value) {
     std::array<char, 32> digits{};
-    const auto end = std::to_chars(digits.data(), digits.data() + digits.size(), value).ptr;
+    char *const end = std::to_chars(digits.data(), digits.data() + digits.size(), value).ptr;
     return {digits.data(), end};
 }
 

@@ -93,7 +93,7 @@ const Fatal rows[] = {
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
      }},
-    {"OpenOfATypeWithoutSize", "TESSEL:guard:header", "has the type 12",
+    {"OpenOfATypeWithoutSize", "TESSEL:guard:header", "has a variable of the type 12",
      [](const Module &netcdf, const Folder &folder) {
          open(netcdf, folder,
               "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) +
