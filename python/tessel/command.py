@@ -6,6 +6,7 @@ from __future__ import annotations
 import argparse
 import os
 from collections.abc import Callable
+from typing import get_args
 
 import tessel
 from tessel import integrity, notes, show, terminal, wording
@@ -93,6 +94,13 @@ def _add_check(parser: argparse.ArgumentParser) -> None:
                         help="do not refuse a file that was cut off")
 
 
+def _add_guard(parser: argparse.ArgumentParser) -> None:
+    parser.add_argument("--guard", choices=get_args(tessel.Guard),
+                        help="what is refused: addresses given as file names and the few calls "
+                             "that the netCDF library does not survive (on), only the latter "
+                             "(remote), or nothing (off); else what TESSEL_GUARD says, or on")
+
+
 def parser() -> argparse.ArgumentParser:
     """The command line as its arguments are read; the manual page is made of it as well."""
     whole = terminal.Parser(prog="tessel", description=__doc__)
@@ -131,6 +139,9 @@ def parser() -> argparse.ArgumentParser:
     check = command("check", _check, "find out whether a file was cut off")
     check.add_argument("file", metavar="FILE", help="the netCDF file")
 
+    for each in (info, plot, copy, check):
+        _add_guard(each)
+
     ops = command("ops", _ops, "explain the operations of the module")
     ops.add_argument("name", metavar="NAME", nargs="?", help="the operation; else all are listed")
     return whole
@@ -149,4 +160,6 @@ def _line(error: Exception, options: argparse.Namespace) -> str:
 def main(arguments: list[str] | None = None) -> int:
     """The command line; returns its exit status."""
     options = parser().parse_args(arguments)
+    if getattr(options, "guard", None) is not None:
+        os.environ["TESSEL_GUARD"] = options.guard
     return terminal.run(lambda: options.action(options), lambda error: _line(error, options))

@@ -75,3 +75,23 @@ def test_read_and_check_refuse_addresses_too():
         with pytest.raises(tessel.Error) as raised:
             call()
         assert raised.value.identifier == "TESSEL:guard:remote"
+
+
+@pytest.mark.parametrize(("options", "variable", "refused"), [
+    ([], None, True),
+    (["--guard", "on"], "off", True),
+    (["--guard", "remote"], None, False),
+    (["--guard", "off"], None, False),
+    ([], "remote", False),
+])
+def test_addresses_on_the_command_line(options, variable, refused):
+    variables = {} if variable is None else {"TESSEL_GUARD": variable}
+    done = subprocess.run([sys.executable, "-B", "-m", "tessel", "info", *options,
+                           "https://127.0.0.1:1/a.nc"], capture_output=True, text=True,
+                          check=False, env={**os.environ, **variables})
+    assert done.returncode == 1
+    assert done.stdout == ""
+    *others, line = done.stderr.splitlines()
+    assert line.startswith("tessel: ")
+    assert ("is an address" in line) == refused
+    assert bool(others) != refused  # what the library says of its attempt
