@@ -170,7 +170,14 @@ def title(text: str, line: str) -> str:
     return f"{text}\n{line * max(len(text), 3)}\n\n"
 
 
-def rst_errors(errors: Iterable[Raised], end: str = "") -> str:
+def sentence(cause: str, names: Iterable[str] = ()) -> str:
+    """A cause as a sentence; the name of an argument stays as it is."""
+    first = cause.split()[0]
+    begun = cause if first in names else cause[0].upper() + cause[1:]
+    return rst(begun).rstrip(".") + "."
+
+
+def rst_errors(errors: Iterable[Raised], end: str = "", names: Iterable[str] = ()) -> str:
     """Errors as a list, each with a link to what its word means."""
     parts = []
     for each in errors:
@@ -179,7 +186,7 @@ def rst_errors(errors: Iterable[Raised], end: str = "") -> str:
         python = f"; in Python also {also.__name__}" if also else ""
         help_ = f" :term:`{word}` says what to do{python}." if word else ""
         parts.append(f"{code(each.identifier + end)}\n"
-                     f"   {rst(each.cause[0].upper() + each.cause[1:]).rstrip('.')}.{help_}\n\n"
+                     f"   {sentence(each.cause, names)}{help_}\n\n"
                      f"   {code(each.message)}\n\n")
     return "".join(parts)
 
@@ -203,7 +210,8 @@ def rst_page(operation: Operation) -> str:
             f"   | Python: {rst(each.kind.wording)}\n   | host: {rst(each.kind.host)}\n\n"
             for each in entries))
     if page.raised:
-        parts.append(title("Errors", "-") + rst_errors(page.raised))
+        parts.append(title("Errors", "-") + rst_errors(
+            page.raised, names=[each.name for each in operation.arguments]))
     parts += [title(name, "~") + f"{rst(note)}\n\n" + rst_errors(errors, end)
               for name, note, errors, end in page.others]
     parts += [title("Example", "-"), block("pycon", reference.example_of(operation))]
