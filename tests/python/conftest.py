@@ -1,6 +1,7 @@
-# tests/python/conftest.py: a mark for tests that a build with sanitizers cannot run.
-"""`without_sanitizers` marks them. ctest has them as a test of their own, which it counts as not run
-in such a build; a test that is skipped inside of another would not be seen."""
+# tests/python/conftest.py: marks for tests that cannot run everywhere.
+"""`without_sanitizers` marks what a build with sanitizers cannot run, and `separate_hosts` what needs
+networks of its own. ctest has each of them as a test of its own, which it counts as not run where
+that is so; a test that is skipped inside of another would not be seen."""
 
 from __future__ import annotations
 
@@ -10,7 +11,9 @@ import pytest
 
 
 def pytest_configure(config: pytest.Config) -> None:
-    """Makes the mark known."""
+    """Makes the marks known."""
+    config.addinivalue_line("markers", "separate_hosts: it needs the kernel's network namespaces, "
+                                       "which only root may make")
     config.addinivalue_line("markers", "without_sanitizers: it would fail, or take very long, in a "
                                        "build with sanitizers")
 

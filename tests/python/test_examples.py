@@ -30,7 +30,10 @@ def run(program: Path, *arguments: str | Path, temporary: Path) -> str:
     return done.stdout
 
 
-@pytest.mark.parametrize("program", EXAMPLES, ids=lambda program: program.stem)
+# Worker processes would load the sanitizers' libraries as well, and take very long.
+@pytest.mark.parametrize("program", [
+    pytest.param(each, id=each.stem, marks=[pytest.mark.without_sanitizers]
+                 if each.stem.startswith("distributed") else []) for each in EXAMPLES])
 def test_example(program: Path, tmp_path: Path) -> None:
     given, temporary = tmp_path / "given", tmp_path / "temporary"
     given.mkdir()

@@ -179,7 +179,7 @@ class BlockWriter:
             sink = _Reopened(made.path, _FileLock(made.path))
         graph, sizes = self._tasks(sink)
 
-        class Told(dask.callbacks.Callback):  # type: ignore[misc]
+        class Told(dask.callbacks.Callback):
             """Is told about every task that is done."""
 
             def _posttask(self, key: Any, *_of_task: Any) -> None:

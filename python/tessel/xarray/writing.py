@@ -37,8 +37,8 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
               progress: Progress | None = None, block_bytes: int = BLOCK_BYTES) -> None:
     """Writes a dataset into a file of a classic format.
 
-        >>> tessel.xarray.to_netcdf(dataset, "sst.nc", encoding={"sst": {"dtype": "int16", \
-"scale_factor": 0.01, "_FillValue": -999}})
+        >>> packed = {"dtype": "int16", "scale_factor": 0.01, "_FillValue": -999}
+        >>> tessel.xarray.to_netcdf(dataset, "sst.nc", encoding={"sst": packed})
 
     `format` is "NETCDF3_64BIT", which it is unless given, or "NETCDF3_CLASSIC". `unlimited_dims`
     and `encoding` are those of `xarray.Dataset.to_netcdf`: of the unlimited dimensions there can be
