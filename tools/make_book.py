@@ -70,8 +70,9 @@ def put_together(source: Path) -> None:
 
 def run(*command: str | Path, **more: object) -> str:
     """Runs a program; what it prints, and an end to everything if it fails."""
-    done = subprocess.run([str(each) for each in command], text=True, stdout=subprocess.PIPE,
-                          stderr=subprocess.STDOUT, check=False, **more)  # type: ignore[call-overload]
+    done = subprocess.run([str(each) for each in command],  # type: ignore[call-overload]
+                          text=True, stdout=subprocess.PIPE, stderr=subprocess.STDOUT,
+                          check=False, **more)
     if done.returncode != 0:
         sys.exit(f"{done.stdout}\nFailed: {command[0]}")
     return str(done.stdout)
@@ -123,9 +124,9 @@ def broken_links(html: Path) -> tuple[list[str], int]:
 
 
 def finish_theme(static: Path) -> None:
-    """Makes the packaged theme work from any folder and in any browser. Its style sheet names another
-    by an address of the web server's and has no rule for those who prefer dark, and its script is
-    none that browsers run: it imports what was meant to be bundled."""
+    """Makes the packaged theme work from any folder and in any browser. Its style sheet names
+    another by an address of the web server's and has no rule for those who prefer dark, and its
+    script is none that browsers run: it imports what was meant to be bundled."""
     style = static / "styles" / "furo.css"
     text = style.read_text()
     [wanted] = re.findall(r"^@import url\(/javascript/(.+?)\);$", text, re.M)
