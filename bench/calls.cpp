@@ -20,6 +20,7 @@ constexpr std::size_t largeBytes = std::size_t{256} << 20U;
 constexpr std::size_t largeElements = largeBytes / sizeof(double);
 constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / 1024 / 512};
 constexpr const char *dimension = "time";
+constexpr const char *variable = "large";
 
 /// The dataset, open for reading.
 class Dataset {
@@ -32,7 +33,7 @@ class Dataset {
         check(nc_def_dim(writing, "lon", hostDims[0], &dims[2]));
         check(nc_def_dim(writing, "lat", hostDims[1], &dims[1]));
         check(nc_def_dim(writing, dimension, hostDims[2], dims.data()));
-        check(nc_def_var(writing, "large", NC_DOUBLE, 3, dims.data(), &varid));
+        check(nc_def_var(writing, variable, NC_DOUBLE, 3, dims.data(), &varid));
         check(nc_enddef(writing));
         std::vector<double> values(largeElements);
         for (std::size_t i = 0; i < values.size(); ++i) {
@@ -52,6 +53,63 @@ class Dataset {
   private:
     bench::TemporaryFolder folder;
 };
+
+/// A call with inputs that are made once.
+template <class... Inputs>
+std::function<void()> called(const Module &netcdf, Inputs &&...made) {
+    auto held = std::make_shared<std::vector<Array>>();
+    (held->push_back(std::move(made)), ...);
+    auto inputs = std::make_shared<std::vector<const tsArray *>>();
+    for (const Array &array : *held) {
+        inputs->push_back(array.get());
+    }
+    return [&netcdf, held, inputs] {
+        const Results results = netcdf.call(*inputs);
+        benchmark::DoNotOptimize(&results);
+    };
+}
+
+/// The other inquiries, inputs at hand. Each result is a host array of its own, and "inq" and
+/// "inq_var" have four.
+void addInquiries(std::vector<Pair> &pairs, const Module &netcdf, const Dataset &data) {
+    pairs.push_back({"inq",
+                     [&data] {
+                         std::array<int, 4> all{};
+                         check(nc_inq(data.ncid, &all[0], &all[1], &all[2], &all[3]));
+                         benchmark::DoNotOptimize(all);
+                     },
+                     called(netcdf, Array::text("inq"), Array::scalar(data.ncid))});
+    pairs.push_back(
+        {"inq_dim",
+         [&data] {
+             std::array<char, NC_MAX_NAME + 1> name;
+             std::size_t length = 0;
+             check(nc_inq_dim(data.ncid, 0, name.data(), &length));
+             benchmark::DoNotOptimize(name);
+         },
+         called(netcdf, Array::text("inq_dim"), Array::scalar(data.ncid), Array::scalar(0))});
+    pairs.push_back({"inq_varid",
+                     [&data] {
+                         int varid = 0;
+                         check(nc_inq_varid(data.ncid, variable, &varid));
+                         benchmark::DoNotOptimize(varid);
+                     },
+                     called(netcdf, Array::text("inq_varid"), Array::scalar(data.ncid),
+                            Array::text(variable))});
+    pairs.push_back({"inq_var",
+                     [&data] {
+                         std::array<char, NC_MAX_NAME + 1> name;
+                         nc_type type = NC_NAT;
+                         int ndims = 0;
+                         std::array<int, NC_MAX_VAR_DIMS> dimids;
+                         int natts = 0;
+                         check(nc_inq_var(data.ncid, data.varid, name.data(), &type, &ndims,
+                                          dimids.data(), &natts));
+                         benchmark::DoNotOptimize(dimids);
+                     },
+                     called(netcdf, Array::text("inq_var"), Array::scalar(data.ncid),
+                            Array::scalar(data.varid))});
+}
 
 std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
     const auto direct = [&data] {
@@ -82,11 +140,13 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
         const Results results = netcdf("get_var_double", data.ncid, data.varid);
         benchmark::DoNotOptimize(results[0].data());
     };
-    return {
+    std::vector<Pair> pairs = {
         {"inq_dimid, inputs at hand", direct, arrays},
         {"inq_dimid, inputs made", direct, values},
-        {"get_var_double of 256 MiB", readDirect, read, true},
     };
+    addInquiries(pairs, netcdf, data);
+    pairs.push_back({"get_var_double of 256 MiB", readDirect, read, true});
+    return pairs;
 }
 
 } // namespace

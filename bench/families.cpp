@@ -1,12 +1,15 @@
 // bench/families.cpp: every typed family through the module, beside the library's own functions.
 //
 // One element a call, and blocks of 64 MiB. A block is read into new memory on both sides, of the
-// kind that the host gives out; text is read by the library into bytes.
+// kind that the host gives out; text is read by the library into bytes. Where an operation is more
+// than the one function, because it asks the library first or copies text, a second reference does
+// all of its steps.
 #include "pairs.hpp"
 #include "tessel/runtime.hpp"
 
 #include <netcdf.h>
 
+#include <algorithm>
 #include <array>
 #include <cstdio>
 #include <string>
@@ -202,9 +205,14 @@ class Type {
     void addElements(std::vector<Pair> &pairs) {
         const int put = datasets.attributes;
         const std::string name = named("one");
-        const auto add = [&](const char *family, std::function<void()> reference,
+        // What the operation asks the library first is its second reference's.
+        const auto add = [&](const char *family, const auto &asks, const auto &reference,
                              std::function<void()> module) {
-            pairs.push_back({operation(family) + "/one", std::move(reference), std::move(module)});
+            pairs.push_back({operation(family) + "/one", reference, std::move(module), false,
+                             [asks, reference] {
+                                 asks();
+                                 reference();
+                             }});
         };
         const auto intoValue = [](const auto &fill) {
             return [fill] {
@@ -214,81 +222,166 @@ class Type {
             };
         };
         const auto from = [](const auto &write) { return [write] { check(write()); }; };
+        const auto number = [](int ncid, int varid) {
+            return [ncid, varid] {
+                int ndims = 0;
+                check(nc_inq_varndims(ncid, varid, &ndims));
+                benchmark::DoNotOptimize(ndims);
+            };
+        };
+        const auto numberAndIDs = [number](int ncid, int varid) {
+            return [ask = number(ncid, varid), ncid, varid] {
+                ask();
+                std::array<int, 2> dimids{};
+                check(nc_inq_vardimid(ncid, varid, dimids.data()));
+                benchmark::DoNotOptimize(dimids);
+            };
+        };
+        const auto nameAndNumber = [](int ncid, int varid) {
+            return [ncid, varid] {
+                std::array<char, NC_MAX_NAME + 1> held;
+                int ndims = 0;
+                check(nc_inq_var(ncid, varid, held.data(), nullptr, &ndims, nullptr, nullptr));
+                benchmark::DoNotOptimize(held);
+            };
+        };
+        const auto attribute = [put, name] {
+            nc_type type = NC_NAT;
+            std::size_t length = 0;
+            check(nc_inq_att(put, NC_GLOBAL, name.c_str(), &type, &length));
+            benchmark::DoNotOptimize(length);
+        };
+        const auto nothing = [] {};
         const Library<T> &f = library;
         const T *const value = values.data();
         const int ncid = data();
-        add("get_var", intoValue([=, this](T *to) { return f.getVar(ncid, one, to); }),
+        add("get_var", numberAndIDs(ncid, one),
+            intoValue([=, this](T *to) { return f.getVar(ncid, one, to); }),
             call("get_var", ncid, one));
-        add("get_var1",
+        add("get_var1", number(ncid, block),
             intoValue([=, this](T *to) { return f.getVar1(ncid, block, origin.data(), to); }),
             call("get_var1", ncid, block, origin));
-        add("get_vara", intoValue([=, this](T *to) {
+        add("get_vara", number(ncid, block), intoValue([=, this](T *to) {
                 return f.getVara(ncid, block, origin.data(), single.data(), to);
             }),
             call("get_vara", ncid, block, origin, single));
-        add("get_vars", intoValue([=, this](T *to) {
+        add("get_vars", numberAndIDs(ncid, wide), intoValue([=, this](T *to) {
                 return f.getVars(ncid, wide, origin.data(), single.data(), stride.data(), to);
             }),
             call("get_vars", ncid, wide, origin, single, stride));
-        add("get_att", intoValue([=](T *to) { return f.getAtt(put, NC_GLOBAL, name.c_str(), to); }),
+        add("get_att", attribute,
+            intoValue([=](T *to) { return f.getAtt(put, NC_GLOBAL, name.c_str(), to); }),
             call("get_att", put, NC_GLOBAL, name));
-        add("put_var", from([=, this] { return f.putVar(ncid, one, value); }),
+        add("put_var", number(ncid, one), from([=, this] { return f.putVar(ncid, one, value); }),
             call("put_var", ncid, one, hostOne));
-        add("put_var1", from([=, this] { return f.putVar1(ncid, block, origin.data(), value); }),
+        add("put_var1", nameAndNumber(ncid, block),
+            from([=, this] { return f.putVar1(ncid, block, origin.data(), value); }),
             call("put_var1", ncid, block, origin, hostOne));
-        add("put_vara",
+        add("put_vara", nameAndNumber(ncid, block),
             from([=, this] { return f.putVara(ncid, block, origin.data(), single.data(), value); }),
             call("put_vara", ncid, block, origin, single, hostOne));
-        add("put_vars", from([=, this] {
+        add("put_vars", nameAndNumber(ncid, wide), from([=, this] {
                 return f.putVars(ncid, wide, origin.data(), single.data(), stride.data(), value);
             }),
             call("put_vars", ncid, wide, origin, single, stride, hostOne));
-        add("put_att", from([=, this] {
+        add("put_att", nothing, from([=, this] {
                 return f.putAtt(put, NC_GLOBAL, name.c_str(), library.external, 1, value);
             }),
             putAtt(name, hostOne));
     }
 
+    /// A read of text with all that it takes: a zero-filled buffer of so many bytes a character for
+    /// the library, and a zero-filled result of the host's characters.
+    template <class Fill>
+    static std::function<void()> widening(std::size_t unit, const Fill &fill) {
+        return [unit, fill] {
+            const Array result = Array::characters(count);
+            const Array buffer = Array::logical(std::array{elements + 1, unit});
+            auto *const bytes = static_cast<char *>(buffer.data());
+            check(fill(bytes));
+            std::transform(bytes, bytes + elements, static_cast<tsChar *>(result.data()),
+                           [](char byte) { return static_cast<tsChar>(byte); });
+        };
+    }
+
+    /// A write of text likewise: a zero-filled buffer, and the characters made bytes.
+    template <class Write>
+    std::function<void()> narrowing(const Write &write) const {
+        return [this, write] {
+            const Array buffer = Array::logical(std::array{elements, std::size_t{1}});
+            auto *const bytes = static_cast<char *>(buffer.data());
+            const auto characters = hostBlock.template elements<const tsChar>();
+            std::transform(characters.begin(), characters.end(), bytes,
+                           [](tsChar character) { return static_cast<char>(character); });
+            check(write(bytes));
+        };
+    }
+
+    /// A block read by `fill`; where it is text, the second reference has a buffer of so many bytes
+    /// a character.
+    template <class Fill>
+    void addRead(std::vector<Pair> &pairs, const char *family, std::size_t unit, const Fill &fill,
+                 std::function<void()> module) const {
+        Pair pair = {operation(family) + "/64MiB", intoNew(fill), std::move(module), true};
+        if constexpr (std::is_same_v<T, char>) {
+            pair.steps = widening(unit, fill);
+        }
+        pairs.push_back(std::move(pair));
+    }
+
+    /// A block written by `write`.
+    template <class Write>
+    void addWrite(std::vector<Pair> &pairs, const char *family, const Write &write,
+                  std::function<void()> module) const {
+        Pair pair = {operation(family) + "/64MiB",
+                     [from = values.data(), write] { check(write(from)); }, std::move(module),
+                     true};
+        if constexpr (std::is_same_v<T, char>) {
+            pair.steps = narrowing(write);
+        }
+        pairs.push_back(std::move(pair));
+    }
+
     void addBlocks(std::vector<Pair> &pairs) {
         const int put = datasets.attributes;
         const std::string name = named("block");
-        const auto add = [&](const char *family, std::function<void()> reference,
-                             std::function<void()> module) {
-            pairs.push_back(
-                {operation(family) + "/64MiB", std::move(reference), std::move(module), true});
-        };
         const Library<T> &f = library;
-        const T *const from = values.data();
         const int ncid = data();
-        add("get_var", intoNew([=, this](T *to) { return f.getVar(ncid, block, to); }),
+        addRead(
+            pairs, "get_var", 1, [=, this](T *to) { return f.getVar(ncid, block, to); },
             call("get_var", ncid, block));
-        add("get_vara", intoNew([=, this](T *to) {
-                return f.getVara(ncid, block, origin.data(), count.data(), to);
-            }),
+        addRead(
+            pairs, "get_vara", 2,
+            [=, this](T *to) { return f.getVara(ncid, block, origin.data(), count.data(), to); },
             call("get_vara", ncid, block, origin, count));
-        add("get_vars", intoNew([=, this](T *to) {
+        addRead(
+            pairs, "get_vars", 2,
+            [=, this](T *to) {
                 return f.getVars(ncid, wide, origin.data(), count.data(), stride.data(), to);
-            }),
+            },
             call("get_vars", ncid, wide, origin, count, stride));
-        add("get_att", intoNew([=](T *to) { return f.getAtt(put, NC_GLOBAL, name.c_str(), to); }),
+        addRead(
+            pairs, "get_att", 2, [=](T *to) { return f.getAtt(put, NC_GLOBAL, name.c_str(), to); },
             call("get_att", put, NC_GLOBAL, name));
-        add(
-            "put_var", [=, this] { check(f.putVar(ncid, block, from)); },
+        addWrite(
+            pairs, "put_var", [=, this](const T *from) { return f.putVar(ncid, block, from); },
             call("put_var", ncid, block, hostBlock));
-        add(
-            "put_vara",
-            [=, this] { check(f.putVara(ncid, block, origin.data(), count.data(), from)); },
+        addWrite(
+            pairs, "put_vara",
+            [=, this](const T *from) {
+                return f.putVara(ncid, block, origin.data(), count.data(), from);
+            },
             call("put_vara", ncid, block, origin, count, hostBlock));
-        add(
-            "put_vars",
-            [=, this] {
-                check(f.putVars(ncid, wide, origin.data(), count.data(), stride.data(), from));
+        addWrite(
+            pairs, "put_vars",
+            [=, this](const T *from) {
+                return f.putVars(ncid, wide, origin.data(), count.data(), stride.data(), from);
             },
             call("put_vars", ncid, wide, origin, count, stride, hostBlock));
-        add(
-            "put_att",
-            [=, this] {
-                check(f.putAtt(put, NC_GLOBAL, name.c_str(), library.external, elements, from));
+        addWrite(
+            pairs, "put_att",
+            [=, this](const T *from) {
+                return f.putAtt(put, NC_GLOBAL, name.c_str(), library.external, elements, from);
             },
             putAtt(name, hostBlock));
     }

@@ -18,40 +18,63 @@ namespace {
 constexpr int repetitions = 25;
 constexpr int blockRepetitions = 9;
 constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
+constexpr benchmark::TimeUnit blockUnit = benchmark::kMillisecond;
 
 double shortest(const std::vector<double> &all) {
     return *std::min_element(all.begin(), all.end());
 }
 
-/// The statistics of all benchmarks, in seconds, by "NAME/STATISTIC".
+/// The statistics of all benchmarks, in seconds, by "NAME/STATISTIC": of what is short the time of
+/// the processor, from which other work on the machine takes little away, and of blocks the time
+/// that passes.
 class Statistics : public benchmark::ConsoleReporter {
   public:
     void ReportRuns(const std::vector<Run> &runs) override {
         ConsoleReporter::ReportRuns(runs);
         for (const Run &run : runs) {
             seconds[run.run_name.function_name + "/" + run.aggregate_name] =
-                run.GetAdjustedRealTime() / benchmark::GetTimeUnitMultiplier(run.time_unit);
+                (run.time_unit == blockUnit ? run.GetAdjustedRealTime()
+                                            : run.GetAdjustedCPUTime()) /
+                benchmark::GetTimeUnitMultiplier(run.time_unit);
         }
     }
 
-    /// One statistic of a pair: "1.2 us | 1.5 us | +300 ns | 1.250"; empty where it was not
-    /// measured.
+    /// One statistic of a pair: "120 | 150 | +30 | 1.250"; empty where it was not measured.
     [[nodiscard]] std::string compared(const Pair &pair, const std::string &statistic) const {
         const auto reference = seconds.find(pair.name + "/reference/" + statistic);
         const auto module = seconds.find(pair.name + "/module/" + statistic);
         if (reference == seconds.end() || module == seconds.end()) {
             return {};
         }
-        std::array<char, 120> text{};
-        const double scale = pair.block ? 1e3 : 1e9;
-        std::snprintf(text.data(), text.size(), "%.*f | %.*f | %+.*f | %.3f", pair.block ? 1 : 0,
-                      reference->second * scale, pair.block ? 1 : 0, module->second * scale,
-                      pair.block ? 1 : 0, (module->second - reference->second) * scale,
-                      module->second / reference->second);
-        return text.data();
+        return number(pair, reference->second) + " | " + number(pair, module->second) + " | " +
+               compared(pair, reference->second, module->second);
+    }
+
+    /// The shortest time of the second reference and how the module's compares: "130 | +20
+    /// | 1.154".
+    [[nodiscard]] std::string comparedWithSteps(const Pair &pair) const {
+        const auto steps = seconds.find(pair.name + "/steps/shortest");
+        if (steps == seconds.end()) {
+            return "– | – | –";
+        }
+        return number(pair, steps->second) + " | " +
+               compared(pair, steps->second, seconds.at(pair.name + "/module/shortest"));
     }
 
   private:
+    static std::string number(const Pair &pair, double time, const char *format = "%.*f") {
+        std::array<char, 40> text{};
+        std::snprintf(text.data(), text.size(), format, pair.block ? 1 : 0,
+                      time * (pair.block ? 1e3 : 1e9));
+        return text.data();
+    }
+
+    static std::string compared(const Pair &pair, double reference, double module) {
+        std::array<char, 40> ratio{};
+        std::snprintf(ratio.data(), ratio.size(), "%.3f", module / reference);
+        return number(pair, module - reference, "%+.*f") + " | " + ratio.data();
+    }
+
     std::map<std::string, double> seconds;
 };
 
@@ -67,21 +90,26 @@ void add(const std::string &name, const std::function<void()> &work, bool block)
         ->UseRealTime();
     registered->ComputeStatistics("shortest", shortest);
     if (block) {
-        registered->Iterations(1)->Unit(benchmark::kMillisecond);
+        registered->Iterations(1)->Unit(blockUnit);
     } else {
         registered->MinTime(shortestTime);
     }
 }
 
 std::string table(const std::vector<Pair> &pairs, const Statistics &statistics) {
-    std::string text = "| operation | unit | library, median | module | difference | ratio | "
-                       "library, shortest | module | difference | ratio |\n"
-                       "|---|---|---|---|---|---|---|---|---|---|\n";
+    const bool anySteps =
+        std::any_of(pairs.begin(), pairs.end(), [](const Pair &pair) { return bool(pair.steps); });
+    std::string text =
+        std::string("| operation | unit | library, median | module | difference | ratio | "
+                    "library, shortest | module | difference | ratio |") +
+        (anySteps ? " all steps, shortest | difference | ratio |" : "") +
+        "\n|---|---|---|---|---|---|---|---|---|---|" + (anySteps ? "---|---|---|" : "") + "\n";
     for (const Pair &pair : pairs) {
         const std::string median = statistics.compared(pair, "median");
         if (!median.empty()) {
             text += "| " + pair.name + " | " + (pair.block ? "ms" : "ns") + " | " + median + " | " +
-                    statistics.compared(pair, "shortest") + " |\n";
+                    statistics.compared(pair, "shortest") + " |" +
+                    (anySteps ? " " + statistics.comparedWithSteps(pair) + " |" : "") + "\n";
         }
     }
     return text;
@@ -123,6 +151,9 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
     for (const Pair &pair : pairs) {
         add(pair.name + "/reference", pair.reference, pair.block);
         add(pair.name + "/module", pair.module, pair.block);
+        if (pair.steps) {
+            add(pair.name + "/steps", pair.steps, pair.block);
+        }
     }
     Statistics statistics;
     benchmark::RunSpecifiedBenchmarks(&statistics);

@@ -29,14 +29,13 @@ constexpr std::array modeNames = {
     ModeName{"NOWRITE", NC_NOWRITE},
 };
 
-/// The first element of a double or int32 array as an int.
-int firstAsInt(const tsArray *array) {
-    return tsGetClassID(array) == tsDOUBLE ? truncated<int>(*elements<double>(array))
-                                           : *elements<std::int32_t>(array);
+/// The first element of an array of the given class, double or int32, as an int.
+int firstAsInt(const tsArray *array, tsClassID found) {
+    return found == tsDOUBLE ? truncated<int>(*elements<double>(array))
+                             : *elements<std::int32_t>(array);
 }
 
-bool isDoubleOrInt32(const tsArray *array) {
-    const tsClassID found = tsGetClassID(array);
+bool isDoubleOrInt32(tsClassID found) {
     return found == tsDOUBLE || found == tsINT32;
 }
 
@@ -46,10 +45,11 @@ int unpackID(const tsArray *array, const char *label) {
     if (tsIsEmpty(array)) {
         raise(catalogue::emptySetID, label);
     }
-    if (!isDoubleOrInt32(array)) {
+    const tsClassID found = tsGetClassID(array);
+    if (!isDoubleOrInt32(found)) {
         raise(catalogue::badIDDatatype, label, tsGetClassName(array));
     }
-    return firstAsInt(array);
+    return firstAsInt(array, found);
 }
 
 std::string unpackName(const tsArray *array, const char *label) {
@@ -69,7 +69,8 @@ int unpackMode(const tsArray *array) {
     if (tsIsEmpty(array)) {
         raise(catalogue::emptySetMode);
     }
-    if (tsGetClassID(array) == tsCHAR) {
+    const tsClassID found = tsGetClassID(array);
+    if (found == tsCHAR) {
         char *text = tsArrayToString(array);
         if (text == nullptr) {
             raise(catalogue::modeExtractionFailure);
@@ -78,10 +79,10 @@ int unpackMode(const tsArray *array) {
         tsFree(text);
         return mode;
     }
-    if (!isDoubleOrInt32(array)) {
+    if (!isDoubleOrInt32(found)) {
         raise(catalogue::badModeDatatype);
     }
-    return firstAsInt(array);
+    return firstAsInt(array, found);
 }
 
 int parseModeName(char *text) {
@@ -148,13 +149,13 @@ int unpackIntSingleton(const tsArray *array, const char *label) {
     if (tsIsEmpty(array)) {
         raise(catalogue::emptySingleton, label);
     }
-    if (!isDoubleOrInt32(array)) {
+    const tsClassID found = tsGetClassID(array);
+    if (!isDoubleOrInt32(found)) {
         raise(catalogue::badSingletonType);
     }
     // The storage is read as a double whatever the class is; a lone int32 has only half of the
     // bytes, and the other half reads as zero.
-    const std::size_t width =
-        tsGetClassID(array) == tsDOUBLE ? sizeof(double) : sizeof(std::int32_t);
+    const std::size_t width = found == tsDOUBLE ? sizeof(double) : sizeof(std::int32_t);
     double value = 0.0;
     std::memcpy(&value, tsGetData(array),
                 std::min(sizeof(value), width * tsGetNumberOfElements(array)));

@@ -8,6 +8,7 @@
 #include "gateway/operation_table.hpp"
 
 #include <array>
+#include <bit>
 #include <cctype>
 #include <cstdint>
 #include <cstring>
@@ -16,16 +17,17 @@
 namespace tessel::netcdf {
 namespace {
 
-/// The hash of a name, a character at a time (FNV-1a).
+/// The hash of a name, a character at a time. What comes later waits for what came before, so each
+/// step is short, and the one multiplication stands at the end.
 class Hash {
   public:
-    constexpr void add(char c) { value = (value ^ static_cast<unsigned char>(c)) * 16777619U; }
+    constexpr void add(char c) { value = std::rotl(value, 5) ^ static_cast<unsigned char>(c); }
     [[nodiscard]] constexpr std::size_t slotIn(std::size_t slots) const {
-        return (value ^ (value >> 15U)) % slots;
+        return ((value * 0x9E3779B97F4A7C15U) >> 32U) % slots;
     }
 
   private:
-    std::uint32_t value = 2166136261U;
+    std::uint64_t value = 0;
 };
 
 struct Slot {
@@ -67,18 +69,44 @@ constexpr std::array<Slot, slotCount> slots = [] {
     return filled;
 }();
 
-} // namespace
+/// As names are compared. The letters that they are made of do not depend on the locale.
+char lowerCase(char c) {
+    if ((c >= 'a' && c <= 'z') || c == '_') {
+        return c;
+    }
+    if (c >= 'A' && c <= 'Z') {
+        return static_cast<char>(c - 'A' + 'a');
+    }
+    return static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+}
 
-const OperationEntry *findOperation(char *name) {
+/// The row of a name in lower case; nullptr for any other name.
+const OperationEntry *rowOf(const char *name) {
     Hash hash;
-    for (char *at = name; *at != '\0'; ++at) {
-        *at = static_cast<char>(std::tolower(static_cast<unsigned char>(*at)));
+    for (const char *at = name; *at != '\0'; ++at) {
         hash.add(*at);
     }
     for (std::size_t at = hash.slotIn(slotCount); slots[at].name != nullptr; at = next(at)) {
         if (std::strcmp(slots[at].name, name) == 0) {
             return slots[at].entry;
         }
+    }
+    return nullptr;
+}
+
+} // namespace
+
+const OperationEntry *findOperation(char *name) {
+    // As a rule the name is in lower case already; the rows' names are, so that what is found
+    // before it was made so is what would be found after.
+    if (const OperationEntry *const entry = rowOf(name)) {
+        return entry;
+    }
+    for (char *at = name; *at != '\0'; ++at) {
+        *at = lowerCase(*at);
+    }
+    if (const OperationEntry *const entry = rowOf(name)) {
+        return entry;
     }
     raise(catalogue::invalidOperation, name);
 }

@@ -78,9 +78,7 @@ Array Array::cell(Dims dims) {
 }
 
 Array Array::scalar(double value) {
-    Array made = numeric(tsDOUBLE, one);
-    *static_cast<double *>(made.data()) = value;
-    return made;
+    return orOutOfMemory([&] { return Array(makeScalar(value).release()); });
 }
 
 Array Array::row(std::initializer_list<double> values) {

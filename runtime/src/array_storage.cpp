@@ -45,20 +45,17 @@ const ClassFacts &factsOf(tsClassID classID) noexcept {
 /// The number of elements, zero where a dimension is; nothing when it or the size in bytes is
 /// beyond what there can be.
 std::optional<std::size_t> countElements(Dims dims, std::size_t elementSize) noexcept {
-    if (std::find(dims.begin(), dims.end(), 0) != dims.end()) {
-        return 0;
-    }
     std::size_t elements = 1;
+    bool tooMany = false;
     for (const std::size_t length : dims) {
-        if (__builtin_mul_overflow(elements, length, &elements)) {
-            return std::nullopt;
+        if (length == 0) {
+            return 0;
         }
+        tooMany |= __builtin_mul_overflow(elements, length, &elements);
     }
     std::ptrdiff_t bytes = 0;
-    if (__builtin_mul_overflow(elements, std::max<std::size_t>(elementSize, 1), &bytes)) {
-        return std::nullopt;
-    }
-    return elements;
+    tooMany |= __builtin_mul_overflow(elements, std::max<std::size_t>(elementSize, 1), &bytes);
+    return tooMany ? std::nullopt : std::optional(elements);
 }
 
 } // namespace
@@ -114,6 +111,15 @@ ArrayPointer makeArray(tsClassID classID, Dims dims, Fill fill) {
     return array;
 }
 
+/// Most results are one number. With all that it calls within it, what is known of the dimensions
+/// need not be worked out again.
+[[gnu::flatten]] ArrayPointer makeScalar(double value) {
+    constexpr std::array<std::size_t, 2> dims = {1, 1};
+    ArrayPointer array = makeArray(tsDOUBLE, dims, Fill::none);
+    *static_cast<double *>(array->data) = value;
+    return array;
+}
+
 ArrayExtras &extrasOf(tsArray &array) {
     if (!array.extras) {
         array.extras = std::make_unique<ArrayExtras>();
@@ -122,9 +128,15 @@ ArrayExtras &extrasOf(tsArray &array) {
 }
 
 ArrayPointer makeText(std::string_view utf8) {
-    const std::array<std::size_t, 2> dims = {1, utf16Length(utf8)};
-    ArrayPointer array = makeArray(tsCHAR, dims, Fill::none);
-    writeUtf16(utf8, static_cast<tsChar *>(array->data));
+    const auto rowOf = [](std::size_t length) {
+        return makeArray(tsCHAR, std::array<std::size_t, 2>{1, length}, Fill::none);
+    };
+    ArrayPointer array = rowOf(utf8.size());
+    if (!copyIfAscii(utf8, static_cast<tsChar *>(array->data))) {
+        array.reset();
+        array = rowOf(utf16Length(utf8));
+        writeUtf16(utf8, static_cast<tsChar *>(array->data));
+    }
     return array;
 }
 

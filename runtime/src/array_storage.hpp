@@ -54,7 +54,10 @@ using ArrayPointer = std::unique_ptr<tsArray>;
 /// data, or without. Raises the errors that array.hpp lists.
 ArrayPointer makeArray(tsClassID classID, Dims dims, Fill fill);
 
-/// The same without storage for data.
+/// A 1-by-1 double.
+ArrayPointer makeScalar(double value);
+
+/// The same as makeArray without storage for data.
 ArrayPointer makeShape(tsClassID classID, Dims dims);
 
 /// The extras of an array, made when they are not there.

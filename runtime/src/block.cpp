@@ -138,6 +138,10 @@ void freeBlock(void *block) noexcept {
     }
 }
 
+std::size_t sizeOf(const void *block) noexcept {
+    return headerOf(block)->bytes;
+}
+
 bool guardsAreIntact(const void *block) noexcept {
     if (block == nullptr) {
         return true;

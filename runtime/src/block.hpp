@@ -15,6 +15,9 @@ void *allocateBlock(std::size_t bytes, Fill fill) noexcept;
 /// Gives a block back.
 void freeBlock(void *block) noexcept;
 
+/// The size of a block, as it was asked for.
+std::size_t sizeOf(const void *block) noexcept;
+
 /// True if no guard byte of the block was overwritten, or it has none.
 bool guardsAreIntact(const void *block) noexcept;
 

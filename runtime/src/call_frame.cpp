@@ -4,13 +4,21 @@
 #include "host_errors.hpp"
 
 #include <algorithm>
+#include <cstring>
+#include <utility>
 
 namespace tessel {
 namespace {
 
 // A call begins and ends on one thread, and the module's own threads, if it has any, do not call
-// the host.
-thread_local CallFrame *currentFrame = nullptr;
+// the host. Each function of the host's looks here, so the place is one that the loader fixes.
+[[gnu::tls_model("initial-exec")]] thread_local CallFrame *currentFrame = nullptr;
+
+/// Nearly every call needs room for a name or two: blocks up to this size are made as large, and
+/// the last one that was freed waits for the next. Calls come one after the other, so that they can
+/// share it. In checked mode each block is a new one.
+constexpr std::size_t smallBlock = 256;
+void *spareBlock = nullptr;
 
 std::size_t count(const Link &ring) noexcept {
     std::size_t n = 0;
@@ -123,7 +131,17 @@ void CallFrame::giveToCell(tsArray &cell, std::size_t index, tsArray *array) {
 }
 
 void *CallFrame::allocate(std::size_t bytes, Fill fill) noexcept {
-    void *const block = allocateBlock(bytes, fill);
+    void *block = nullptr;
+    if (bytes > smallBlock || isChecked()) {
+        block = allocateBlock(bytes, fill);
+    } else if (spareBlock == nullptr) {
+        block = allocateBlock(smallBlock, fill);
+    } else {
+        block = std::exchange(spareBlock, nullptr);
+        if (fill == Fill::zero) {
+            std::memset(block, 0, bytes);
+        }
+    }
     if (block != nullptr) {
         linkOf(block).insertBefore(blocks);
     }
@@ -145,7 +163,11 @@ void CallFrame::free(void *block) noexcept {
         }
     }
     linkOf(block).remove();
-    freeBlock(block);
+    if (spareBlock == nullptr && sizeOf(block) == smallBlock && !isChecked()) {
+        spareBlock = block;
+    } else {
+        freeBlock(block);
+    }
 }
 
 void CallFrame::watch(std::span<const tsArray *const> inputs) {

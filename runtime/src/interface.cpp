@@ -79,12 +79,7 @@ bool tsIsNaN(double value) {
 }
 
 tsArray *tsCreateDoubleScalar(double value) {
-    return created([&] {
-        constexpr std::array<std::size_t, 2> dims = {1, 1};
-        ArrayPointer array = makeArray(tsDOUBLE, dims, Fill::none);
-        *static_cast<double *>(array->data) = value;
-        return array;
-    });
+    return created([&] { return makeScalar(value); });
 }
 
 tsArray *tsCreateString(const char *text) {
@@ -131,14 +126,21 @@ char *tsArrayToString(const tsArray *array) {
         return nullptr;
     }
     CallFrame &frame = admitted();
+    const auto terminated = [&frame](std::size_t length) {
+        auto *const text = static_cast<char *>(frame.allocate(length + 1, Fill::none));
+        if (text == nullptr) {
+            raise(host_errors::outOfMemory);
+        }
+        text[length] = '\0';
+        return text;
+    };
     const std::span characters(static_cast<const tsChar *>(array->data), array->elements);
-    const std::size_t length = utf8Length(characters);
-    auto *const text = static_cast<char *>(frame.allocate(length + 1, Fill::none));
-    if (text == nullptr) {
-        raise(host_errors::outOfMemory);
+    char *text = terminated(characters.size());
+    if (!copyIfAscii(characters, text)) {
+        frame.free(text);
+        text = terminated(utf8Length(characters));
+        writeUtf8(characters, text);
     }
-    writeUtf8(characters, text);
-    text[length] = '\0';
     return text;
 }
 

@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <array>
+#include <type_traits>
 #include <vector>
 
 namespace tessel {
@@ -90,21 +91,69 @@ const Form &formOf(char32_t character) noexcept {
     return forms[i];
 }
 
-/// How many ASCII characters a text begins with. They are the same in both forms, and most texts
-/// have no others.
+/// ASCII characters are the same in both forms, and most texts have no others.
+bool isAscii(unsigned unit) noexcept {
+    return unit < 0x80;
+}
+
+/// How many ASCII characters a text begins with, of as many as are looked at together. Without a
+/// way out of its middle, the loop over them is one that the compiler can make of vectors; what is
+/// done with them next finds them in the nearest cache.
 template <class Text>
-std::size_t asciiLength(const Text &text) noexcept {
-    const auto isAscii = [](auto unit) { return (unit & ~0x7F) == 0; };
-    const auto end = std::find_if_not(text.begin(), text.end(), isAscii);
-    return static_cast<std::size_t>(end - text.begin());
+std::size_t asciiAtOnce(const Text &text) noexcept {
+    constexpr std::size_t most = 256;
+    using Unit = std::make_unsigned_t<std::remove_const_t<typename Text::value_type>>;
+    const std::size_t length = std::min(most, text.size());
+    Unit all = 0;
+    for (std::size_t i = 0; i < length; ++i) {
+        all = static_cast<Unit>(all | static_cast<Unit>(text.data()[i]));
+    }
+    if (isAscii(all)) {
+        return length;
+    }
+    std::size_t ascii = 0;
+    while (isAscii(static_cast<Unit>(text.data()[ascii]))) {
+        ++ascii;
+    }
+    return ascii;
+}
+
+/// One pass over the text, as wide as the compiler's vectors are; it ends within a page or so of
+/// the first character that is not ASCII.
+template <class Text, class Out>
+bool copyWhileAscii(const Text &text, Out *__restrict out) noexcept {
+    constexpr std::size_t most = 4096;
+    using Unit = std::make_unsigned_t<std::remove_const_t<typename Text::value_type>>;
+    Unit all = 0;
+    for (std::size_t from = 0; from < text.size() && isAscii(all); from += most) {
+        const std::size_t end = from + std::min(most, text.size() - from);
+        for (std::size_t i = from; i < end; ++i) {
+            const auto unit = static_cast<Unit>(text.data()[i]);
+            all = static_cast<Unit>(all | unit);
+            out[i] = static_cast<Out>(unit);
+        }
+    }
+    return isAscii(all);
 }
 
 } // namespace
 
+bool copyIfAscii(std::string_view utf8, tsChar *out) noexcept {
+    return copyWhileAscii(utf8, out);
+}
+bool copyIfAscii(std::span<const tsChar> utf16, char *out) noexcept {
+    return copyWhileAscii(utf16, out);
+}
+
 std::size_t utf16Length(std::string_view utf8) noexcept {
-    std::size_t length = asciiLength(utf8);
-    utf8.remove_prefix(length);
+    std::size_t length = 0;
     while (!utf8.empty()) {
+        if (isAscii(static_cast<unsigned char>(utf8.front()))) {
+            const std::size_t ascii = asciiAtOnce(utf8);
+            length += ascii;
+            utf8.remove_prefix(ascii);
+            continue;
+        }
         const Read read = readUtf8(utf8);
         length += read.character >= firstSupplementary ? 2 : 1;
         utf8.remove_prefix(read.units);
@@ -113,10 +162,13 @@ std::size_t utf16Length(std::string_view utf8) noexcept {
 }
 
 void writeUtf16(std::string_view utf8, tsChar *out) noexcept {
-    const std::size_t ascii = asciiLength(utf8);
-    out = std::copy_n(utf8.begin(), ascii, out);
-    utf8.remove_prefix(ascii);
     while (!utf8.empty()) {
+        if (isAscii(static_cast<unsigned char>(utf8.front()))) {
+            const std::size_t ascii = asciiAtOnce(utf8);
+            out = std::copy_n(utf8.begin(), ascii, out);
+            utf8.remove_prefix(ascii);
+            continue;
+        }
         const Read read = readUtf8(utf8);
         if (read.character >= firstSupplementary) {
             const char32_t offset = read.character - firstSupplementary;
@@ -130,9 +182,14 @@ void writeUtf16(std::string_view utf8, tsChar *out) noexcept {
 }
 
 std::size_t utf8Length(std::span<const tsChar> utf16) noexcept {
-    std::size_t length = asciiLength(utf16);
-    utf16 = utf16.subspan(length);
+    std::size_t length = 0;
     while (!utf16.empty()) {
+        if (isAscii(utf16.front())) {
+            const std::size_t ascii = asciiAtOnce(utf16);
+            length += ascii;
+            utf16 = utf16.subspan(ascii);
+            continue;
+        }
         const Read read = readUtf16(utf16);
         length += formOf(read.character).bytes;
         utf16 = utf16.subspan(read.units);
@@ -141,11 +198,14 @@ std::size_t utf8Length(std::span<const tsChar> utf16) noexcept {
 }
 
 void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept {
-    const std::size_t ascii = asciiLength(utf16);
-    out = std::transform(utf16.begin(), utf16.begin() + static_cast<std::ptrdiff_t>(ascii), out,
-                         [](tsChar unit) { return static_cast<char>(unit); });
-    utf16 = utf16.subspan(ascii);
     while (!utf16.empty()) {
+        if (isAscii(utf16.front())) {
+            const auto ascii = utf16.first(asciiAtOnce(utf16));
+            out = std::transform(ascii.begin(), ascii.end(), out,
+                                 [](tsChar unit) { return static_cast<char>(unit); });
+            utf16 = utf16.subspan(ascii.size());
+            continue;
+        }
         const Read read = readUtf16(utf16);
         const Form &form = formOf(read.character);
         for (std::size_t i = form.bytes; i-- > 0;) {

@@ -24,6 +24,11 @@ std::size_t utf8Length(std::span<const tsChar> utf16) noexcept;
 /// Writes them, without a terminator.
 void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept;
 
+/// Copies a text of nothing but ASCII characters, which are the same in both forms; `out` has room
+/// for as many. False, and something or other in `out`, when the text has a character besides.
+bool copyIfAscii(std::string_view utf8, tsChar *out) noexcept;
+bool copyIfAscii(std::span<const tsChar> utf16, char *out) noexcept;
+
 /// The text, with every byte that is not part of valid UTF-8 made the character of the same code.
 std::string validUtf8(std::string_view text);
 

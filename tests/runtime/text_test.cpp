@@ -151,6 +151,29 @@ TEST(Text, TheModulesFunctionsReadAndWriteTheSame) {
     }
 }
 
+/// ASCII is gone through by pieces, and something else may stand anywhere in them.
+TEST(Text, OneCharacterAmongManyThatAreAscii) {
+    const Module good(testModule("good"));
+    std::vector<std::size_t> places = {4095, 4096, 4097, 8191, 8192, 9998, 9999};
+    for (std::size_t place = 0; place < 600; ++place) {
+        places.push_back(place);
+    }
+    for (const std::size_t place : places) {
+        for (const std::size_t after : {std::size_t{0}, std::size_t{1}, 9999 - place}) {
+            SCOPED_TRACE(testing::Message() << place << " before, " << after << " after");
+            const std::string_view character = "\xe6\xb0\xb4";
+            const std::string utf8 =
+                std::string(place, 'a') + std::string(character) + std::string(after, 'z');
+            std::u16string characters(place, u'a');
+            characters.append(1, u'\u6c34').append(after, u'z');
+            const Array text = Array::text(utf8);
+            ASSERT_EQ(charactersOf(text), characters);
+            ASSERT_EQ(text.utf8(), utf8);
+            ASSERT_EQ(good("text", text)[0].utf8(), utf8);
+        }
+    }
+}
+
 TEST(Text, ShapeIsNotText) {
     constexpr std::array<std::size_t, 2> dims = {2, 2};
     const Array array = Array::characters(dims);

@@ -24,7 +24,7 @@ constexpr Family<PutVar> putVar = {66,
 /// The number of elements that the variable has now, with as many records as there are.
 std::size_t currentSize(int ncid, int varid) {
     int ndims = 0;
-    std::array<int, NC_MAX_VAR_DIMS> dimids{};
+    std::array<int, NC_MAX_VAR_DIMS> dimids; // filled as far as it is read
     check(nc_inq_var(ncid, varid, nullptr, nullptr, &ndims, dimids.data(), nullptr),
           catalogue::putVarInquiry);
     std::size_t size = 1;

@@ -9,7 +9,7 @@
 namespace tessel::netcdf {
 
 WrittenVariable inquireWritten(int ncid, int varid, const Error<const char *> &failure) {
-    WrittenVariable variable{};
+    WrittenVariable variable; // filled by the inquiry
     check(nc_inq_var(ncid, varid, variable.name.data(), nullptr, &variable.ndims, nullptr, nullptr),
           failure);
     return variable;

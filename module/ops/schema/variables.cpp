@@ -41,7 +41,7 @@ void inqVarHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[
     std::array<char, NC_MAX_NAME + 1> name{};
     nc_type type = NC_NAT;
     int ndims = 0;
-    std::array<int, NC_MAX_VAR_DIMS> dimids{};
+    std::array<int, NC_MAX_VAR_DIMS> dimids; // filled as far as it is read
     int natts = 0;
     check(nc_inq_var(ncid, varid, name.data(), &type, &ndims, dimids.data(), &natts),
           catalogue::inqVar.failure);
