@@ -198,7 +198,9 @@ class Session {
         return opened.empty() ? noDataset : opened[slot % opened.size()];
     }
 
+    /// The operation as the module reads it.
     static std::string lowered(std::string text) {
+        text.resize(std::min(text.size(), text.find('\0')));
         for (char &c : text) {
             c = c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c;
         }

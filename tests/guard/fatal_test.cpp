@@ -150,6 +150,8 @@ const Fatal rows[] = {
 class FatalCall : public testing::TestWithParam<Fatal> {};
 
 enum class End { survived, raised, notSurvived };
+constexpr int survivedCode = 100;
+constexpr int raisedCode = 101;
 
 /// What becomes of a process that makes the call without the guard: it is given two seconds, and
 /// little room on the disk.
@@ -164,14 +166,17 @@ End endWithoutGuard(const Fatal &fatal) {
         setrlimit(RLIMIT_CORE, &none);
         alarm(2);
         const std::string identifier = identifierOf([&] { fatal.call(plainModule(), folder); });
-        _exit(identifier.empty() ? 0 : 1);
+        _exit(identifier.empty() ? survivedCode : raisedCode);
     }
     int status = 0;
     waitpid(child, &status, 0);
-    if (WIFEXITED(status) && WEXITSTATUS(status) < 2) {
-        return WEXITSTATUS(status) == 0 ? End::survived : End::raised;
+    if (WIFEXITED(status) && WEXITSTATUS(status) == survivedCode) {
+        return End::survived;
     }
-    return End::notSurvived; // by a signal, or by the sanitizer's exit
+    if (WIFEXITED(status) && WEXITSTATUS(status) == raisedCode) {
+        return End::raised;
+    }
+    return End::notSurvived; // by a signal, or by the sanitizer, which exits with 1
 }
 
 TEST_P(FatalCall, IsFatalWithoutTheGuard) {
