@@ -13,6 +13,8 @@
 #include <algorithm>
 #include <array>
 #include <cctype>
+#include <cstddef>
+#include <iterator>
 #include <string_view>
 
 namespace tessel {
@@ -26,6 +28,7 @@ constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fa
 constexpr int mapped = 0x10;                              // the file is kept in memory
 constexpr int hdf5 = 0x1000;
 constexpr int noFill = 0x100;
+constexpr std::size_t secondDataset = 4;   // among the inputs of copy_att
 constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
 
 Datasets &datasets() {
@@ -41,19 +44,31 @@ std::string_view withoutBlanks(std::string_view path) {
 }
 
 /// Whether the library would take a file name for an address: "scheme://...", behind any number of
-/// parameters in brackets.
+/// parameters in brackets. It drops what is not printable ASCII before it looks, and so does this.
+/// On the safe side: not every scheme is one that it knows.
 bool isAddress(std::string_view path) {
-    while (path.starts_with('[') && path.find(']') != std::string_view::npos) {
-        path = withoutBlanks(path.substr(path.find(']') + 1));
+    std::string shown;
+    std::copy_if(path.begin(), path.end(), std::back_inserter(shown),
+                 [](char c) { return c > ' ' && c <= '~'; });
+    std::size_t start = 0;
+    while (start < shown.size() && shown[start] == '[') {
+        std::size_t end = start + 1;
+        while (end < shown.size() && shown[end] != ']') {
+            end += shown[end] == '\\' ? std::size_t{2} : std::size_t{1};
+        }
+        if (end >= shown.size()) {
+            break;
+        }
+        start = end + 1;
     }
-    const std::size_t end = path.find("://");
-    if (end == std::string_view::npos || end == 0) {
+    const std::size_t end = shown.find("://", start);
+    if (end == std::string::npos || end == start) {
         return false;
     }
-    const std::string_view scheme = path.substr(0, end);
-    return std::all_of(scheme.begin(), scheme.end(), [](unsigned char c) {
-        return std::isalnum(c) != 0 || c == '+' || c == '-' || c == '.';
-    });
+    return std::all_of(shown.begin() + static_cast<std::ptrdiff_t>(start),
+                       shown.begin() + static_cast<std::ptrdiff_t>(end), [](unsigned char c) {
+                           return std::isalnum(c) != 0 || c == '+' || c == '-' || c == '.';
+                       });
 }
 
 std::string inQuotes(std::string_view path) {
@@ -184,7 +199,7 @@ std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *da
         return added - std::min(added, write.count[0]);
     };
     if (dataset != nullptr) {
-        if (!dataset->filling || dataset->defining) {
+        if (!dataset->classic || !dataset->filling || dataset->defining) {
             return 0;
         }
         const auto known = dataset->hasRecords.find(varid);
@@ -232,19 +247,22 @@ class Guard : public Watcher {
             try {
                 remember(inputs, results, error);
             } catch (const std::exception &) {
-                // There is no memory: a dataset that is not known is guarded all the same, with
-                // more inquiries.
+                // There is no memory. A dataset that is not known is guarded with more inquiries,
+                // and is taken for dead when its end fails.
             }
         }
     }
 
   private:
     /// Any operation on a dataset has its id first, and copy_att has a second one.
-    static void lookForDead(Inputs inputs) {
-        for (const std::size_t i : {std::size_t{1}, std::size_t{4}}) {
-            const auto ncid = inputs.size() > i ? integer(inputs[i]) : std::nullopt;
+    void lookForDead(Inputs inputs) const {
+        for (const std::size_t i : {std::size_t{1}, secondDataset}) {
+            if (i >= inputs.size() || (i == secondDataset && kind != Kind::copyAttribute)) {
+                break;
+            }
+            const auto ncid = integer(inputs[i]);
             const Dataset *const dataset = ncid ? datasets().find(*ncid) : nullptr;
-            if (dataset != nullptr && dataset->dead && (i == 1 || inputs.size() == 6)) {
+            if (dataset != nullptr && dataset->dead) {
                 refuse(closed, "the dataset is that of " + inQuotes(dataset->path));
             }
         }
@@ -257,7 +275,7 @@ class Guard : public Watcher {
                 return;
             }
             const std::string_view path = withoutBlanks(*name);
-            lookAtName(path, options);
+            lookAtName(*name, options);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             classic =
@@ -302,13 +320,13 @@ class Guard : public Watcher {
             }
             return;
         }
-        Dataset *const dataset = first ? datasets().find(*first) : nullptr;
-        if (dataset == nullptr) {
+        if (!first) {
             return;
         }
+        Dataset *const dataset = datasets().find(*first);
         if (kind == Kind::end) {
-            rememberEnd(*first, *dataset, error);
-        } else if (error == nullptr) {
+            rememberEnd(*first, dataset, error);
+        } else if (error == nullptr && dataset != nullptr) {
             rememberChange(inputs, *dataset);
         }
     }
@@ -328,12 +346,15 @@ class Guard : public Watcher {
         return dataset.classic && !dataset.defining;
     }
 
-    static void rememberEnd(int ncid, Dataset &dataset, const Error *error) {
+    static void rememberEnd(int ncid, const Dataset *dataset, const Error *error) {
         if (error == nullptr || error->identifier().ends_with(":notNetcdfID")) {
             datasets().remove(ncid);
-        } else if (error->identifier().starts_with("TESSEL:netcdf:") && !survivesItsEnd(dataset)) {
-            dataset.dead = true;
+        } else if (error->identifier().starts_with("TESSEL:netcdf:") &&
+                   (dataset == nullptr || !survivesItsEnd(*dataset))) {
+            Dataset dead = dataset == nullptr ? Dataset{} : *dataset;
+            dead.dead = true;
             datasets().anyDead = true;
+            datasets().add(ncid, std::move(dead));
         }
     }
 

@@ -32,6 +32,7 @@ constexpr std::array rows = {
     Row{"_enddef", Kind::tunedEndDefinition, 6},
     Row{"set_fill", Kind::setFill, 3},
     Row{"set_default_format", Kind::setDefaultFormat, 2},
+    Row{"copy_att", Kind::copyAttribute, 6},
 };
 
 /// The typed families, whose names end with a type.

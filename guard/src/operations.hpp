@@ -22,6 +22,7 @@ enum class Kind {
     tunedEndDefinition,
     setFill,
     setDefaultFormat,
+    copyAttribute,
     writeElement,
     writeBlock,
     writeStrided,

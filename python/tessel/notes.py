@@ -252,6 +252,9 @@ class _Subject:
     def _known(self, ncid: int) -> Iterator[str]:
         """What there is instead of what was not found."""
         word = self._error.word
+        # Nothing is asked of a dataset without need: one whose closing failed does not survive it.
+        if word not in ("variableNotFound", "invalidDimensionIdOrName", "attributeNotFound"):
+            return
         with suppress(Exception):
             inq = self._module.inq(ncid)
             if word == "variableNotFound":

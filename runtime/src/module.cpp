@@ -39,7 +39,8 @@ std::unique_lock<std::mutex> serialised() {
 }
 
 /// A fork waits for the call in progress, so that no child begins with a lock that nobody will open
-/// or with a library that has stopped halfway. A thread that forks within its own call has the lock.
+/// or with a library that has stopped halfway. A thread that forks within its own call has the
+/// lock.
 void lockForFork() {
     if (CallFrame::current() == nullptr) {
         callLock.lock();
@@ -62,13 +63,16 @@ void unlockAfterFork() {
     throw Error(error.identifier, message);
 }
 
-/// The file that this host was loaded from: a library, or the program that it is linked into.
+/// The file that this host was loaded from: a library, or the program that it is linked into. A
+/// program is known by the name that it was called by, which without a folder says nothing.
 std::filesystem::path ownFile() {
     Dl_info info{};
     if (dladdr(reinterpret_cast<void *>(&tsGetClassID), &info) == 0 || info.dli_fname == nullptr) {
         return {};
     }
-    return info.dli_fname;
+    const std::filesystem::path file = info.dli_fname;
+    std::error_code ignored;
+    return file.has_parent_path() ? file : std::filesystem::read_symlink("/proc/self/exe", ignored);
 }
 
 /// Its folder, found when the host is loaded: the name that it was loaded by may be relative to the

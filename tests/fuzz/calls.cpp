@@ -173,7 +173,7 @@ class Session {
             } else if (!isGone(identifier)) {
                 note("end" + identifier);
                 Scratch::setFull(false);
-                identifier += " " + called(netcdf, "close", ncid).identifier;
+                identifier.append(1, ' ').append(called(netcdf, "close", ncid).identifier);
                 Scratch::setFull(true);
             }
             const std::string after = called(netcdf, "inq", ncid).identifier;

@@ -139,7 +139,7 @@ std::string spelledCharacters(const Value &value) {
 
 std::string spelled(const Value &value) {
     if (value.kind == Value::Kind::dataset) {
-        return "@" + std::to_string(value.slot);
+        return std::string(1, '@').append(std::to_string(value.slot));
     }
     const bool single = value.dims == std::vector<std::size_t>{1, 1};
     if (value.classID == tsDOUBLE && single && !value.complex && value.elements.size() == 1) {
@@ -218,7 +218,7 @@ std::string printed(const Sequence &sequence) {
     for (const Step &step : sequence) {
         text += step.operation;
         for (const Value &value : step.inputs) {
-            text += " " + spelled(value);
+            text.append(1, ' ').append(spelled(value));
         }
         if (step.outputs != 1) {
             text += " >" + std::to_string(step.outputs);

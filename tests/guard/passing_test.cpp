@@ -118,6 +118,11 @@ const Passing rows[] = {
          netcdf("redef", ncid);
          netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
      }},
+    {"AnElementFarBeyondTheRecordsOfAnHdf5File", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 4096);
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
+     }},
     {"AWordInsteadOfADataset", "TESSEL:netcdf:badIDDatatype",
      [](const Module &netcdf, const Folder & /*folder*/) { netcdf("close", "all"); }},
 };
@@ -188,7 +193,16 @@ TEST(Addresses, AreRefusedUnlessAllowed) {
         {"  dods://127.0.0.1:1/a", true},
         {"[mode=x] http://127.0.0.1:1/a", true},
         {"s3://bucket/a", true},
+        {"https\n://127.0.0.1:1/a.nc", true}, // what the library drops before it looks
+        {"http:/\t/127.0.0.1:1/a.nc", true},
+        {"h\x01ttp://127.0.0.1:1/a.nc", true},
+        {"\u00A0http://127.0.0.1:1/a.nc", true},
+        {"http\u00E9://127.0.0.1:1/a.nc", true},
+        {"[x]\u00E9http://127.0.0.1:1/a.nc", true},
+        {"\u00E9[x]http://127.0.0.1:1/a.nc", true},
+        {R"([a\]b]http://127.0.0.1:1/a.nc)", true},
         {"missing/a.nc", false},
+        {"[missing/a.nc", false},
         {"missing/a:b.nc", false},
         {"://missing/a.nc", false},
         {"folder/http://a.nc", false},
@@ -224,7 +238,29 @@ TEST(ClosedDatasets, AreRefusedToEveryOperation) {
     EXPECT_EQ(identifierOf([&] { netcdf("copy_att", other, 0, "a", ncid, 0); }),
               "TESSEL:guard:closed");
     EXPECT_EQ(identifierOf([&] { netcdf("inq", other); }), "");
+
+    // A count that is the same number as the id is no id.
+    const auto length = static_cast<std::size_t>(ncid);
+    netcdf("redef", other);
+    const int longDimension = intOf(netcdf("def_dim", other, "long", ncid));
+    const int varid = intOf(netcdf("def_var", other, "w", ncDouble, longDimension));
+    netcdf("enddef", other);
+    const Array data = Array::numeric(tsDOUBLE, std::array<std::size_t, 1>{length});
+    EXPECT_EQ(identifierOf([&] { netcdf("put_vara_double", other, varid, 0, ncid, data); }), "");
+    EXPECT_EQ(identifierOf([&] { netcdf("get_vars_double", other, varid, 0, ncid, 1); }), "");
     netcdf("close", other);
+}
+
+TEST(ClosedDatasets, AreKnownEvenIfTheyWereOpenedWithoutTheGuard) {
+    const Folder folder;
+    const Module plain = plainModule();
+    const Module netcdf = guardedModule();
+    const int ncid = intOf(plain("create", folder.file("a.nc"), 0));
+    const int x = intOf(plain("def_dim", ncid, "x", 3));
+    plain("def_var", ncid, "v", ncInt, x);
+    plain("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
+    EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:netcdf:close:invalidDataType");
+    EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:guard:closed");
 }
 
 /// What a call raises while files cannot grow beyond 64 KiB.

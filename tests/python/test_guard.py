@@ -95,3 +95,23 @@ def test_addresses_on_the_command_line(options, variable, refused):
     assert line.startswith("tessel: ")
     assert ("is an address" in line) == refused
     assert bool(others) != refused  # what the library says of its attempt
+
+
+UNCLOSABLE = """
+import sys, tessel
+nc = tessel.load("netcdf", sys.argv[2])
+ncid = nc.create(sys.argv[1], "CLOBBER")
+nc.def_var(ncid, "v", 4, [nc.def_dim(ncid, "x", 3)])
+nc.put_att_double(ncid, 0, "_FillValue", 4, [1, 2])
+try:
+    nc.close(ncid)
+except tessel.Error as error:
+    print(error.identifier, flush=True)
+"""
+
+
+@pytest.mark.parametrize("guard", ["on", "off"])
+def test_nothing_is_asked_of_a_dataset_that_could_not_be_closed(tmp_path, guard):
+    done = subprocess.run([sys.executable, "-B", "-c", UNCLOSABLE, tmp_path / "a.nc", guard],
+                          capture_output=True, text=True, check=False)
+    assert (done.returncode, done.stdout) == (0, "TESSEL:netcdf:close:invalidDataType\n")

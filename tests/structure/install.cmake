@@ -50,3 +50,29 @@ foreach(file libtessel.so tessel/netcdf.tsx)
         message(FATAL_ERROR "${file} has a path of the build in it")
     endif()
 endforeach()
+
+# A program in one piece that is called by its bare name takes no module from the current folder.
+file(WRITE ${PREFIX}/planted/tessel/netcdf.tsx "planted")
+set(ENV{TESSEL_MODULE_PATH} "")
+set(ENV{PATH} "${PREFIX}/embedding:$ENV{PATH}")
+execute_process(COMMAND sh -c "means_static series.tsx file variable"
+    WORKING_DIRECTORY ${PREFIX}/planted ERROR_VARIABLE found RESULT_VARIABLE status)
+if(status EQUAL 0 OR NOT found MATCHES "^TESSEL:host:moduleNotFound" OR found MATCHES "planted")
+    message(FATAL_ERROR "from the current folder: ${found}")
+endif()
+
+# Nor does the Python package take a library from there, built or installed: an empty entry of a
+# path means the current folder.
+file(GLOB_RECURSE extensions ${BUILD}/python/tessel/*.so ${PREFIX}/usr/*/_*.so)
+foreach(file IN LISTS extensions)
+    execute_process(COMMAND objdump -p ${file} OUTPUT_VARIABLE wanted COMMAND_ERROR_IS_FATAL ANY)
+    if(wanted MATCHES "R(UN)?PATH +([^\n]*)")
+        if(NOT "${CMAKE_MATCH_2}" MATCHES "^([$]ORIGIN[^:]*)(:[$]ORIGIN[^:]*)*$")
+            message(FATAL_ERROR "${file} looks for libraries in \"${CMAKE_MATCH_2}\"")
+        endif()
+    endif()
+endforeach()
+list(LENGTH extensions count)
+if(WITH_PYTHON AND NOT count EQUAL 4)
+    message(FATAL_ERROR "there are ${count} extensions: ${extensions}")
+endif()
