@@ -7,8 +7,8 @@
 //
 //   TESSEL:guard:alignment   a tuned enddef with an alignment of 0, which divides by zero
 //   TESSEL:guard:mode        a mode flag that makes create or open follow an invalid pointer
-//   TESSEL:guard:closed      anything with a dataset whose closing failed in define mode, or that is
-//                            based on HDF5: its memory is freed
+//   TESSEL:guard:closed      anything with a dataset whose closing failed in define mode, or that
+//                            is based on HDF5: its memory is freed
 //   TESSEL:guard:counts      a write of counts that multiply to more than 64 bits hold
 //   TESSEL:guard:records     a write that would first fill more than GuardOptions::fillLimit
 //   TESSEL:guard:header      a file whose header claims what it cannot hold, or what would overflow
