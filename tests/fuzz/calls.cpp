@@ -220,6 +220,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     static const bool shows = std::getenv("TESSEL_FUZZ_SHOW") != nullptr;
     const fuzz::Sequence sequence =
         fuzz::parsed(std::string_view(reinterpret_cast<const char *>(data), size));
+    fuzz::Scratch::setFull(true);
     fuzz::Session session(netcdf);
     for (const fuzz::Step &step : sequence) {
         if (shows) {
@@ -227,6 +228,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
         }
         session.call(step);
     }
-    scratch.clean(session.end());
+    const fuzz::Scratch::Left left = session.end();
+    fuzz::Scratch::setFull(false);
+    scratch.clean(left);
     return 0;
 }

@@ -72,7 +72,6 @@ Scratch::Scratch() {
     std::signal(SIGXFSZ, SIG_IGN); // a full disk is an error like any other
     limit(RLIMIT_CORE, 0, 0);
     limit(RLIMIT_DATA, reserved() + mostMemory, RLIM_INFINITY);
-    setFull(true);
 }
 
 void Scratch::setFull(bool full) {

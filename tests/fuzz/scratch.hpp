@@ -12,8 +12,7 @@ namespace fuzz {
 [[noreturn]] void die(const std::string &what);
 
 /// A folder of the process's own in that for temporary files. It is the current folder from then
-/// on, so that names without a folder lead nowhere else. Files above a MiB are a full disk, and
-/// requests for much memory fail.
+/// on, so that names without a folder lead nowhere else. Requests for much memory fail.
 class Scratch {
   public:
     Scratch();
@@ -30,7 +29,7 @@ class Scratch {
     /// them.
     void clean(Left left = Left::nothing) const;
 
-    /// Whether the disk is full for files above a MiB.
+    /// Whether the disk is full for files above a MiB. The fuzzer's own files are larger.
     static void setFull(bool full);
 
   private:
