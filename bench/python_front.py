@@ -19,10 +19,8 @@ from __future__ import annotations
 import argparse
 import platform
 import random
-import statistics
 import sys
 import tempfile
-import time
 from collections.abc import Callable
 from functools import partial
 from pathlib import Path
@@ -32,16 +30,11 @@ import netCDF4
 import numpy as np
 
 import tessel
+from measuring import NOISE, Work, measure, put_between_marks
 
-BEGIN = "<!-- bench/python_front.py: begin -->"
-END = "<!-- bench/python_front.py: end -->"
 FORMAT = "NETCDF3_64BIT_OFFSET"
 TEN = 10
-# Where both sides leave nearly all of the work to the library, two measurements of the same side
-# differ by as much as this, and a difference below it says nothing.
-NOISE = 0.03
 
-Work = Callable[[], object]
 Places = list[tuple[int, int, int]]
 
 
@@ -216,35 +209,6 @@ class Bench:
         assert written == self.new.read_bytes(), "the files differ"
 
 
-def seconds(work: Work) -> float:
-    start = time.perf_counter()
-    work()
-    return time.perf_counter() - start
-
-
-class Measured(NamedTuple):
-    """A side of a row: how long it takes to do it once, and how many times faster ours is."""
-
-    time: float
-    ratio: float
-
-
-def measure(row: Row, repetitions: int, before: Work) -> list[Measured]:
-    """Ours, theirs without masking, and theirs with it. `before` comes before each, unmeasured."""
-    sides = [row.tessel, row.netcdf4(False), row.netcdf4(True)]
-    taken: list[list[float]] = [[] for _ in sides]
-    for work in sides:
-        before()
-        work()
-    for _ in range(repetitions):
-        for side in random.sample(range(len(sides)), len(sides)):
-            before()
-            taken[side].append(seconds(sides[side]) / row.times)
-    return [Measured(statistics.median(each),
-                     statistics.median(theirs / ours for theirs, ours in zip(each, taken[0])))
-            for each in taken]
-
-
 def table(bench: Bench, repetitions: int) -> tuple[list[str], bool]:
     """The rows as Markdown, and whether each is as fast as expected."""
     scale = {"µs": 1e6, "ms": 1e3}
@@ -253,7 +217,8 @@ def table(bench: Bench, repetitions: int) -> tuple[list[str], bool]:
     good = True
     for row in bench.rows():
         count = repetitions if row.unit == "µs" else max(repetitions // 3, 1)
-        ours, bare, masked = measure(row, count, bench.remove_new)
+        sides = [row.tessel, row.netcdf4(False), row.netcdf4(True)]
+        ours, bare, masked = measure(sides, count, row.times, bench.remove_new)
         good = good and bare.ratio >= (row.expected or 0) * (1 - NOISE)
         show = [f"{side.time * scale[row.unit]:.3g} {row.unit}" for side in (ours, bare, masked)]
         lines.append(f"| {row.name} | {show[0]} | {show[1]} | {bare.ratio:.3g} | {show[2]} | "
@@ -265,17 +230,6 @@ def circumstances() -> str:
     """What was measured with."""
     return (f"Python {platform.python_version()}, NumPy {np.__version__}, netCDF4-python "
             f"{netCDF4.__version__}, netCDF library {netCDF4.getlibversion().split()[0]}.")
-
-
-def put_between_marks(document: Path, text: str) -> None:
-    """Replaces what is between the marks; at the end, with marks, when there are none."""
-    old = document.read_text() if document.exists() else ""
-    section = f"{BEGIN}\n{text}\n{END}"
-    if BEGIN in old and END in old:
-        before, rest = old.split(BEGIN, 1)
-        document.write_text(before + section + rest.split(END, 1)[1])
-    else:
-        document.write_text(old.rstrip("\n") + ("\n\n" if old else "") + section + "\n")
 
 
 def main() -> int:
@@ -301,7 +255,7 @@ def main() -> int:
         print("\nOnce, on small data: these numbers are no measurement.")
         return 0
     if options.write:
-        put_between_marks(options.write, text)
+        put_between_marks(options.write, "bench/python_front.py", text)
     return 0 if good else 1
 
 

@@ -196,14 +196,14 @@ def test_names_in_utf8(tmp_path: Path) -> None:
 def test_values_are_read_when_they_are_asked_for(cubes: list[str],
                                                  monkeypatch: pytest.MonkeyPatch) -> None:
     read = []
-    original = OpenFile.read
+    original = OpenFile.read_with
 
     def spy(self: OpenFile, operation: str, varid: int, *places: list[int],
             **options: bool) -> object:
         read.append((varid, *places))
         return original(self, operation, varid, *places, **options)
 
-    monkeypatch.setattr(OpenFile, "read", spy)
+    monkeypatch.setattr(OpenFile, "read_with", spy)
     with xarray.open_dataset(cubes[0], engine="tessel", decode_times=False) as dataset:
         assert read == [(0, [0], [5])]  # the coordinate, which xarray makes an index of
         part = dataset.v.isel(time=2)[4:8]
@@ -358,17 +358,17 @@ def test_a_file_that_grew(cubes: list[str]) -> None:
 def test_a_file_that_is_cut_off(cubes: list[str], mapped: bool) -> None:
     size = os.path.getsize(cubes[0])
     file = OpenFile(cubes[0], mapped)
-    assert file.read("get_vara_float", 1, [4, 29, 30], [1, 1, 10])[-1] == 5999
+    assert file.read_with("get_vara_float", 1, [4, 29, 30], [1, 1, 10])[-1] == 5999
     os.truncate(cubes[0], size - 5000)
     for once in (False, True):
         for start in (4, 0):
             with pytest.raises(OSError, match="became shorter while it was open") as error:
-                file.read("get_vara_float", 1, [start, 29, 30], [1, 1, 10], once=once)
+                file.read_with("get_vara_float", 1, [start, 29, 30], [1, 1, 10], once=once)
             assert error.value.word == "fileTooShort" and error.value.path == cubes[0]
             assert error.value.__notes__ == [f"file: {cubes[0]}"]
     os.truncate(cubes[0], size)  # what is there now are zeros, which nobody wrote
     with pytest.raises(OSError, match="became shorter while it was open"):
-        file.read("get_vara_float", 1, [4, 29, 30], [1, 1, 10])
+        file.read_with("get_vara_float", 1, [4, 29, 30], [1, 1, 10])
     assert file.mapped is mapped
     file.close()
     os.truncate(cubes[0], size - 5000)
@@ -385,17 +385,17 @@ def test_a_file_that_is_cut_off_while_it_is_read(tmp_path: Path) -> None:
     size = os.path.getsize(path)
     for _ in range(5):
         with OpenFile(str(path)) as file:
-            file.read("get_vara_schar", 0, [0], [1])
+            file.read_with("get_vara_schar", 0, [0], [1])
             cutter = threading.Timer(0.003, os.truncate, (path, 4096))
             cutter.start()
             try:
-                values = file.read("get_vara_schar", 0, [0], [50_000_000])
+                values = file.read_with("get_vara_schar", 0, [0], [50_000_000])
                 assert values.all()  # the call was over before
             except OSError as error:
                 assert "became shorter" in str(error)
             cutter.join()
             with pytest.raises(OSError, match="became shorter"):
-                file.read("get_vara_schar", 0, [0], [50_000_000])
+                file.read_with("get_vara_schar", 0, [0], [50_000_000])
         path.write_bytes(path.read_bytes() + bytes([1]) * (size - 4096))
 
 
@@ -426,7 +426,7 @@ print("survived")""", str(tmp_path / "mapped"))
 def test_a_file_that_cannot_be_mapped(cubes: list[str], monkeypatch: pytest.MonkeyPatch) -> None:
     monkeypatch.setattr(opening, "MAPPED", 16 | 64)  # a mode that the library refuses
     with OpenFile(cubes[0]) as file:
-        values = file.read("get_vara_float", 1, [0, 0, 0], [5, 30, 40])
+        values = file.read_with("get_vara_float", 1, [0, 0, 0], [5, 30, 40])
         assert not file.mapped
     np.testing.assert_array_equal(values.T.ravel(), np.arange(6000))
 

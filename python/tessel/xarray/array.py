@@ -3,6 +3,8 @@
 
 from __future__ import annotations
 
+from typing import Any
+
 import numpy as np
 from xarray.backends import BackendArray, CachingFileManager
 from xarray.core import indexing
@@ -24,6 +26,7 @@ class LazyArray(BackendArray):
 
     def __init__(self, manager: CachingFileManager, variable: Variable, mapped: bool) -> None:
         self._manager = manager
+        self._file: OpenFile | None = None  # the last one, because asking the manager takes longer
         self._name = variable.name
         self._type = variable.type
         # xarray reads these when it opens the dataset, and keeps them.
@@ -33,6 +36,9 @@ class LazyArray(BackendArray):
         self.dtype = np.dtype(DTYPES[str(variable.type.member)])
         self.memory = _MEMORY_OF_CHARACTER if variable.is_text else self.dtype.itemsize
         self.costs = planning.COSTS[mapped, variable.is_text]
+
+    def __getstate__(self) -> dict[str, Any]:
+        return {**self.__dict__, "_file": None}
 
     def __getitem__(self, key: indexing.ExplicitIndexer) -> np.ndarray:
         if isinstance(key, indexing.VectorizedIndexer):
@@ -55,15 +61,17 @@ class LazyArray(BackendArray):
 
     def _values(self, count: list[int], family: str, *places: list[int]) -> np.ndarray:
         while True:
-            file = self._manager.acquire()
+            file = self._file or self._manager.acquire()
             try:
                 varid = file.varids.get(self._name)
                 if varid is None:
                     varid = self._varid(file)
-                values = file.read(f"{family}_{self._type.member}", varid, *places, once=self._once)
+                values = file.read_with(f"{family}_{self._type.member}", varid, *places,
+                                        once=self._once)
+                self._file = file
                 break
-            except FileWasClosed:  # the cache has closed it, for another one, before we began
-                continue
+            except FileWasClosed:  # by the cache, for another one, or with the dataset
+                self._file = None
         if self._type.member == "text":
             values = _bytes(values)
         return values.T.reshape(count)  # a view of what the module gave

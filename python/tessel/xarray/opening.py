@@ -3,11 +3,11 @@
 
 The library has it open twice. One way is for what is read once, in many places, when a dataset is
 opened: through the smallest buffer. The other is for the data, from the first time that they are
-asked for: mapped into memory, which makes every later access faster, most of all those of few values
-in many places. What was measured is in docs/xarray.md.
+asked for: mapped into memory, which makes every later access faster, most of all those of few
+values in many places. What was measured is in docs/xarray.md.
 
-Both have a trap: where a mapped file is cut off later, looking at what is gone ends the process, and
-from behind the end of a file that is not mapped the library reads zeros. So
+Both have a trap: where a mapped file is cut off later, looking at what is gone ends the process,
+and from behind the end of a file that is not mapped the library reads zeros. So
 
 - a file must be as long as what is in it needs when it is opened (`tessel.check`);
 - while a mapped file is being read, what is gone is zeros instead of the end of the process
@@ -19,7 +19,6 @@ from __future__ import annotations
 
 import os
 import threading
-from collections.abc import Callable
 from typing import Any, NamedTuple
 
 import tessel
@@ -94,7 +93,11 @@ class OpenFile(Dataset):
         path = self.path
         if not self._is_at_its_path():  # it was renamed or removed, but is still there for us
             path = f"/proc/self/fd/{self._descriptor}"
-        self._ids.append(self._guarded(self._netcdf._open, path, mode, hint).ncid)
+        _faults.begin()
+        try:
+            self._ids.append(self._netcdf._open(path, mode, hint).ncid)
+        finally:
+            self._gone |= _faults.end()
         return self._ids[-1]
 
     def _is_at_its_path(self) -> bool:
@@ -115,18 +118,10 @@ class OpenFile(Dataset):
             self._data = self._opened("NOWRITE", LARGE_BUFFER)
         return self._data
 
-    def _guarded(self, method: Callable[..., Any], *arguments: object) -> Any:
-        """A call that may look at what is gone from a mapped file."""
-        _faults.begin()
-        try:
-            return method(*arguments)
-        finally:
-            self._gone |= _faults.end()
-
     def _error(self, word: str, message: str) -> tessel.Error:
         return refusal(word, message, self.place)
 
-    def read(self, operation: str, varid: int, *places: list[int], once: bool = False) -> Any:
+    def read_with(self, operation: str, varid: int, *places: list[int], once: bool = False) -> Any:
         """What an operation that reads gives. The places are in the library's order. `once` is for
         what is not going to be read again."""
         method = getattr(self._netcdf, operation)
@@ -134,7 +129,12 @@ class OpenFile(Dataset):
             if not self._ids:
                 raise FileWasClosed
             ncid = self.ncid if once else self._id_for_data
-            values = self._guarded(method, ncid, varid, *[each[::-1] for each in places])
+            in_host_order = [each[::-1] for each in places]
+            _faults.begin()
+            try:
+                values = method(ncid, varid, *in_host_order)
+            finally:
+                self._gone |= _faults.end()
             self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
             if self._gone:
                 raise self._error("fileTooShort", "The file became shorter while it was open.")

@@ -21,6 +21,7 @@ import itertools
 import math
 import operator
 from collections.abc import Iterator, Sequence
+from dataclasses import dataclass
 from typing import NamedTuple, Protocol, Union
 
 import numpy as np
@@ -57,10 +58,10 @@ class Costs(NamedTuple):
 
 
 COSTS = {
-    (True, False): Costs(call=6e-6, run=100e-9, byte=0.3e-9, picked=0.1e-9, strided=60e-9),
-    (True, True): Costs(call=9e-6, run=100e-9, byte=2e-9, picked=0.1e-9, strided=60e-9),
-    (False, False): Costs(call=6e-6, run=850e-9, byte=0.4e-9, picked=0.1e-9, strided=90e-9),
-    (False, True): Costs(call=9e-6, run=850e-9, byte=2e-9, picked=0.1e-9, strided=90e-9),
+    (True, False): Costs(call=4e-6, run=75e-9, byte=0.4e-9, picked=0.13e-9, strided=35e-9),
+    (True, True): Costs(call=6e-6, run=25e-9, byte=1.2e-9, picked=0.25e-9, strided=40e-9),
+    (False, False): Costs(call=4e-6, run=450e-9, byte=0.3e-9, picked=0.12e-9, strided=40e-9),
+    (False, True): Costs(call=5e-6, run=115e-9, byte=1.3e-9, picked=0.25e-9, strided=45e-9),
 }
 """By whether the file is mapped, and whether the values are characters: what
 `bench/access_costs.py` found."""
@@ -85,7 +86,8 @@ class Reader(Protocol):
         """Every n-th value from a start on."""
 
 
-class Axis(NamedTuple):
+@dataclass(frozen=True)
+class Axis:
     """The positions of a dimension that are wanted, each once and ascending."""
 
     length: int
