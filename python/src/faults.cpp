@@ -15,8 +15,6 @@
 namespace tessel::python {
 namespace {
 
-namespace py = pybind11;
-
 /// What the handler knows of the thread that it runs in. The memory for it must be there before,
 /// because none can be allocated within a handler.
 struct Watch {
@@ -31,9 +29,8 @@ std::uintptr_t pageSize = 0;
 
 /// A page of zeros instead of the one that is gone.
 bool replacePage(void *address) {
-    // NOLINTNEXTLINE(performance-no-int-to-ptr): an address is rounded down to its page.
-    auto *const page =
-        reinterpret_cast<void *>(reinterpret_cast<std::uintptr_t>(address) & ~(pageSize - 1));
+    const std::uintptr_t within = reinterpret_cast<std::uintptr_t>(address) % pageSize;
+    char *const page = static_cast<char *>(address) - within;
     return mmap(page, pageSize, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED, -1, 0) == page;
 }
 
