@@ -31,6 +31,11 @@ def find(name: bytes | str) -> Module: ...
 def load_file(path: bytes | str) -> Module: ...
 '''
 
+FAULTS = '''
+def begin() -> None: ...
+def end() -> bool: ...
+'''
+
 ERRORS = '''
 import builtins
 from typing import Any
@@ -116,6 +121,7 @@ def made() -> dict[str, str]:
     methods = "".join(method(each, name) for each in OPERATIONS for name in each.names)
     call = "class Netcdf(Module):\n    def __call__(self, *arguments: Any) -> Any: ...\n"
     return {
+        "_faults.pyi": heading("_faults.pyi") + FAULTS,
         "_runtime.pyi": heading("_runtime.pyi") + RUNTIME,
         "errors.pyi": heading("errors.pyi") + ERRORS + doubles,
         "netcdf.pyi": heading("netcdf.pyi") + NETCDF + results + call + methods,

@@ -1,4 +1,4 @@
-# tests/python/conftest.py: marks for tests that cannot run everywhere.
+# tests/python/conftest.py: marks for tests that cannot run everywhere, and what each test restores.
 """`without_sanitizers` marks what a build with sanitizers cannot run, and `separate_hosts` what needs
 networks of its own. ctest has each of them as a test of its own, which it counts as not run where
 that is so; a test that is skipped inside of another would not be seen."""
@@ -6,8 +6,10 @@ that is so; a test that is skipped inside of another would not be seen."""
 from __future__ import annotations
 
 import os
+from collections.abc import Iterator
 
 import pytest
+import tessel
 
 
 def pytest_configure(config: pytest.Config) -> None:
@@ -24,3 +26,11 @@ def pytest_collection_modifyitems(items: list[pytest.Item]) -> None:
         for item in items:
             if item.get_closest_marker("without_sanitizers"):
                 item.add_marker(pytest.mark.skip(reason="not in a build with sanitizers"))
+
+
+@pytest.fixture(autouse=True)
+def default_format() -> Iterator[None]:
+    """netCDF4-python changes the format that new files get, in the library that it shares with us,
+    whenever it makes a file. Each test leaves it as it should be."""
+    yield
+    tessel.load("netcdf")("set_default_format", 1)

@@ -13,7 +13,7 @@ import tessel
 ROOT = Path(__file__).parents[2]
 PACKAGE = ROOT / "python" / "tessel"
 EXAMPLE = Path(__file__).with_name("typed_example.py")
-MODULES = ["tessel.netcdf", "tessel.errors", "tessel._runtime"]
+MODULES = ["tessel.netcdf", "tessel.errors", "tessel._runtime", "tessel._faults"]
 
 # The types do not depend on how the extension was compiled, and mypy would take very long.
 pytestmark = pytest.mark.without_sanitizers
