@@ -18,24 +18,21 @@ namespace {
 constexpr int repetitions = 25;
 constexpr int blockRepetitions = 9;
 constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
-constexpr benchmark::TimeUnit blockUnit = benchmark::kMillisecond;
 
 double shortest(const std::vector<double> &all) {
     return *std::min_element(all.begin(), all.end());
 }
 
-/// The statistics of all benchmarks, in seconds, by "NAME/STATISTIC": of what is short the time of
-/// the processor, from which other work on the machine takes little away, and of blocks the time
-/// that passes.
+/// The statistics of all benchmarks, in seconds, by "NAME/STATISTIC". It is the time of the
+/// processor, in the program and in the system, that counts: nothing here waits for a device, and
+/// other work on the machine takes little of it away.
 class Statistics : public benchmark::ConsoleReporter {
   public:
     void ReportRuns(const std::vector<Run> &runs) override {
         ConsoleReporter::ReportRuns(runs);
         for (const Run &run : runs) {
             seconds[run.run_name.function_name + "/" + run.aggregate_name] =
-                (run.time_unit == blockUnit ? run.GetAdjustedRealTime()
-                                            : run.GetAdjustedCPUTime()) /
-                benchmark::GetTimeUnitMultiplier(run.time_unit);
+                run.GetAdjustedCPUTime() / benchmark::GetTimeUnitMultiplier(run.time_unit);
         }
     }
 
@@ -90,7 +87,7 @@ void add(const std::string &name, const std::function<void()> &work, bool block)
         ->UseRealTime();
     registered->ComputeStatistics("shortest", shortest);
     if (block) {
-        registered->Iterations(1)->Unit(blockUnit);
+        registered->Iterations(1)->Unit(benchmark::kMillisecond);
     } else {
         registered->MinTime(shortestTime);
     }
