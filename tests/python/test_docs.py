@@ -8,7 +8,9 @@ import re
 import subprocess
 from pathlib import Path
 
+import numpy
 import pytest
+import tessel
 
 ROOT = Path(__file__).parents[2]
 DOCS = ROOT / "docs"
@@ -60,16 +62,18 @@ def test_code_is_quoted_as_it_is(document: str, least: int) -> None:
 
 
 def test_readme() -> None:
-    """The example in the README runs, on the file that it is about."""
-    [example] = snippets(ROOT / "README.md", "python")
+    """The examples in the README run, on the file that they are about."""
+    plain, labelled = snippets(ROOT / "README.md", "python")
     files = subprocess.run(["dpkg", "-L", "ferret-datasets"], capture_output=True, check=True,
                            text=True).stdout.split()
     [path] = [file for file in files if file.endswith("/coads_climatology.cdf")]
     Path("coads_climatology.cdf").symlink_to(path)
     printed = io.StringIO()
     with contextlib.redirect_stdout(printed):
-        exec(example, {})  # it is the project's own
+        exec(plain, {})  # it is the project's own
+        exec(labelled, {})
     assert "TESSEL:netcdf:inqVarID:variableNotFound" in printed.getvalue()
+    assert -2 < numpy.nanmin(tessel.read("mean.nc", "SST")) < 0
 
 
 def test_a_wrong_example_fails() -> None:
