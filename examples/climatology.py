@@ -1,7 +1,7 @@
 # examples/climatology.py: from many files to a picture of the seasons, cell by cell.
 """Makes a seasonal cycle of monthly winds, eleven years of them in as many files, and draws it.
 
-usage: climatology.py [FOLDER]
+usage: climatology.py [FOLDER]    (without FOLDER, nothing is kept)
 
 The winds are those of the Debian package ferret-datasets. The program is made of cells, as editors
 that know notebooks show them; each ends with what it found out.

@@ -99,11 +99,6 @@ const Fatal rows[] = {
               "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) +
                   "v\0\0\0"s + words({1, 0, 0, 0, 12, 4, 100}));
      }},
-    {"OpenOfVariablesBehindAnEmptyListWithAnotherTag", "TESSEL:guard:header",
-     "has 268435456 variables",
-     [](const Module &netcdf, const Folder &folder) {
-         open(netcdf, folder, "CDF\1" + words({0, 0, 0, 11, 0, 11, 0x10000000}));
-     }},
     {"NameWhoseLengthTheFileEndsIn", "TESSEL:guard:header", "characters in a name",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),
