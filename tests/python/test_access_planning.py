@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import math
 import random
+import tracemalloc
 from collections.abc import Iterator
 
 import netCDF4
@@ -225,3 +226,42 @@ def test_the_error_of_the_operation_comes_through(path: str, way: str) -> None:
     tag = {"get_vara": "getVara", "get_vars": "getVars"}[array.asked[-1][0]]
     assert error.value.identifier.startswith(f"TESSEL:netcdf:{tag}:")
     assert error.value.word in ("indexExceedsDimensionBound", "startPlusCountExceedsDimensionBound")
+
+
+class Series:
+    """A long series of bytes, which are their positions."""
+
+    dtype = np.dtype("u1")
+    memory = 1
+
+    def __init__(self, length: int, costs: Costs) -> None:
+        self.shape = (length,)
+        self.costs = costs
+
+    @staticmethod
+    def block(start: list[int], count: list[int]) -> np.ndarray:
+        return np.arange(start[0], start[0] + count[0]).astype("u1")
+
+    @staticmethod
+    def strided(start: list[int], count: list[int], step: list[int]) -> np.ndarray:
+        return (start[0] + np.arange(count[0]) * step[0]).astype("u1")
+
+
+@pytest.mark.parametrize("step", [2, 10, 1000])
+@pytest.mark.parametrize("listed", [False, True])
+def test_a_long_series_needs_little_memory(path: str, step: int, listed: bool) -> None:
+    """The positions of a long series are not counted out, one by one, to be dismissed."""
+    length = 10**7
+    series = Series(length, Recorder(path, f"line_{next(iter(MEMBERS.values()))}").costs)
+    # Some positions are missing, so that the list is no slice.
+    key = np.delete(np.arange(0, length, step), [3, 5]) if listed else slice(None, None, step)
+    tracemalloc.start()
+    try:
+        found = planning.read(series, (key,))
+        most = tracemalloc.get_traced_memory()[1]
+    finally:
+        tracemalloc.stop()
+    expected = np.arange(length)[key].astype("u1")
+    assert found.tobytes() == expected.tobytes()
+    # The pieces are made of positions of eight bytes here, and a list is looked at as numbers.
+    assert most < 64 * len(expected) * listed + len(expected) + 32 * planning.PIECE_BYTES

@@ -353,6 +353,35 @@ def test_a_file_that_grew(cubes: list[str]) -> None:
     dataset.close()
 
 
+SPARSE_COLUMN = """
+import os, sys, xarray
+dataset = xarray.open_dataset(sys.argv[1], engine="tessel", cache=False)
+dataset.v[0, :3].load()
+os.truncate(sys.argv[1], 4096)
+try:
+    dataset.v[:, 5].load()
+except OSError as error:
+    print(error.word)
+"""
+
+
+@pytest.mark.without_sanitizers
+def test_a_file_that_was_cut_off_before_a_read_in_many_places(tmp_path: Path) -> None:
+    """A page for each place that is gone would be more mappings than a process may have."""
+    path = str(tmp_path / "sparse.nc")
+    nc = tessel.load("netcdf")
+    ncid = nc.create(path, 512)
+    rows, columns = nc.def_dim(ncid, "row", 70000), nc.def_dim(ncid, "column", 2048)
+    nc.def_var(ncid, "v", 5, [columns, rows])
+    nc.set_fill(ncid, 256)
+    nc.enddef(ncid)
+    nc.put_var1_float(ncid, 0, [2047, 69999], 1)  # the file is long, and has hardly any blocks
+    nc.close(ncid)
+    done = subprocess.run([sys.executable, "-B", "-c", SPARSE_COLUMN, path], capture_output=True,
+                          text=True, check=False)
+    assert (done.returncode, done.stdout) == (0, "fileTooShort\n"), done.stderr
+
+
 @pytest.mark.parametrize("mapped", [True, False])
 def test_a_file_that_is_cut_off(cubes: list[str], mapped: bool) -> None:
     size = os.path.getsize(cubes[0])

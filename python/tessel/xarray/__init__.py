@@ -6,7 +6,8 @@
     >>> tessel.xarray.to_netcdf(dataset, "copy.nc")
 
 xarray finds the engine by itself wherever this package is; nothing needs to be imported for it. It
-opens files of the classic and of the 64-bit offset format, and `to_netcdf` writes them. See docs/xarray.md.
+opens files of the classic and of the 64-bit offset format, and `to_netcdf` writes them. See
+docs/xarray.md.
 """
 
 from tessel.xarray.engine import TesselBackendEntrypoint

@@ -128,6 +128,7 @@ class OpenFile(Dataset):
         with self._lock:
             if not self._ids:
                 raise FileWasClosed
+            self._want_all()  # a cut that was there before costs neither time nor memory
             ncid = self.ncid if once else self._id_for_data
             in_host_order = [each[::-1] for each in places]
             _faults.begin()
@@ -135,10 +136,14 @@ class OpenFile(Dataset):
                 values = method(ncid, varid, *in_host_order)
             finally:
                 self._gone |= _faults.end()
-            self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
-            if self._gone:
-                raise self._error("fileTooShort", "The file became shorter while it was open.")
+            self._want_all()
             return values
+
+    def _want_all(self) -> None:
+        """Raises the error for a file that became shorter."""
+        self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
+        if self._gone:
+            raise self._error("fileTooShort", "The file became shorter while it was open.")
 
     def place_of(self, name: str) -> Place:
         """Where a variable is."""

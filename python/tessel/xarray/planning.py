@@ -261,8 +261,11 @@ def _combinations(reader: Reader, axes: list[Axis]) -> Iterator[list[Groups]]:
     """Block and pick in every dimension, or runs in some of them."""
     together = [[(0, each.count)] for each in axes]
     yield together
-    others = [number for number, each in enumerate(axes) if not each.contiguous]
-    runs = {number: _neighbours(reader, axes, number) for number in others}
+    # As many runs as cost more than all of it together are not even counted out.
+    limit = _cost(reader, axes, _in_pieces(reader, axes, together))
+    runs = {number: _neighbours(reader, axes, number, limit)
+            for number, each in enumerate(axes) if not each.contiguous}
+    others = [number for number, those in runs.items() if those]
     sizes = range(1, len(others) + 1) if len(others) <= _MOST_COMPARED else [1, len(others)]
     for size in sizes:
         for chosen in itertools.combinations(others, size):
@@ -270,17 +273,20 @@ def _combinations(reader: Reader, axes: list[Axis]) -> Iterator[list[Groups]]:
                    for number, each in enumerate(together)]
 
 
-def _neighbours(reader: Reader, axes: list[Axis], number: int) -> Groups:
+def _neighbours(reader: Reader, axes: list[Axis], number: int, limit: float) -> Groups:
     """The positions of a dimension in groups, between which a call costs less than what it saves
-    to read."""
+    to read; none if their calls alone would cost more than the limit."""
     axis = axes[number]
     if axis.places is None:
-        return [(each, each + 1) for each in range(axis.count)]
+        affordable = axis.count * reader.costs.call <= limit
+        return [(each, each + 1) for each in range(axis.count)] if affordable else []
     inner = math.prod(each.count for each in axes[number + 1:])
     outer = math.prod(each.count for each in axes[:number])
     costs = reader.costs
     one = outer * (inner * reader.dtype.itemsize * costs.byte + costs.run * (inner > 1))
     ends = np.flatnonzero((np.diff(axis.places) - 1) * one > costs.call) + 1
+    if (len(ends) + 1) * costs.call > limit:
+        return []
     return list(zip([0, *ends.tolist()], [*ends.tolist(), axis.count]))
 
 
