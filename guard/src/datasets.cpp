@@ -1,6 +1,7 @@
 // guard/src/datasets.cpp: what the guard knows of open datasets.
 #include "datasets.hpp"
 
+#include "external_types.hpp"
 #include "tessel/array.h"
 
 #include <algorithm>
@@ -9,9 +10,6 @@
 
 namespace tessel::guard {
 namespace {
-
-/// The bytes of an element of each external type; the numbers of the types begin with 1.
-constexpr std::array<std::uint64_t, 7> typeSizes = {0, 1, 1, 2, 4, 4, 8};
 
 int asInt(const Array &array) {
     return static_cast<int>(array.number());
@@ -40,8 +38,9 @@ std::uint64_t lengthOf(int ncid, int dimid, const Ask &ask) {
 
 /// The bytes of one record of a variable, rounded up as the formats have it.
 std::uint64_t recordBytes(int ncid, const Variable &variable, const Ask &ask) {
+    // What only files based on HDF5 have is taken for the largest of the others.
     const auto type = static_cast<std::size_t>(variable.type);
-    std::uint64_t bytes = type < typeSizes.size() ? typeSizes[type] : typeSizes.back();
+    std::uint64_t bytes = type < typeSizes.size() ? typeSizes[type] : sizeof(double);
     for (const double dimid : variable.dimids.first(variable.dimids.size() - 1)) {
         bytes *= lengthOf(ncid, static_cast<int>(dimid), ask);
     }

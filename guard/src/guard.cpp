@@ -125,8 +125,6 @@ void lookAtAlignment(Inputs inputs, int ncid, const Dataset *dataset, const Ask 
     }
 }
 
-using Indices = std::vector<std::uint64_t>;
-
 /// Counts that wrap around to what was given. Empty data are the module's to refuse.
 void lookAtCounts(const Indices &count, const tsArray *data) {
     std::uint64_t product = 1;

@@ -1,6 +1,8 @@
 // guard/src/header.cpp: what a file of the classic formats claims about itself.
 #include "header.hpp"
 
+#include "external_types.hpp"
+
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -10,7 +12,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <string_view>
-#include <vector>
 
 namespace tessel::guard {
 namespace {
@@ -22,10 +23,7 @@ constexpr std::uint64_t maxDimensions = 1024;
 /// The lists of a header, by their tags.
 enum : std::uint32_t { dimensionList = 10, variableList = 11, attributeList = 12 };
 
-/// The bytes of an element of each external type; the numbers of the types begin with 1. The last
-/// one is no type of these formats, and known to the library all the same, which divides by its
-/// size where it is a variable's. It refuses all beyond.
-constexpr std::array<unsigned, 13> typeSizes = {0, 1, 1, 2, 4, 4, 8, 1, 2, 4, 8, 8, 0};
+/// The last type, which is none.
 constexpr std::uint64_t typeWithoutSize = typeSizes.size() - 1;
 
 /// Nothing more can be said: the file is not of these formats, or cannot be read. The library says

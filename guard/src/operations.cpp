@@ -148,7 +148,7 @@ std::optional<std::uint64_t> size(const tsArray *input) {
     return found ? std::optional(found->back()) : std::nullopt;
 }
 
-std::optional<std::vector<std::uint64_t>> indices(const tsArray *input) {
+std::optional<Indices> indices(const tsArray *input) {
     const tsClassID found = tsGetClassID(input);
     const auto *const reader = std::find_if(
         readers.begin(), readers.end(), [&](const Reader &row) { return row.classID == found; });
@@ -156,7 +156,7 @@ std::optional<std::vector<std::uint64_t>> indices(const tsArray *input) {
         return std::nullopt;
     }
     const std::size_t n = tsGetNumberOfElements(input);
-    std::vector<std::uint64_t> values(n);
+    Indices values(n);
     for (std::size_t i = 0; i < n; ++i) {
         const auto value = reader->read(input, i);
         if (!value) {

@@ -32,6 +32,9 @@ enum class Kind {
 /// `other` for operations without interest, and for calls that the module refuses itself.
 Kind kindOf(Inputs inputs);
 
+/// An element a dimension.
+using Indices = std::vector<std::uint64_t>;
+
 /// An argument as the module reads ids and flags: the first element of a double or int32 array.
 /// Nothing for what the module refuses.
 std::optional<int> integer(const tsArray *input);
@@ -41,7 +44,7 @@ std::optional<std::uint64_t> size(const tsArray *input);
 
 /// Positions, counts or steps in the library's order, as the module reads them: fractions are
 /// truncated and negative values wrap around. Nothing for what the module refuses.
-std::optional<std::vector<std::uint64_t>> indices(const tsArray *input);
+std::optional<Indices> indices(const tsArray *input);
 
 /// A file name as the library gets it: up to the first zero.
 std::optional<std::string> fileName(const tsArray *input);

@@ -9,6 +9,7 @@
 #include "pinned.hpp"
 #include "run.hpp"
 #include "statistics.hpp"
+#include "support/process.hpp"
 
 #include <rapidcheck.h>
 #include <unistd.h>
@@ -70,35 +71,21 @@ Options optionsOf(int argc, char *argv[]) {
     return options;
 }
 
-/// A folder of this run's own, in memory where the system has such a place.
+/// A folder of this run's own, which is the current one: a program that names a path of its own
+/// harms nothing.
 class Workplace {
   public:
     Workplace() {
-        const fs::path memory = "/dev/shm";
-        const bool hasMemory = access(memory.c_str(), W_OK) == 0;
-        std::string pattern =
-            ((hasMemory ? memory : fs::temp_directory_path()) / "tessel-difference-XXXXXX")
-                .string();
-        if (mkdtemp(pattern.data()) == nullptr) {
-            throw std::runtime_error("cannot make a folder like " + pattern);
-        }
-        root = pattern;
         fs::create_directory(module());
         fs::create_directory(library());
-        fs::current_path(root); // so that a program which names a path of its own harms nothing
+        fs::current_path(root.folder());
     }
-    ~Workplace() {
-        std::error_code ignored;
-        fs::remove_all(root, ignored);
-    }
-    Workplace(const Workplace &) = delete;
-    Workplace &operator=(const Workplace &) = delete;
 
-    [[nodiscard]] fs::path module() const { return root / "module"; }
-    [[nodiscard]] fs::path library() const { return root / "library"; }
+    [[nodiscard]] fs::path module() const { return root.file("module"); }
+    [[nodiscard]] fs::path library() const { return root.file("library"); }
 
   private:
-    fs::path root;
+    tessel::test::Folder root{tessel::test::placeInMemory()};
 };
 
 /// Both sides, and what came of the last program.

@@ -19,19 +19,6 @@ int idOf(const Results &opened) {
     return static_cast<int>(opened[opened.size() - 1].number());
 }
 
-Folder::Folder() {
-    std::string pattern = (std::filesystem::temp_directory_path() / "faults-XXXXXX").string();
-    if (mkdtemp(pattern.data()) == nullptr) {
-        throw std::runtime_error("cannot make a folder like " + pattern);
-    }
-    path = pattern;
-}
-
-Folder::~Folder() {
-    std::error_code ignored;
-    std::filesystem::remove_all(path, ignored);
-}
-
 namespace log {
 namespace {
 

@@ -2,6 +2,7 @@
 // end badly.
 #pragma once
 
+#include "support/process.hpp"
 #include "tessel/runtime.hpp"
 
 #include <cstddef>
@@ -27,21 +28,6 @@ std::string raisedBy(const Call &call) {
 
 /// The id of the dataset that a call opened or created.
 int idOf(const Results &opened);
-
-/// A folder that is removed with what is in it.
-class Folder {
-  public:
-    Folder();
-    ~Folder();
-    Folder(const Folder &) = delete;
-    Folder &operator=(const Folder &) = delete;
-
-    [[nodiscard]] std::string file(std::string_view name) const { return path / name; }
-    [[nodiscard]] const std::filesystem::path &folder() const { return path; }
-
-  private:
-    std::filesystem::path path;
-};
 
 /// A dataset that grows by records. Each value is a function of where it stands, so that a reader
 /// knows what must be there.

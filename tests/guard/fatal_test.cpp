@@ -51,7 +51,7 @@ void writeStrided(const Module &netcdf, const Folder &folder, const char *operat
 }
 
 int open(const Module &netcdf, const Folder &folder, const std::string &bytes) {
-    return intOf(netcdf("open", folder.with("a.nc", bytes), "NOWRITE"));
+    return intOf(netcdf("open", written(folder, "a.nc", bytes), "NOWRITE"));
 }
 
 /// In define mode, with a variable.

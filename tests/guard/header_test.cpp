@@ -88,7 +88,7 @@ class Header : public testing::TestWithParam<Claim> {};
 TEST_P(Header, IsLookedAt) {
     const Claim &claim = GetParam();
     const Folder folder;
-    const std::string file = folder.with("a.nc", claim.bytes);
+    const std::string file = written(folder, "a.nc", claim.bytes);
     const Module netcdf = guardedModule();
     std::string message;
     const std::string identifier = identifierOf([&] {

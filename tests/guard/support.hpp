@@ -1,6 +1,7 @@
 // tests/guard/support.hpp: datasets in a folder of the test's own, with and without the guard.
 #pragma once
 
+#include "support/process.hpp"
 #include "tessel/netcdf_guard.hpp"
 
 #include <gtest/gtest.h>
@@ -33,30 +34,11 @@ std::string identifierOf(const Call &call) {
     return "";
 }
 
-/// A folder that goes with the test.
-class Folder {
-  public:
-    Folder() {
-        std::string pattern = (std::filesystem::temp_directory_path() / "guard-XXXXXX").string();
-        path = mkdtemp(pattern.data());
-    }
-    ~Folder() {
-        std::error_code ignored;
-        std::filesystem::remove_all(path, ignored);
-    }
-    Folder(const Folder &) = delete;
-    Folder &operator=(const Folder &) = delete;
-
-    [[nodiscard]] std::string file(std::string_view name) const { return path / name; }
-
-    [[nodiscard]] std::string with(std::string_view name, std::string_view bytes) const {
-        std::ofstream(path / name, std::ios::binary) << bytes;
-        return path / name;
-    }
-
-  private:
-    std::filesystem::path path;
-};
+/// A new file with these bytes.
+inline std::string written(const Folder &folder, std::string_view name, std::string_view bytes) {
+    std::ofstream(folder.file(name), std::ios::binary) << bytes;
+    return folder.file(name);
+}
 
 inline int intOf(const Results &results) {
     return static_cast<int>(results[results.size() - 1].number());

@@ -6,6 +6,7 @@
 // The run ends after N calls or H hours, whichever is given and comes last. It is looked at in
 // twenty parts. With --leak a result of every
 // hundredth call is kept, and one descriptor in a part; that must be noticed.
+#include "support/process.hpp"
 #include "tessel/runtime.hpp"
 
 #include <fcntl.h>
@@ -32,6 +33,8 @@ namespace {
 using tessel::Array;
 using tessel::Error;
 using tessel::Module;
+using tessel::test::openDescriptors;
+using tessel::test::residentMegabytes;
 using Clock = std::chrono::steady_clock;
 
 struct Options {
@@ -60,30 +63,6 @@ Options optionsOf(int argc, char **argv) {
     return options;
 }
 
-/// A folder that is removed with what is in it, in memory where the system has such a place: what
-/// is measured is not the disk.
-class Folder {
-  public:
-    Folder() {
-        const std::filesystem::path memory = "/dev/shm";
-        const std::filesystem::path place =
-            access(memory.c_str(), W_OK) == 0 ? memory : std::filesystem::temp_directory_path();
-        std::string pattern = (place / "long-XXXXXX").string();
-        if (mkdtemp(pattern.data()) == nullptr) {
-            throw std::runtime_error("cannot make a temporary folder");
-        }
-        path = pattern;
-    }
-    ~Folder() {
-        std::error_code ignored;
-        std::filesystem::remove_all(path, ignored);
-    }
-    Folder(const Folder &) = delete;
-    Folder &operator=(const Folder &) = delete;
-
-    std::filesystem::path path;
-};
-
 constexpr int partCount = 20;
 constexpr std::size_t columns = 8;
 constexpr std::size_t rows = 4;
@@ -96,9 +75,9 @@ Array pair(double first, double second) {
 /// made anew.
 struct Scene {
     Module netcdf{TESSEL_NETCDF_MODULE};
-    Folder folder;
-    std::string file = folder.path / "open.nc";
-    std::string other = folder.path / "other.nc";
+    tessel::test::Folder folder{tessel::test::placeInMemory()}; // the disk is not measured
+    std::string file = folder.file("open.nc");
+    std::string other = folder.file("other.nc");
     double ncid = 0;
     Array block = Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{columns, rows});
 
@@ -187,18 +166,6 @@ const std::vector<Kind> failures = {
     {"TESSEL:netcdf:defDim:operationNotAllowedInDataMode", 1, [](const Scene &s, const Module &n) { n("def_dim", s.ncid, "z", 2); }},
 };
 // clang-format on
-
-std::size_t openDescriptors() {
-    const std::filesystem::directory_iterator descriptors("/proc/self/fd");
-    return static_cast<std::size_t>(std::distance(begin(descriptors), end(descriptors)));
-}
-
-double residentMegabytes() {
-    std::size_t total = 0;
-    std::size_t resident = 0;
-    std::ifstream("/proc/self/statm") >> total >> resident;
-    return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / 1e6;
-}
 
 /// How things stood at the end of a part of the run.
 struct Part {

@@ -4,7 +4,6 @@ to the host and back without a module between."""
 from __future__ import annotations
 
 import gc
-import importlib.util
 import os
 import sys
 from collections.abc import Callable
@@ -19,15 +18,8 @@ from test_memory import resident
 INT32 = 11
 
 
-def _load() -> Any:
-    spec = importlib.util.spec_from_file_location("conversions", os.environ["TESSEL_CONVERSIONS"])
-    assert spec is not None and spec.loader is not None
-    extension = importlib.util.module_from_spec(spec)
-    spec.loader.exec_module(extension)
-    return extension
-
-
-conversions = _load()
+sys.path.append(os.path.dirname(os.environ["TESSEL_CONVERSIONS"]))
+import conversions  # noqa: E402
 
 
 def objects(values: list[Any], shape: tuple[int, ...]) -> np.ndarray:

@@ -1,7 +1,7 @@
 """tests/python/test_stubs.py: the type stubs are those of the tables and of the living package."""
 
-import importlib.util
 import os
+import runpy
 import subprocess
 import sys
 from collections.abc import Iterator
@@ -24,10 +24,7 @@ ALLOWED = "tessel.netcdf.Netcdf\ntessel._runtime.Module\n"
 
 def written() -> dict[str, str]:
     """What the tool would write."""
-    spec = importlib.util.spec_from_file_location("make_stubs", ROOT / "tools" / "make_stubs.py")
-    tool = importlib.util.module_from_spec(spec)
-    spec.loader.exec_module(tool)
-    return tool.made()
+    return runpy.run_path(str(ROOT / "tools" / "make_stubs.py"))["made"]()
 
 
 @pytest.fixture(scope="module", autouse=True)

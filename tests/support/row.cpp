@@ -3,6 +3,7 @@
 
 #include "support/conformance.hpp"
 #include "support/probe.hpp"
+#include "support/process.hpp"
 #include "support/text.hpp"
 
 #include <algorithm>
@@ -170,11 +171,6 @@ std::string outcomeWithout(std::size_t n, const Row &row, const Seen &undisturbe
 bool asksLibrary(const Lines &asks) {
     return std::any_of(asks.begin(), asks.end(),
                        [](const std::string &ask) { return ask.starts_with("nc_"); });
-}
-
-std::size_t openDescriptors() {
-    const std::filesystem::directory_iterator descriptors("/proc/self/fd");
-    return static_cast<std::size_t>(std::distance(begin(descriptors), end(descriptors)));
 }
 
 void checkUndisturbed(const Row &row, const Seen &seen) {

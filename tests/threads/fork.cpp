@@ -2,6 +2,7 @@
 // calls themselves. Usage: threads_fork [FORKS]
 //
 // A child that cannot go on is ended by its alarm, and then the program fails.
+#include "support/process.hpp"
 #include "tessel/runtime.hpp"
 
 #include <sys/wait.h>
@@ -70,11 +71,11 @@ bool inChild(const Run &run) {
 }
 
 /// Threads that are always within calls, and threads that fork meanwhile.
-std::size_t forkWhileOthersCall(const std::string &folder, std::size_t forks) {
+std::size_t forkWhileOthersCall(const tessel::test::Folder &folder, std::size_t forks) {
     const Module netcdf{TESSEL_NETCDF_MODULE};
     std::atomic<bool> done = false;
     std::atomic<std::size_t> faults = 0;
-    const auto fileOf = [&](const std::string &name) { return folder + "/" + name + ".nc"; };
+    const auto fileOf = [&](const std::string &name) { return folder.file(name + ".nc"); };
     std::vector<std::thread> calling;
     for (std::size_t i = 0; i < callers; ++i) {
         calling.emplace_back([&, i] {
@@ -119,13 +120,9 @@ std::size_t forkWithinACall() {
 
 int main(int argc, char **argv) try {
     const std::size_t forks = argc > 1 ? std::stoul(argv[1]) : 100;
-    std::string folder = (std::filesystem::temp_directory_path() / "fork-XXXXXX").string();
-    if (mkdtemp(folder.data()) == nullptr) {
-        throw std::runtime_error("cannot make a temporary folder");
-    }
+    const tessel::test::Folder folder;
     const std::size_t within = forkWithinACall();
     const std::size_t beside = forkWhileOthersCall(folder, forks);
-    std::filesystem::remove_all(folder);
     std::printf("%zu forks beside calls, %zu faults; 1 within a call, %zu faults\n", forks, beside,
                 within);
     return within + beside == 0 ? EXIT_SUCCESS : EXIT_FAILURE;

@@ -4,6 +4,7 @@
 // The netCDF module is loaded and unloaded by threads that end afterwards, which is when functions
 // run that the library has left behind. Memory and descriptors must not grow with the number of
 // times.
+#include "support/process.hpp"
 #include "tessel/runtime.hpp"
 
 #include <unistd.h>
@@ -23,6 +24,8 @@
 namespace {
 
 using tessel::Module;
+using tessel::test::openDescriptors;
+using tessel::test::residentMegabytes;
 
 /// True where a sanitizer remembers what was allocated, which is memory too.
 #if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
@@ -36,37 +39,6 @@ void want(bool holds, const char *what) {
         throw std::runtime_error(what);
     }
 }
-
-std::size_t openDescriptors() {
-    const std::filesystem::directory_iterator descriptors("/proc/self/fd");
-    return static_cast<std::size_t>(std::distance(begin(descriptors), end(descriptors)));
-}
-
-/// The resident memory in megabytes.
-double residentMegabytes() {
-    std::size_t total = 0;
-    std::size_t resident = 0;
-    std::ifstream("/proc/self/statm") >> total >> resident;
-    return static_cast<double>(resident) * static_cast<double>(sysconf(_SC_PAGESIZE)) / 1e6;
-}
-
-/// A folder that is removed with what is in it.
-class Folder {
-  public:
-    Folder() {
-        std::string pattern = (std::filesystem::temp_directory_path() / "loading-XXXXXX").string();
-        want(mkdtemp(pattern.data()) != nullptr, "cannot make a temporary folder");
-        path = pattern;
-    }
-    ~Folder() {
-        std::error_code ignored;
-        std::filesystem::remove_all(path, ignored);
-    }
-    Folder(const Folder &) = delete;
-    Folder &operator=(const Folder &) = delete;
-
-    std::filesystem::path path;
-};
 
 /// A new dataset with one dimension of the given length; open.
 double create(const Module &netcdf, const std::string &file, double length) {
@@ -166,9 +138,9 @@ void twoAtOnce(const std::filesystem::path &folder) {
 
 int main(int argc, char **argv) try {
     const std::size_t times = argc > 1 ? std::stoul(argv[1]) : 200;
-    const Folder folder;
-    comeAndGo(folder.path, times);
-    twoAtOnce(folder.path);
+    const tessel::test::Folder folder;
+    comeAndGo(folder.folder(), times);
+    twoAtOnce(folder.folder());
     return EXIT_SUCCESS;
 } catch (const std::exception &error) {
     std::fprintf(stderr, "%s\n", error.what());

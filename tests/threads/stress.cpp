@@ -3,6 +3,7 @@
 //
 // Every value is a function of where it stands, so each thread can check all that it reads without
 // knowing what the others do. What is wrong is printed, and then the program fails.
+#include "support/process.hpp"
 #include "tessel/runtime.hpp"
 
 #include <algorithm>
@@ -48,27 +49,6 @@ double valueAt(std::size_t column, std::size_t row, std::size_t writer) {
     return static_cast<double>(column + (1000 * row) + (1000000 * writer));
 }
 
-/// A folder that is removed with what is in it.
-class Folder {
-  public:
-    Folder() {
-        std::string pattern = (std::filesystem::temp_directory_path() / "threads-XXXXXX").string();
-        want(mkdtemp(pattern.data()) != nullptr, "cannot make a temporary folder");
-        path = pattern;
-    }
-    ~Folder() {
-        std::error_code ignored;
-        std::filesystem::remove_all(path, ignored);
-    }
-    Folder(const Folder &) = delete;
-    Folder &operator=(const Folder &) = delete;
-
-    [[nodiscard]] std::string file(const std::string &name) const { return (path / name).string(); }
-
-  private:
-    std::filesystem::path path;
-};
-
 /// All dataset ids that were ever handed out.
 class Ids {
   public:
@@ -84,11 +64,6 @@ class Ids {
     std::set<double> ids;
 };
 
-std::size_t openDescriptors() {
-    const std::filesystem::directory_iterator descriptors("/proc/self/fd");
-    return static_cast<std::size_t>(std::distance(begin(descriptors), end(descriptors)));
-}
-
 Array lengths(std::size_t first, std::size_t second) {
     return Array::row({static_cast<double>(first), static_cast<double>(second)});
 }
@@ -96,7 +71,7 @@ Array lengths(std::size_t first, std::size_t second) {
 /// What all threads use.
 struct Scene {
     Module netcdf{TESSEL_NETCDF_MODULE};
-    Folder folder;
+    tessel::test::Folder folder;
     Ids ids;
     std::string commonFile = folder.file("common.nc");
     double readId = 0;  ///< commonFile, open for reading
@@ -334,7 +309,7 @@ void wantAllClosed(Scene &scene) {
 
 bool stress(double seconds) {
     Scene scene;
-    const std::size_t before = openDescriptors();
+    const std::size_t before = tessel::test::openDescriptors();
     const double made = scene.create(scene.commonFile, rows);
     scene.fill(made, rows, 0);
     scene.netcdf("close", made);
@@ -347,7 +322,7 @@ bool stress(double seconds) {
     scene.netcdf("close", scene.writeId);
     scene.netcdf("close", scene.readId);
     wantAllClosed(scene);
-    want(openDescriptors() == before, "descriptors are open that were not");
+    want(tessel::test::openDescriptors() == before, "descriptors are open that were not");
     return good;
 }
 
