@@ -84,8 +84,9 @@ def pieces() -> list[Piece]:
         if file.parent.name in ("gateway", "call"):
             continue
         text = re.sub(r"//.*", "", file.read_text())
-        for body in re.split(r"\n\n+(?=\S)", text):
-            name = (re.search(r"^constexpr [^=\n]*?(\w+) = ", body, re.M)
+        # The rows of the families' table stand one under the other.
+        for body in re.split(r"\n\n+(?=\S)|\n(?=inline constexpr Family<)", text):
+            name = (re.search(r"^(?:inline )?constexpr [^=\n]*?(\w+) += ", body, re.M)
                     or re.search(r"^(?!#|template|using|struct)[\w\[].*?[ *&](\w+)\(", body, re.M))
             if name is not None and "{" in body:  # else it is only declared
                 found.append(Piece(str(file.relative_to(MODULE)), name[1], body,

@@ -5,6 +5,7 @@
 // have 16 bits; the result is made, and the buffer freed, before anyone looks at the status.
 #pragma once
 
+#include "call/operation.hpp"
 #include "convert/memory.hpp"
 #include "tessel/create.h"
 #include "tessel/memory.h"
@@ -32,7 +33,7 @@ void widenText(const char *bytes, std::size_t count, tsArray *characters);
 /// the status of `read`.
 template <class T, class Read>
 int readNumbers(tsArray *&slot, std::span<const std::size_t> dims, const Read &read) {
-    slot = tsCreateUninitNumericArray(dims.size(), dims.data(), memory<T>::hostClass);
+    slot = tsCreateUninitNumericArray(dims.size(), dims.data(), memory<T>.hostClass);
     return read(static_cast<T *>(tsGetData(slot)));
 }
 

@@ -21,14 +21,9 @@ bool isAttributeWrite(int id) {
     return id >= firstWriteID && id < firstWriteID + MemoryTypes::size;
 }
 
-struct Required {
-    tsClassID hostClass;
-    const char *description;
-};
-
-/// By the member's place in its family.
+/// What is wanted of the data, by the member's place in its family.
 constexpr auto required = []<class... T>(TypeList<T...>) {
-    return std::array{Required{memory<T>::hostClass, memory<T>::description}...};
+    return std::array{memory<T>...};
 }(MemoryTypes{});
 
 } // namespace

@@ -5,7 +5,9 @@
 // because the host's characters have 16 bits and the library's are bytes.
 #pragma once
 
+#include "call/operation.hpp"
 #include "convert/memory.hpp"
+#include "convert/number.hpp"
 #include "tessel/memory.h"
 
 #include <concepts>

@@ -69,15 +69,10 @@ constexpr std::array<Slot, slotCount> slots = [] {
     return filled;
 }();
 
-/// As names are compared. The letters that they are made of do not depend on the locale.
+/// As names are compared. The letters that they are made of need no function and no locale.
 char lowerCase(char c) {
-    if ((c >= 'a' && c <= 'z') || c == '_') {
-        return c;
-    }
-    if (c >= 'A' && c <= 'Z') {
-        return static_cast<char>(c - 'A' + 'a');
-    }
-    return static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    const bool capital = c >= 'A' && c <= 'Z';
+    return static_cast<char>(capital ? c - 'A' + 'a' : std::tolower(static_cast<unsigned char>(c)));
 }
 
 /// The row of a name in lower case; nullptr for any other name.

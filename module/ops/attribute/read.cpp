@@ -1,6 +1,6 @@
 // module/ops/attribute/read.cpp: reading attribute values.
 #include "call/catalogue.hpp"
-#include "convert/memory.hpp"
+#include "convert/families.hpp"
 #include "convert/read_buffer.hpp"
 #include "convert/scalar.hpp"
 #include "ops/attribute/handlers.hpp"
@@ -11,18 +11,6 @@
 #include <string>
 
 namespace tessel::netcdf {
-namespace {
-
-template <class T>
-using GetAtt = int(int ncid, int varid, const char *name, T *values);
-
-constexpr Family<GetAtt> getAtt = {11,
-                                   catalogue::getAttForeign,
-                                   {nc_get_att_double, nc_get_att_float, nc_get_att_int,
-                                    nc_get_att_short, nc_get_att_schar, nc_get_att_uchar,
-                                    nc_get_att_text}};
-
-} // namespace
 
 void readAttHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
                     const OperationEntry *entry) {

@@ -1,6 +1,7 @@
 // module/ops/attribute/write.cpp: writing attribute values.
 #include "call/catalogue.hpp"
-#include "convert/memory.hpp"
+#include "convert/families.hpp"
+#include "convert/number.hpp"
 #include "convert/scalar.hpp"
 #include "convert/write_data.hpp"
 #include "ops/attribute/handlers.hpp"
@@ -10,20 +11,6 @@
 #include <string>
 
 namespace tessel::netcdf {
-namespace {
-
-template <class T>
-using PutAtt = int(int ncid, int varid, const char *name, nc_type type, std::size_t count,
-                   const T *values);
-
-/// The numbers; text takes no external type, and has a handler of its own.
-constexpr Family<PutAtt, NumericMemoryTypes> putAtt = {59,
-                                                       catalogue::putAttForeign,
-                                                       {nc_put_att_double, nc_put_att_float,
-                                                        nc_put_att_int, nc_put_att_short,
-                                                        nc_put_att_schar, nc_put_att_uchar}};
-
-} // namespace
 
 void writeAttHandler(int /*nlhs*/, tsArray * /*plhs*/[], int nrhs, const tsArray *prhs[],
                      const OperationEntry *entry) {

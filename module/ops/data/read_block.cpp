@@ -1,39 +1,15 @@
 // module/ops/data/read_block.cpp: reading single elements and contiguous blocks.
 #include "call/catalogue.hpp"
+#include "convert/families.hpp"
 #include "convert/index_vector.hpp"
-#include "convert/memory.hpp"
 #include "convert/read_buffer.hpp"
 #include "convert/scalar.hpp"
 #include "ops/data/handlers.hpp"
 #include "ops/data/read_variable.hpp"
 
-#include <netcdf.h>
-
 #include <array>
 
 namespace tessel::netcdf {
-namespace {
-
-template <class T>
-using GetVar1 = int(int ncid, int varid, const std::size_t *index, T *value);
-
-constexpr Family<GetVar1> getVar1 = {25,
-                                     catalogue::getVar1Foreign,
-                                     {nc_get_var1_double, nc_get_var1_float, nc_get_var1_int,
-                                      nc_get_var1_short, nc_get_var1_schar, nc_get_var1_uchar,
-                                      nc_get_var1_text}};
-
-template <class T>
-using GetVara = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
-                    T *data);
-
-constexpr Family<GetVara> getVara = {32,
-                                     catalogue::getVaraForeign,
-                                     {nc_get_vara_double, nc_get_vara_float, nc_get_vara_int,
-                                      nc_get_vara_short, nc_get_vara_schar, nc_get_vara_uchar,
-                                      nc_get_vara_text}};
-
-} // namespace
 
 void readVar1Handler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
                      const OperationEntry *entry) {

@@ -1,28 +1,13 @@
 // module/ops/data/read_strided.cpp: reading strided blocks.
 #include "call/catalogue.hpp"
+#include "convert/families.hpp"
 #include "convert/index_vector.hpp"
-#include "convert/memory.hpp"
 #include "convert/read_buffer.hpp"
 #include "convert/scalar.hpp"
 #include "ops/data/handlers.hpp"
 #include "ops/data/read_variable.hpp"
 
-#include <netcdf.h>
-
 namespace tessel::netcdf {
-namespace {
-
-template <class T>
-using GetVars = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
-                    const std::ptrdiff_t *stride, T *data);
-
-constexpr Family<GetVars> getVars = {39,
-                                     catalogue::getVarsForeign,
-                                     {nc_get_vars_double, nc_get_vars_float, nc_get_vars_int,
-                                      nc_get_vars_short, nc_get_vars_schar, nc_get_vars_uchar,
-                                      nc_get_vars_text}};
-
-} // namespace
 
 void readVarsHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[],
                      const OperationEntry *entry) {

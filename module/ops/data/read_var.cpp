@@ -1,6 +1,6 @@
 // module/ops/data/read_var.cpp: reading whole variables.
 #include "call/catalogue.hpp"
-#include "convert/memory.hpp"
+#include "convert/families.hpp"
 #include "convert/read_buffer.hpp"
 #include "convert/scalar.hpp"
 #include "ops/data/handlers.hpp"
@@ -12,15 +12,6 @@
 
 namespace tessel::netcdf {
 namespace {
-
-template <class T>
-using GetVar = int(int ncid, int varid, T *data);
-
-constexpr Family<GetVar> getVar = {18,
-                                   catalogue::getVarForeign,
-                                   {nc_get_var_double, nc_get_var_float, nc_get_var_int,
-                                    nc_get_var_short, nc_get_var_schar, nc_get_var_uchar,
-                                    nc_get_var_text}};
 
 /// This family counts the characters it hands over in 32 bits, and none when that is negative.
 std::size_t countedIn32Bits(std::size_t n) {

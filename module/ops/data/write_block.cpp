@@ -1,37 +1,13 @@
 // module/ops/data/write_block.cpp: writing single elements and contiguous blocks.
 #include "call/catalogue.hpp"
+#include "convert/families.hpp"
 #include "convert/index_vector.hpp"
-#include "convert/memory.hpp"
 #include "convert/scalar.hpp"
 #include "convert/write_data.hpp"
 #include "ops/data/handlers.hpp"
 #include "ops/data/write_variable.hpp"
 
-#include <netcdf.h>
-
 namespace tessel::netcdf {
-namespace {
-
-template <class T>
-using PutVar1 = int(int ncid, int varid, const std::size_t *index, const T *value);
-
-constexpr Family<PutVar1> putVar1 = {87,
-                                     catalogue::putVar1Foreign,
-                                     {nc_put_var1_double, nc_put_var1_float, nc_put_var1_int,
-                                      nc_put_var1_short, nc_put_var1_schar, nc_put_var1_uchar,
-                                      nc_put_var1_text}};
-
-template <class T>
-using PutVara = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
-                    const T *data);
-
-constexpr Family<PutVara> putVara = {73,
-                                     catalogue::putVaraForeign,
-                                     {nc_put_vara_double, nc_put_vara_float, nc_put_vara_int,
-                                      nc_put_vara_short, nc_put_vara_schar, nc_put_vara_uchar,
-                                      nc_put_vara_text}};
-
-} // namespace
 
 void writeVar1Handler(int /*nlhs*/, tsArray * /*plhs*/[], int nrhs, const tsArray *prhs[],
                       const OperationEntry *entry) {

@@ -1,28 +1,13 @@
 // module/ops/data/write_strided.cpp: writing strided blocks.
 #include "call/catalogue.hpp"
+#include "convert/families.hpp"
 #include "convert/index_vector.hpp"
-#include "convert/memory.hpp"
 #include "convert/scalar.hpp"
 #include "convert/write_data.hpp"
 #include "ops/data/handlers.hpp"
 #include "ops/data/write_variable.hpp"
 
-#include <netcdf.h>
-
 namespace tessel::netcdf {
-namespace {
-
-template <class T>
-using PutVars = int(int ncid, int varid, const std::size_t *start, const std::size_t *count,
-                    const std::ptrdiff_t *stride, const T *data);
-
-constexpr Family<PutVars> putVars = {80,
-                                     catalogue::putVarsForeign,
-                                     {nc_put_vars_double, nc_put_vars_float, nc_put_vars_int,
-                                      nc_put_vars_short, nc_put_vars_schar, nc_put_vars_uchar,
-                                      nc_put_vars_text}};
-
-} // namespace
 
 void writeVarsHandler(int /*nlhs*/, tsArray * /*plhs*/[], int nrhs, const tsArray *prhs[],
                       const OperationEntry *entry) {

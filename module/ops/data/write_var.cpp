@@ -1,6 +1,6 @@
 // module/ops/data/write_var.cpp: writing whole variables.
 #include "call/catalogue.hpp"
-#include "convert/memory.hpp"
+#include "convert/families.hpp"
 #include "convert/scalar.hpp"
 #include "convert/write_data.hpp"
 #include "ops/data/handlers.hpp"
@@ -11,15 +11,6 @@
 
 namespace tessel::netcdf {
 namespace {
-
-template <class T>
-using PutVar = int(int ncid, int varid, const T *data);
-
-constexpr Family<PutVar> putVar = {66,
-                                   catalogue::putVarForeign,
-                                   {nc_put_var_double, nc_put_var_float, nc_put_var_int,
-                                    nc_put_var_short, nc_put_var_schar, nc_put_var_uchar,
-                                    nc_put_var_text}};
 
 /// The number of elements that the variable has now, with as many records as there are.
 std::size_t currentSize(int ncid, int varid) {
