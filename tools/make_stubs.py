@@ -23,11 +23,11 @@ from typing import Any
 class Module:
     def __init__(self, module: Module) -> None: ...
     def __call__(self, *arguments: Any) -> Any: ...
-    def guarded(self, remote: bool) -> Module: ...
     @property
     def file(self) -> Path: ...
 
 def find(name: bytes | str) -> Module: ...
+def guarded(module: Module, remote: bool) -> Module: ...
 def load_file(path: bytes | str) -> Module: ...
 '''
 
@@ -70,22 +70,19 @@ def explained(error: Error, module: object, arguments: tuple[object, ...]) -> Er
 '''
 
 NETCDF = '''
-import os
 from collections.abc import Sequence
 from typing import Any, NamedTuple, SupportsIndex
 
 import numpy
 from numpy.typing import NDArray
 
+from tessel import paths
 from tessel._runtime import Module
 
 Indices = SupportsIndex | Sequence[SupportsIndex] | NDArray[Any]
 Numbers = float | Sequence[Any]
 
 def path_of(ncid: int) -> str | None: ...
-
-class Opened(NamedTuple):
-    path: str
 
 '''
 

@@ -37,16 +37,19 @@ Datasets &datasets() {
 }
 
 /// The name without the blanks that the library skips at its beginning.
-std::string_view withoutBlanks(std::string_view path) {
+std::string withoutBlanks(std::string path) {
     const auto isBlank = [](char c) { return c > 0 && c <= ' '; };
-    const auto *const first = std::find_if_not(path.begin(), path.end(), isBlank);
-    return path.substr(static_cast<std::size_t>(first - path.begin()));
+    path.erase(path.begin(), std::find_if_not(path.begin(), path.end(), isBlank));
+    return path;
 }
 
 /// Whether the library would take a file name for an address: "scheme://...", behind any number of
 /// parameters in brackets. It drops what is not printable ASCII before it looks, and so does this.
 /// On the safe side: not every scheme is one that it knows.
 bool isAddress(std::string_view path) {
+    if (path.find(':') == std::string_view::npos) { // as nearly all have none
+        return false;
+    }
     std::string shown;
     std::copy_if(path.begin(), path.end(), std::back_inserter(shown),
                  [](char c) { return c > ' ' && c <= '~'; });
@@ -82,11 +85,11 @@ void lookAtName(std::string_view path, const GuardOptions &options) {
 }
 
 /// Whether the file is of a classic format.
-bool lookAtOpening(std::string_view path, int flags) {
+bool lookAtOpening(const std::string &path, int flags) {
     if ((flags & inMemory) != 0 && (flags & answeredBefore) == 0) {
         refuse(mode, "the flag 32768 (NC_INMEMORY) is set");
     }
-    const Header found = headerOf(std::string(path));
+    const Header found = headerOf(path);
     if (found.claim) {
         refuse(header, "the header of " + inQuotes(path) + " " + *found.claim);
     }
@@ -268,12 +271,12 @@ class Guard : public Watcher {
 
     void look(Inputs inputs, const Ask &ask) {
         if (kind == Kind::open || kind == Kind::create) {
-            const auto name = fileName(inputs[1]);
+            auto name = fileName(inputs[1]);
             if (!name) {
                 return;
             }
-            const std::string_view path = withoutBlanks(*name);
             lookAtName(*name, options);
+            path = withoutBlanks(*std::move(name));
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             classic =
@@ -304,10 +307,10 @@ class Guard : public Watcher {
         }
     }
 
-    void remember(Inputs inputs, const Results &results, const Error *error) const {
+    void remember(Inputs inputs, const Results &results, const Error *error) {
         if (kind == Kind::open || kind == Kind::create) {
             if (error == nullptr) {
-                rememberOpened(inputs, results);
+                rememberOpened(results);
             }
             return;
         }
@@ -329,10 +332,9 @@ class Guard : public Watcher {
         }
     }
 
-    void rememberOpened(Inputs inputs, const Results &results) const {
-        const auto name = fileName(inputs[1]);
+    void rememberOpened(const Results &results) {
         Dataset dataset;
-        dataset.path = withoutBlanks(name.value_or(""));
+        dataset.path = std::move(path);
         dataset.defining = kind == Kind::create;
         dataset.classic = classic;
         datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
@@ -375,7 +377,8 @@ class Guard : public Watcher {
 
     GuardOptions options;
     Kind kind = Kind::other;      // of the call in progress
-    bool classic = false;         // whether what it opens is
+    std::string path;             // of what it opens
+    bool classic = false;         // whether that is of a classic format
     std::uint64_t recordsEnd = 0; // where it ends, if it writes records
 };
 

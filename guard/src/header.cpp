@@ -11,6 +11,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <string_view>
 
 namespace tessel::guard {
@@ -35,12 +36,13 @@ struct Distrusted {
     std::string claim;
 };
 
+/// Reads a file from its beginning on. Most headers fit into the buffer: then opening, one read and
+/// closing are all that it costs, because the size of the file is only asked for behind that.
 class Reader {
   public:
     explicit Reader(const std::string &path) : file(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
-        struct stat status {};
-        if (file >= 0 && fstat(file, &status) == 0 && S_ISREG(status.st_mode)) {
-            fileSize = static_cast<std::uint64_t>(status.st_size);
+        if (file >= 0) {
+            fill();
         }
     }
     ~Reader() {
@@ -51,9 +53,9 @@ class Reader {
     Reader(const Reader &) = delete;
     Reader &operator=(const Reader &) = delete;
 
-    [[nodiscard]] std::uint64_t left() const noexcept {
-        return fileSize - std::min(position, fileSize);
-    }
+    [[nodiscard]] bool has(std::uint64_t bytes) { return bytes <= ahead() || bytes <= left(); }
+
+    [[nodiscard]] std::uint64_t left() { return size() - std::min(position, size()); }
 
     std::uint64_t number(std::size_t bytes) {
         std::uint64_t value = 0;
@@ -64,34 +66,50 @@ class Reader {
     }
 
     /// The library reads on behind the end of the file, where it finds zeros.
-    void skip(std::uint64_t bytes) noexcept { position += std::min(bytes, left()); }
+    void skip(std::uint64_t bytes) { position += has(bytes) ? bytes : left(); }
 
   private:
     unsigned char byte() {
-        if (left() == 0) {
-            return 0;
-        }
-        if (position < start || position >= start + buffered) {
+        if (ahead() == 0) {
+            if (left() == 0) {
+                return 0;
+            }
             fill();
+            if (buffered == 0) {
+                throw Ended{};
+            }
         }
         return buffer[static_cast<std::size_t>(position++ - start)];
     }
 
+    /// How much of the buffer is still to be read; what is skipped may lie behind it.
+    [[nodiscard]] std::uint64_t ahead() const noexcept {
+        return start + buffered - std::min(position, start + buffered);
+    }
+
     void fill() {
         const ssize_t got = pread(file, buffer.data(), buffer.size(), static_cast<off_t>(position));
-        if (got <= 0) {
-            throw Ended{};
-        }
         start = position;
-        buffered = static_cast<std::uint64_t>(got);
+        buffered = got > 0 ? static_cast<std::uint64_t>(got) : 0;
+    }
+
+    std::uint64_t size() {
+        if (!fileSize) {
+            struct stat status {};
+            if (fstat(file, &status) != 0 || !S_ISREG(status.st_mode)) {
+                throw Ended{};
+            }
+            fileSize = static_cast<std::uint64_t>(status.st_size);
+        }
+        return *fileSize;
     }
 
     int file;
-    std::uint64_t fileSize = 0;
+    std::optional<std::uint64_t> fileSize;
     std::uint64_t position = 0;
     std::uint64_t start = 0;
     std::uint64_t buffered = 0;
-    std::array<unsigned char, 8192> buffer; // of which `buffered` bytes have values
+    std::array<unsigned char, 4096> buffer; // of which `buffered` bytes have values
 };
 
 /// Walks through a header and looks at its claims.
@@ -111,12 +129,12 @@ class Walk {
         }
         found.classic = true;
         reader.skip(countSize); // the number of records
-        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.left() > 0; --n) {
+        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.has(1); --n) {
             name();
             reader.skip(countSize);
         }
         attributes();
-        for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.left() > 0; --n) {
+        for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.has(1); --n) {
             variable();
         }
     }
@@ -124,7 +142,7 @@ class Walk {
   private:
     std::uint64_t count(std::string_view what) {
         const std::uint64_t n = reader.number(countSize);
-        if (n > reader.left()) {
+        if (!reader.has(n)) {
             throw Distrusted{"has " + std::to_string(n) + " " + std::string(what) +
                              ", where the file has " + std::to_string(reader.left()) +
                              " bytes left"};
@@ -151,7 +169,7 @@ class Walk {
     }
 
     void attributes() {
-        for (std::uint64_t n = list(attributeList, "attributes"); n > 0 && reader.left() > 0; --n) {
+        for (std::uint64_t n = list(attributeList, "attributes"); n > 0 && reader.has(1); --n) {
             name();
             const std::uint64_t type = reader.number(4);
             const std::uint64_t values = count("values in an attribute");

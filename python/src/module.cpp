@@ -78,6 +78,10 @@ Module loadFile(std::string_view path) {
     return Module(std::filesystem::path(path));
 }
 
+Module guarded(const Module &module, bool remote) {
+    return module.watchedBy(netcdfGuard({.remote = remote}));
+}
+
 constexpr const char *callDoc = R"(Call an operation: its name, then its own arguments, by position.
 
 Returns None, the one result, or a tuple of several; raises tessel.Error. The docstring of the
@@ -94,14 +98,6 @@ PYBIND11_MODULE(_runtime, extension) {
                        "A loaded module. Call it with the name of an operation and its arguments.")
         .def(py::init<const Module &>(), "The same module.", py::arg("module"))
         .def("__call__", call, callDoc)
-        .def(
-            "guarded",
-            [](const Module &module, bool remote) {
-                return module.watchedBy(netcdfGuard({.remote = remote}));
-            },
-            "The same module, kept from the calls that the netCDF library does not survive, and\n"
-            "from addresses given as file names unless they are allowed.",
-            py::arg("remote"))
         .def("__repr__",
              [](const Module &module) {
                  return py::str("<tessel.Module {}>").format(module.file());
@@ -111,6 +107,10 @@ PYBIND11_MODULE(_runtime, extension) {
     using OthersRun = py::call_guard<py::gil_scoped_release>;
     extension.def("load_file", loadFile, "The module in a file.", py::arg("path"), OthersRun());
     extension.def("find", &Module::find, "The module of a name.", py::arg("name"), OthersRun());
+    extension.def("guarded", guarded,
+                  "The same module, kept from the calls that the netCDF library does not survive,\n"
+                  "and from addresses given as file names unless they are allowed.",
+                  py::arg("module"), py::arg("remote"));
 }
 
 } // namespace tessel::python

@@ -102,7 +102,7 @@ def load(module: str | os.PathLike[str], guard: Guard | None = None) -> Module:
     if chosen not in get_args(Guard):
         raise Error("TESSEL:python:badGuard", f"A guard is one of {', '.join(get_args(Guard))}, "
                                               f"and not {chosen!r}.")
-    return Netcdf(loaded if chosen == "off" else loaded.guarded(chosen == "remote"))
+    return Netcdf(loaded if chosen == "off" else _runtime.guarded(loaded, chosen == "remote"))
 
 
 def _load(module: str | os.PathLike[str]) -> Module:

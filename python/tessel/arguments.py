@@ -1,6 +1,9 @@
 # python/tessel/arguments.py: what the methods make of their arguments before the module sees them.
 """The rules by which a method's arguments become the host's.
 
+- A path may be a str, bytes or a path object, and is that very file: of bytes by the encoding of
+  file names, and with the blanks that it begins with. What the library would take for another file
+  is refused ("TESSEL:python:badPath").
 - A whole number (an id, a size, a code, a mode) may be anything that Python takes for an index:
   int, a NumPy integer of any width, an IntEnum.
 - A vector of positions, and a list of dimension ids, may be any iterable of whole numbers.
@@ -16,12 +19,19 @@ Everything else, bool included, goes on as it is, and the module judges it.
 from __future__ import annotations
 
 import operator
+import os
 from collections.abc import Iterable
 from typing import Any
 
 import numpy
 
+from tessel import paths
 from tessel.errors import Error
+
+
+def file_path(value: Any) -> Any:
+    """The text of a path; else the value itself."""
+    return paths.given(value) if isinstance(value, (str, bytes, os.PathLike)) else value
 
 
 def integer(value: Any) -> Any:

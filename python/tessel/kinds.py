@@ -14,8 +14,9 @@ IDENTIFIER = Kind(
 NAME = Kind(
     "str", "str", "char", "{name}",
     (("TESSEL:netcdf:argumentWasNotChar", "is no str"),))
-PATH_NAME = Kind("str | os.PathLike[str]", "str or path object", NAME.host, NAME.conversion,
-                 NAME.errors)
+PATH_NAME = Kind(
+    "paths.Path", "str, bytes or path object", NAME.host, "file_path({name})",
+    (*NAME.errors, ("TESSEL:python:badPath", "has a NUL in it, or is not UTF-8")))
 MODE = Kind(
     "str | SupportsIndex", "str or int",
     "char; or double or int32, of which the first element counts",

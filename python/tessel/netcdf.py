@@ -26,11 +26,10 @@ The call form, `nc("open", "new.nc", "NOWRITE")`, gives the host's arrays as the
 
 from __future__ import annotations
 
-import os
 from collections import namedtuple
 from collections.abc import Sequence
 from types import FunctionType
-from typing import Any, NamedTuple, SupportsIndex, Union
+from typing import Any, SupportsIndex, Union
 
 import numpy
 from numpy import ndarray
@@ -38,7 +37,7 @@ from numpy.typing import NDArray
 
 from tessel import errors, paths
 from tessel._runtime import Module
-from tessel.arguments import identifiers, integer, numbers, vector
+from tessel.arguments import file_path, identifiers, integer, numbers, vector
 from tessel.operation import Operation
 from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS
 
@@ -49,46 +48,44 @@ Numbers = Union[float, Sequence[Any]]
 """Data as Python's own numbers."""
 
 
-class Opened(NamedTuple):
-    """What is remembered of an open dataset, for the notes of errors."""
-
-    path: str
-    """From the root on, so that it leads there from any folder."""
-
-
-# By id, for the whole process, as the ids are. An id that others have closed and opened again may
-# lead to the path that it had here.
-_opened: dict[int, Opened] = {}
+# The path of each open dataset, as a tuple of its own, for the notes of errors. By id, for the whole
+# process, as the ids are: an id that others have closed and opened again may lead to the path that
+# it had here. From the root on, so that it leads there from any folder, and for `path_of` to tidy.
+_opened: dict[int, tuple[str]] = {}
 
 
 def path_of(ncid: int) -> str | None:
     """The file that an open dataset was opened from, or made as, here."""
     found = _opened.get(ncid)
-    return found.path if found else None
+    return paths.absolute(found[0]) if found else None
 
 
 def _remember(path: Any, result: Any) -> Any:
     """The result of an operation that opens."""
-    ncid = result if isinstance(result, int) else result.ncid
-    _opened[ncid] = Opened(_text(path))
+    ncid = result if type(result) is int else result.ncid
+    _opened[ncid] = (_place(path),)
     return result
 
 
-def _known(ncid: Any) -> Opened | None:
-    """What is remembered of a dataset, whatever its id is given as."""
-    return _opened.get(_id(ncid))
+def _place(path: Any) -> str:
+    try:
+        text = paths.taken(path)
+    except TypeError:  # an array of characters
+        return repr(path)
+    return text if text[:1] == "/" else paths.absolute(text)
 
 
-def _forget(ncid: Any, known: Opened | None, result: None) -> None:
+def _known(ncid: Any) -> tuple[int, tuple[str] | None]:
+    """A dataset's id, whatever it is given as, and what is remembered of it."""
+    number = ncid if type(ncid) is int else _id(ncid)
+    return number, _opened.get(number)
+
+
+def _forget(before: tuple[int, tuple[str] | None], result: None) -> None:
     """For an operation that ended a dataset, of which this was known before."""
-    if known is not None and _known(ncid) is known:  # not another one of the same id by now
-        _opened.pop(_id(ncid), None)
-
-
-def _text(path: Any) -> str:
-    if isinstance(path, (str, bytes, os.PathLike)):
-        return paths.absolute(os.fsdecode(path))
-    return repr(path)
+    ncid, known = before
+    if known is not None and _opened.get(ncid) is known:  # not another one of the same id by now
+        _opened.pop(ncid, None)
 
 
 def _constant(value: ndarray[Any, Any]) -> int | float:
@@ -105,16 +102,16 @@ class Netcdf(Module):
     def __call__(self, *arguments: Any) -> Any:
         """Call an operation by name: the host's arrays in and out, unchanged."""
         name = arguments[0] if arguments else None
-        if type(name) is not str or name.lower() not in _LIVES:
+        operation = _LIVES.get(name.lower()) if type(name) is str else None
+        if operation is None:
             return _call(self, *arguments)
-        if _LIVES[name.lower()].opens:
+        if operation.opens:
             result = _call(self, *arguments)
-            ncid = result[-1] if isinstance(result, tuple) else result
+            ncid = result[-1] if type(result) is tuple else result
             _remember(arguments[1], int(ncid.item()))
             return result
-        ncid = arguments[1] if len(arguments) > 1 else None
-        _forget(ncid, _known(ncid), _call(self, *arguments))
-        return None
+        before = _known(arguments[1]) if len(arguments) > 1 else (-1, None)
+        return _forget(before, _call(self, *arguments))
 
 
 def _id(value: Any) -> int:
@@ -133,30 +130,35 @@ _SCOPE: dict[str, Any] = {
     "call": _call, "constant": _constant, "Error": errors.Error, "explained": errors.explained,
     "dtypes": {name: numpy.dtype(name) for name in
                ("float64", "float32", "int32", "int16", "int8", "uint8")},
-    "forget": _forget, "identifiers": identifiers, "integer": integer, "known": _known,
-    "ndarray": ndarray, "numbers": numbers, "numpy": numpy, "os": os, "remember": _remember,
+    "file_path": file_path, "forget": _forget, "identifiers": identifiers, "integer": integer, "known": _known,
+    "ndarray": ndarray, "numbers": numbers, "numpy": numpy, "paths": paths,
+    "remember": _remember,
     "vector": vector,
 }
 
 
 def _source(operation: Operation) -> str:
     """The method as source text."""
-    given = "".join(f", {each.kind.conversion.format(name=each.name)}"
-                    for each in operation.arguments)
-    value = f"call(self, '{operation.short}'{given})"
+    made = {each.name: each.kind.conversion.format(name=each.name)
+            for each in operation.arguments}
     lines = []
+    if operation.opens:  # what is remembered is what was called
+        lines.append(f"    path = {made['path']}")
+        made["path"] = "path"
+    given = "".join(f", {each}" for each in made.values())
+    value = f"call(self, '{operation.short}'{given})"
     if len(operation.results) > 1:
         names = ", ".join(f"r{i}" for i in range(len(operation.results)))
         lines.append(f"    {names} = {value}")
-        made = ", ".join(each.kind.conversion.format(value=f"r{i}")
-                         for i, each in enumerate(operation.results))
-        value = f"{operation.several}({made})"
+        several = ", ".join(each.kind.conversion.format(value=f"r{i}")
+                            for i, each in enumerate(operation.results))
+        value = f"{operation.several}({several})"
     elif operation.results:
         value = operation.results[0].kind.conversion.format(value=value)
     if operation.opens:
         value = f"remember(path, {value})"
     elif operation.ends:
-        value = f"forget(ncid, known(ncid), {value})"
+        value = f"forget(known(ncid), {value})"
     lines.append(f"    return {value}")
     if any(each.kind.refuses for each in operation.arguments):
         names = "".join(f", {each.name}" for each in operation.arguments)

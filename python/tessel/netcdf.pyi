@@ -1,21 +1,18 @@
 # python/tessel/netcdf.pyi: written by tools/make_stubs.py; change the tables instead.
 
-import os
 from collections.abc import Sequence
 from typing import Any, NamedTuple, SupportsIndex
 
 import numpy
 from numpy.typing import NDArray
 
+from tessel import paths
 from tessel._runtime import Module
 
 Indices = SupportsIndex | Sequence[SupportsIndex] | NDArray[Any]
 Numbers = float | Sequence[Any]
 
 def path_of(ncid: int) -> str | None: ...
-
-class Opened(NamedTuple):
-    path: str
 
 class CreateTuned(NamedTuple):
     chunksizehint: int
@@ -69,20 +66,20 @@ class Netcdf(Module):
     ) -> None: ...
     def _create(
         self,
-        path: str | os.PathLike[str],
+        path: paths.Path,
         cmode: str | SupportsIndex,
         initialsz: SupportsIndex,
         chunksizehint: SupportsIndex,
     ) -> CreateTuned: ...
     def nc__create(
         self,
-        path: str | os.PathLike[str],
+        path: paths.Path,
         cmode: str | SupportsIndex,
         initialsz: SupportsIndex,
         chunksizehint: SupportsIndex,
     ) -> CreateTuned: ...
-    def create(self, path: str | os.PathLike[str], cmode: str | SupportsIndex) -> int: ...
-    def nc_create(self, path: str | os.PathLike[str], cmode: str | SupportsIndex) -> int: ...
+    def create(self, path: paths.Path, cmode: str | SupportsIndex) -> int: ...
+    def nc_create(self, path: paths.Path, cmode: str | SupportsIndex) -> int: ...
     def def_dim(self, ncid: SupportsIndex, name: str, len: SupportsIndex) -> int: ...
     def nc_def_dim(self, ncid: SupportsIndex, name: str, len: SupportsIndex) -> int: ...
     def def_var(
@@ -571,18 +568,18 @@ class Netcdf(Module):
     def parameter(self, name: str) -> Any: ...
     def _open(
         self,
-        path: str | os.PathLike[str],
+        path: paths.Path,
         mode: str | SupportsIndex,
         chunksizehint: SupportsIndex,
     ) -> OpenTuned: ...
     def nc__open(
         self,
-        path: str | os.PathLike[str],
+        path: paths.Path,
         mode: str | SupportsIndex,
         chunksizehint: SupportsIndex,
     ) -> OpenTuned: ...
-    def open(self, path: str | os.PathLike[str], mode: str | SupportsIndex) -> int: ...
-    def nc_open(self, path: str | os.PathLike[str], mode: str | SupportsIndex) -> int: ...
+    def open(self, path: paths.Path, mode: str | SupportsIndex) -> int: ...
+    def nc_open(self, path: paths.Path, mode: str | SupportsIndex) -> int: ...
     def put_att_double(
         self,
         ncid: SupportsIndex,

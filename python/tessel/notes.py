@@ -149,13 +149,12 @@ def shortened(value: Any) -> str:
 
 def _file(error: Error, path: Any) -> Iterator[str]:
     """About an operation that opens or creates."""
-    if not isinstance(path, (str, bytes, os.PathLike)):
+    if not isinstance(path, (str, bytes, os.PathLike)) or error.word == "badPath":
         return
-    given = os.fspath(path)
     if isinstance(error, OSError):
-        error.filename = given
-    absolute = paths.shown(paths.absolute(os.fsdecode(given)))
-    if os.path.isabs(absolute) and "\0" not in absolute:
+        error.filename = os.fspath(path)
+    absolute = paths.shown(paths.absolute(paths.taken(path)))
+    if os.path.isabs(absolute):
         error.path = absolute
         yield f"file: {absolute}"
         yield from instead(error)

@@ -14,7 +14,10 @@ from typing import Any, Union
 
 from tessel.errors import Error
 
-Path = Union[str, bytes, "os.PathLike[str]", "os.PathLike[bytes]"]
+Path = Union[str, bytes, os.PathLike[str], os.PathLike[bytes]]
+
+_BLANKS = "".join(map(chr, range(1, 33)))
+"""What the library skips at the beginning of a path."""
 
 _called: dict[str, str] = {}
 """Files that have a name for the time being only, and the name that they are to have."""
@@ -36,13 +39,22 @@ def given(path: Any) -> str:
     except UnicodeEncodeError:
         raise Error("TESSEL:python:badPath", "The path is not UTF-8, and the module takes no "
                     f"other: {text!r}", path=absolute(text)) from None
-    return text if text[:1] > " " or not text else f"./{text}"  # the library skips blanks there
+    return f"./{text}" if text[:1] in _BLANKS and text else text
+
+
+def taken(path: Any) -> str:
+    """The file that the library takes for a path that a call of the module is given: bytes are a
+    character each there, blanks at the beginning are skipped, and a NUL is the end."""
+    text: str | bytes = os.fspath(path)
+    if isinstance(text, bytes):
+        text = text.decode("latin-1")
+    return text.partition("\0")[0].lstrip(_BLANKS)
 
 
 def absolute(path: str, folder: str | None = None) -> str:
     """Where a path leads from a folder, the current one unless given; what is no path of a file
     stays as it is."""
-    if "\0" in path or "://" in path:
+    if not path or "\0" in path or "://" in path:
         return path
     try:
         return os.path.abspath(path if folder is None else os.path.join(folder, path))

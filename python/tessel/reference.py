@@ -56,6 +56,14 @@ _CAUSES = {
     "getVarsDimids": "the library cannot say which dimensions the variable has",
 }
 
+# What methods refuse before the module is called.
+_OWN = {
+    "TESSEL:python:badPath": "A path has no NUL in it. / The path is not UTF-8, and the module "
+                             "takes no other: <the path>",
+    "TESSEL:python:notExact": "<the number> is not exact as <the dtype>; pass an array of that "
+                              "dtype to have it rounded.",
+}
+
 EVERY_CALL = ("tooFewArguments", "firstArgNotChar", "invalidOperation")
 """The rows that a call raises before it has found its operation."""
 
@@ -170,10 +178,7 @@ def page_of(operation: Operation) -> Page:
         tag = identifier[:-len(word_of(identifier))]
         found = messages.get(identifier) or [each.message for each in statuses
                                              if each.identifier == tag]
-        if identifier == "TESSEL:python:notExact":
-            found = ["<the number> is not exact as <the dtype>; pass an array of that dtype to "
-                     "have it rounded."]
-        raised.append(Raised(identifier, " / ".join(found), cause))
+        raised.append(Raised(identifier, _OWN.get(identifier) or " / ".join(found), cause))
     return Page(tuple(raised), tuple(statuses), tuple(guards), tuple(_refused(operation)))
 
 

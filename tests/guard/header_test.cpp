@@ -34,6 +34,12 @@ std::string attributeNamed(const std::string &name, std::uint32_t type, std::uin
            padding + words({type, values}) + room + nothing;
 }
 
+/// Variables behind an attribute with so many bytes, more than are looked at at once.
+std::string variablesBehind(std::uint32_t bytes, std::uint32_t variables) {
+    return classic + nothing + words({12, 1, 4}) + "long" + words({1, bytes}) +
+           std::string(bytes, 'a') + words({11, variables}) + room;
+}
+
 struct Claim {
     const char *name;
     std::string bytes;
@@ -60,6 +66,12 @@ const std::vector<Claim> claims = {
      "has 2147483647 attributes"},
     {"MoreVariablesThanBytes", classic + nothing + nothing + words({11, 0x7FFFFFFF}) + room,
      refused, "has 2147483647 variables"},
+    {"OneVariableMoreThanBytesFarBehind", variablesBehind(10000, 601), refused,
+     "has 601 variables, where the file has 600 bytes left"},
+    {"AsManyVariablesAsBytesFarBehind", variablesBehind(10000, 600),
+     "TESSEL:netcdf:open:invalidArgument"}, // the variables are zeros, of no type
+    {"OneVariableMoreThanBytesBehindTheBuffer", variablesBehind(4056, 601), refused,
+     "has 601 variables, where the file has 600 bytes left"},
     {"MoreValuesThanBytes", attributeNamed("long", 6, 0x10000000), refused,
      "has 268435456 values in an attribute"},
     {"NameOf256", attributeNamed(std::string(256, 'n'), 1, 4), opens},

@@ -399,13 +399,38 @@ def test_paths_stay_true_in_another_folder(ncid: int, tmp_path: Path,
     assert error.path == f"{tmp_path}/sample.nc"
 
 
+@pytest.mark.parametrize("given, taken", [
+    (" \t\x01sample.nc", "sample.nc"), ("sample.nc\0more", "sample.nc"),
+    (b"  gr\xf6\xdfe.nc", "größe.nc"), (Path(" größe.nc"), "größe.nc")])
+def test_the_call_form_tells_the_file_that_the_library_takes(
+        ncid: int, given: typing.Any, taken: str) -> None:
+    """It skips blanks and ends at a NUL, and a byte is a character."""
+    error = failure(nc, "open", given, 64)
+    nc.close(ncid)
+    if taken != "sample.nc":
+        os.rename("sample.nc", taken)
+        assert failure(nc, "create", given, "NOCLOBBER").path == f"{Path.cwd()}/{taken}"
+    opened = int(nc("open", given, "NOWRITE").item())
+    assert netcdf.path_of(opened) == f"{Path.cwd()}/{taken}"
+    nc.close(opened)
+    assert error.path == f"{Path.cwd()}/{taken}"
+
+
+@pytest.mark.parametrize("path", ["", " ", b""])
+def test_no_path_is_no_file(path: typing.Any) -> None:
+    """And least of all the current folder."""
+    error = failure(nc, "open", path, "NOWRITE")
+    assert error.path is None and len(note_of(error)) == 1
+    assert failure(tessel.read, "", "v").path is None
+
+
 def test_a_folder_that_is_gone(tmp_path: Path, monkeypatch: pytest.MonkeyPatch) -> None:
     """There is no path from the root on, and no other error because of that."""
     gone = tmp_path / "gone"
     gone.mkdir()
     monkeypatch.chdir(gone)
     gone.rmdir()
-    assert netcdf._text("sample.nc") == "sample.nc"
+    assert netcdf._place("sample.nc") == "sample.nc"
     assert failure(nc.open, "sample.nc", "NOWRITE").word == "noSuchFileOrDirectory"
 
 
@@ -442,12 +467,13 @@ def test_names_from_files_cannot_steer_a_terminal(ncid: int) -> None:
 
 def test_an_id_used_again_keeps_its_new_path(monkeypatch: pytest.MonkeyPatch) -> None:
     """Another thread may open a file between the end of a call of close and its record."""
-    first = netcdf.Opened("first.nc")
-    monkeypatch.setitem(netcdf._opened, 7, first)
+    monkeypatch.setitem(netcdf._opened, 7, ("/the-same.nc",))
     known = netcdf._known(7)
-    netcdf._opened[7] = netcdf.Opened("second.nc")
-    netcdf._forget(7, known, None)
-    assert netcdf.path_of(7) == "second.nc"
+    again = netcdf._remember("/the-same.nc", 7)
+    netcdf._forget(known, None)
+    assert netcdf.path_of(again) == "/the-same.nc"
+    netcdf._forget(netcdf._known(7.0), None)
+    assert netcdf.path_of(7) is None
 
 
 @pytest.mark.parametrize("value, shown", [

@@ -4,6 +4,7 @@ import copy
 import doctest
 import inspect
 import itertools
+import os
 import re
 import subprocess
 import sys
@@ -446,11 +447,52 @@ def test_paths(ncid: int) -> None:
     nc.close(nc.nc_open("päth.nc", "NOWRITE"))
 
 
+OPENINGS = [
+    lambda path: nc.create(path, "CLOBBER"), lambda path: nc._create(path, 0, 0, 0).ncid,
+    lambda path: nc.open(path, "NOWRITE"), lambda path: nc._open(path, 0, 0).ncid]
+
+
+@pytest.mark.parametrize("opening", OPENINGS)
+@pytest.mark.parametrize("name", ["größe.nc", " blank.nc", "\n\t.nc"])
+@pytest.mark.parametrize("form", [str, os.fsencode, Path, lambda name: Entry(os.fsencode(name))])
+def test_a_path_is_that_very_file(form: typing.Callable[[str], typing.Any], name: str,
+                                  opening: typing.Callable[[typing.Any], int]) -> None:
+    """The library would skip the blanks at its beginning, and bytes are characters for the host."""
+    nc.close(nc.create("other.nc", 0))
+    os.rename("other.nc", name)
+    opened = opening(form(name))
+    assert netcdf.path_of(opened) == f"{Path.cwd()}/{name}"
+    nc.close(opened)
+    assert os.listdir() == [name]
+
+
+class Entry:
+    """A path object that gives bytes."""
+
+    def __init__(self, name: bytes) -> None:
+        self.name = name
+
+    def __fspath__(self) -> bytes:
+        return self.name
+
+
+@pytest.mark.parametrize("opening", OPENINGS)
+@pytest.mark.parametrize("path", [b"\xff.nc", "\udcff.nc", Path("\udcff.nc"), "a\0.nc", b"a\0"])
+def test_a_path_that_would_be_another_file(path: typing.Any,
+                                           opening: typing.Callable[[typing.Any], int]) -> None:
+    with pytest.raises(ValueError) as caught:
+        opening(path)
+    error = typing.cast(tessel.Error, caught.value)
+    assert error.identifier == "TESSEL:python:badPath"
+    assert error.operation in ("create", "_create", "open", "_open")
+    assert len(error.__notes__[0].splitlines()) == 1 and not os.listdir()
+
+
 def test_completion() -> None:
     names = set(dir(nc))
     assert {name for _, name in NAMES} <= names
     public = {name for name in names if not name.startswith("__")}
-    assert public - {name for _, name in NAMES} == {"file", "guarded"}
+    assert public - {name for _, name in NAMES} == {"file"}
 
 
 def test_members_do_not_share_anything() -> None:
