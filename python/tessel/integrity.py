@@ -17,6 +17,7 @@ import math
 import os
 from collections.abc import Iterator
 from dataclasses import dataclass
+from typing import NamedTuple
 
 import tessel
 from tessel import notes, paths
@@ -86,6 +87,20 @@ def check(path: paths.Path) -> int | None:
 
 def verify(dataset: Dataset) -> int | None:
     """The same for an open file."""
+    found = extent(dataset)
+    return found.least if found else None
+
+
+class Extent(NamedTuple):
+    """How many bytes a file needs."""
+
+    header: int
+    least: int
+    """The least size that it must have, with all values."""
+
+
+def extent(dataset: Dataset) -> Extent | None:
+    """The same, with the length of the header."""
     form = _form(dataset.place)
     if form is None:
         return None
@@ -97,7 +112,7 @@ def verify(dataset: Dataset) -> int | None:
         raise tessel.Error("TESSEL:python:fileTooShort",
                            f"The file is cut off: it has {there} bytes, and what is in it needs "
                            f"{least}.", path=dataset.place)
-    return least
+    return Extent(header.length, least)
 
 
 def _padded(length: int) -> int:

@@ -219,7 +219,7 @@ def test_the_error_of_the_operation_comes_through(path: str, way: str) -> None:
     array.costs = WAYS[way] or array.costs
     array.shape = (12, 4, 5)
     file = array._manager.acquire()
-    file.varids["records_int"] = file.place_of("records_int").varid
+    file.varids["records_int", False] = file.place_of("records_int").varid
     with pytest.raises(IndexError) as error:
         planning.read(array, (slice(None, None, 3), slice(None, None, 2), slice(None, None, 3)))
     assert isinstance(error.value, tessel.Error)

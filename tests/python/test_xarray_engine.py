@@ -21,7 +21,7 @@ import tessel
 import xarray
 from made_files import EVERYTHING, generate, open_descriptors
 from scipy.io import netcdf_file
-from tessel.xarray import TesselBackendEntrypoint, opening, planning
+from tessel.xarray import TesselBackendEntrypoint, TesselDataStore, opening, planning
 from tessel.xarray.opening import OpenFile
 from xarray.backends.plugins import guess_engine, list_engines
 
@@ -351,6 +351,64 @@ def test_a_file_that_grew(cubes: list[str]) -> None:
     dataset.close()
     assert dataset.v[4, 0, 0] == 4800 and dataset.v.shape == (5, 30, 40)
     dataset.close()
+
+
+LAYOUTS = {  # other places of the same variables, and the same places of others
+    "another order": "variables: float other(y); float v(y); float y(y);",
+    "more before": "variables: float more(y); float y(y); float v(y); float other(y);",
+    "another length": "variables: float y(y); float v(z); float other(y);",
+    "another type": "variables: float y(y); int v(y); float other(y);",
+    "other names": "variables: float y(y); float other(y); float v(y);",
+    "another meaning": "variables: float y(y); float v(y); float other(y); v:scale_factor = 2.f;",
+}
+
+
+@pytest.mark.parametrize("read_before", [False, True])
+@pytest.mark.parametrize("layout", LAYOUTS)
+def test_a_file_that_is_overwritten_in_place(tmp_path: Path, layout: str,
+                                             read_before: bool) -> None:
+    """What is where the values were is never taken for them."""
+    dimensions = "dimensions: y = 4; z = 2;"
+    path = generate(tmp_path / "place.nc", dimensions + "variables: float y(y); float v(y); "
+                    "float other(y); data: y = 1, 2, 3, 4; v = 5, 6, 7, 8; other = 9, 9, 9, 9;")
+    other = generate(tmp_path / "other.nc", dimensions + LAYOUTS[layout])
+    store = TesselDataStore.open(path)
+    variables = store.get_variables()
+    if read_before:
+        assert variables["v"][1:3].values.tolist() == [6, 7]
+    with open(path, "r+b") as file:
+        file.write(Path(other).read_bytes().ljust(os.path.getsize(path), b"\0"))
+    for name in ("v", "y", "v", "y"):  # read with the other data, and at once, as coordinates are
+        with pytest.raises(OSError, match="The file was overwritten while it was open") as error:
+            variables[name][:].values
+        assert error.value.word == "fileChanged" and error.value.path == path
+    store.close()
+
+
+def test_a_file_that_is_overwritten_while_it_is_opened(tmp_path: Path,
+                                                       monkeypatch: pytest.MonkeyPatch) -> None:
+    """Between the first look of the library and the second, and between ours and the library's."""
+    path = generate(tmp_path / "place.nc", "dimensions: y = 4; variables: float y(y); float v(y); "
+                    "data: y = 1, 2, 3, 4; v = 5, 6, 7, 8;")
+    first = Path(path).read_bytes()
+    second = Path(generate(tmp_path / "other.nc", "dimensions: y = 4; variables: float v(y); "
+                           "float y(y); data: y = 1, 2, 3, 4; v = 5, 6, 7, 8;")).read_bytes()
+    original = OpenFile._opened
+    for turn in (1, 2):
+        Path(path).write_bytes(first)
+        turns = iter(range(1, 4))
+
+        def overwrite_and_open(self: OpenFile, mode: str | int, hint: int) -> int:
+            if next(turns) == turn:
+                with open(path, "r+b") as file:
+                    file.write(second)
+            return original(self, mode, hint)
+
+        monkeypatch.setattr(OpenFile, "_opened", overwrite_and_open)
+        with TesselDataStore.open(path) as store:
+            for _ in range(2):
+                with pytest.raises(OSError, match="The file was overwritten while it was open"):
+                    store.get_variables()["v"][:].values
 
 
 SPARSE_COLUMN = """

@@ -31,6 +31,7 @@ class LazyArray(BackendArray):
         self._type = variable.type
         # xarray reads these when it opens the dataset, and keeps them.
         self._once = variable.is_coordinate
+        self._place = self._name, self._once
         self._in_records = any(each.unlimited for each in variable.dimensions[:1])
         self.shape = variable.shape
         self.dtype = np.dtype(DTYPES[str(variable.type.member)])
@@ -63,7 +64,7 @@ class LazyArray(BackendArray):
         while True:
             file = self._file or self._manager.acquire()
             try:
-                varid = file.varids.get(self._name)
+                varid = file.varids.get(self._place)
                 if varid is None:
                     varid = self._varid(file)
                 values = file.read_with(f"{family}_{self._type.member}", varid, *places,
@@ -79,14 +80,14 @@ class LazyArray(BackendArray):
     def _varid(self, file: OpenFile) -> int:
         """The number of the variable, which must be what it was: since the dataset was opened, the
         file may have been opened again, and be another one. More records do not matter."""
-        place = file.place_of(self._name)
+        place = file.place_of(*self._place)
         shape = place.shape
         if self._in_records and shape[:1] >= self.shape[:1]:
             shape = self.shape[:1] + shape[1:]
         if place.xtype != self._type.number or shape != self.shape:
             raise refusal("fileChanged", f"The variable {self._name} is not any more what it was "
                           "when the dataset was opened.", file.place)
-        file.varids[self._name] = place.varid
+        file.varids[self._place] = place.varid
         return place.varid
 
 

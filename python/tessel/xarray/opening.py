@@ -13,6 +13,9 @@ and from behind the end of a file that is not mapped the library reads zeros. So
 - while a mapped file is being read, what is gone is zeros instead of the end of the process
   (`tessel._faults`), and such a read is an error, as is every one after it;
 - after each read, the file must still be as long as it has to be.
+
+A file that is overwritten in place is another trap: the library remembers where the values were. So
+its header must be, after each read, what it was when it was opened.
 """
 
 from __future__ import annotations
@@ -24,6 +27,10 @@ from typing import Any, NamedTuple
 import tessel
 from tessel import _faults, integrity
 from tessel.dataset import Dataset
+
+_LAYOUT_BEGIN, _LAYOUT_END = 8, 2**16
+"""The bytes of a file that may not change while it is open: those of its header, without the number of
+records at its beginning. Of a header that is longer, the rest is not compared."""
 
 FORMATS = (b"CDF\1", b"CDF\2")
 """How the files begin that the engine opens: the classic format and the one of 64-bit offsets."""
@@ -70,15 +77,20 @@ class OpenFile(Dataset):
         self._ids: list[int] = []
         self._data: int | None = None
         self._gone = False
-        self.varids: dict[str, int] = {}
-        """The numbers of the variables that were found to be what they are expected to be."""
+        self.varids: dict[tuple[str, bool], int] = {}
+        """The numbers of the variables that were found to be what they are expected to be, by name
+        and by whether they are read only once."""
 
         # A descriptor of our own: the path can lead to another file by now.
         self._descriptor = _descriptor_of(path)
         try:
             self.mapped = mapped
+            self._layout_bytes = _LAYOUT_END - _LAYOUT_BEGIN
+            self._layout = self._layout_now()  # before the library looks at it
             super().__init__(path)
-            self._least = integrity.verify(self) or 0
+            header, self._least = integrity.extent(self) or (0, 0)
+            self._layout = self._layout[:max(header - _LAYOUT_BEGIN, 0)]
+            self._layout_bytes = len(self._layout)
             if not self._is_at_its_path():
                 raise self._error("fileChanged", "The file was replaced while it was being opened.")
         except BaseException:
@@ -108,28 +120,37 @@ class OpenFile(Dataset):
 
     @property
     def _id_for_data(self) -> int:
-        """The library's number for reading the data, from the first time that they are read."""
-        if self._data is None and self.mapped:
+        """The library's number for reading the data, from the first time that they are read. It
+        finds the values where the header of that time says."""
+        if self._data is None:
+            data = self._opened_for_data()
+            self._want_all()  # it may have been another file since the last look
+            self._data = data
+        return self._data
+
+    def _opened_for_data(self) -> int:
+        if self.mapped:
             try:
-                self._data = self._opened(MAPPED, LARGE_BUFFER)
+                return self._opened(MAPPED, LARGE_BUFFER)
             except tessel.Error:
                 self.mapped = False  # the file system, or what memory there is, does not have it
-        if self._data is None:
-            self._data = self._opened("NOWRITE", LARGE_BUFFER)
-        return self._data
+        return self._opened("NOWRITE", LARGE_BUFFER)
 
     def _error(self, word: str, message: str) -> tessel.Error:
         return refusal(word, message, self.place)
 
+    def _id(self, once: bool) -> int:
+        return self.ncid if once else self._id_for_data
+
     def read_with(self, operation: str, varid: int, *places: list[int], once: bool = False) -> Any:
         """What an operation that reads gives. The places are in the library's order. `once` is for
-        what is not going to be read again."""
+        what is not going to be read again; the number is that of `place_of` for the same."""
         method = getattr(self._netcdf, operation)
         with self._lock:
             if not self._ids:
                 raise FileWasClosed
             self._want_all()  # a cut that was there before costs neither time nor memory
-            ncid = self.ncid if once else self._id_for_data
+            ncid = self._id(once)
             in_host_order = [each[::-1] for each in places]
             _faults.begin()
             try:
@@ -139,20 +160,27 @@ class OpenFile(Dataset):
             self._want_all()
             return values
 
+    def _layout_now(self) -> bytes:
+        return os.pread(self._descriptor, self._layout_bytes, _LAYOUT_BEGIN)
+
     def _want_all(self) -> None:
-        """Raises the error for a file that became shorter."""
+        """Raises the error for a file that became shorter, or another one."""
         self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
         if self._gone:
             raise self._error("fileTooShort", "The file became shorter while it was open.")
+        if self._layout_now() != self._layout:
+            raise self._error("fileChanged", "The file was overwritten while it was open.")
 
-    def place_of(self, name: str) -> Place:
-        """Where a variable is."""
+    def place_of(self, name: str, once: bool = False) -> Place:
+        """Where a variable is, for whoever reads it once, or more often."""
         with self._lock:
             if not self._ids:
                 raise FileWasClosed
-            varid = self._netcdf.inq_varid(self.ncid, name)
-            found = self._netcdf.inq_var(self.ncid, varid)
-            return Place(varid, found.xtype, tuple(self._netcdf.inq_dim(self.ncid, each).len
+            self._want_all()
+            ncid = self._id(once)
+            varid = self._netcdf.inq_varid(ncid, name)
+            found = self._netcdf.inq_var(ncid, varid)
+            return Place(varid, found.xtype, tuple(self._netcdf.inq_dim(ncid, each).len
                                                    for each in reversed(found.dimids)))
 
     def close(self) -> None:
