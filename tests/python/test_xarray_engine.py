@@ -21,7 +21,7 @@ import tessel
 import xarray
 from made_files import EVERYTHING, generate, open_descriptors
 from scipy.io import netcdf_file
-from tessel.xarray import TesselBackendEntrypoint, TesselDataStore, opening, planning
+from tessel.xarray import TesselBackendEntrypoint, TesselDataStore, opening, planning, to_netcdf
 from tessel.xarray.opening import OpenFile
 from xarray.backends.plugins import guess_engine, list_engines
 
@@ -181,6 +181,30 @@ def test_texts_that_are_not_utf8(tmp_path: Path) -> None:
         v:latin = "\\351t\\351" ; v:ended = "a\\000b" ; v:none = "" ;""")
     with xarray.open_dataset(path, engine="tessel") as dataset:
         assert dataset.v.attrs == {"latin": "\u00e9t\u00e9", "ended": "a", "none": ""}
+
+
+def test_markers_of_characters_beyond_ascii(tmp_path: Path) -> None:
+    """A marker is the bytes that are in the file, whatever a text of these bytes would be."""
+    path = str(tmp_path / "marked.nc")
+    markers = {"plain": b"x", "high": b"\xff", "letter": b"\xe9", "two": b"\xc3\xa9",
+               "latin": b"\xe9\xc3"}
+    with netcdf_file(path, "w") as file:  # which lets a marker have two bytes
+        file.createDimension("x", 3)
+        for name, marker in markers.items():
+            file.createVariable(name, "S1", ("x",))[:] = [b"a", marker[:1], b"\xe8"]
+            file.variables[name]._FillValue = marker
+    for engine in ("tessel", "scipy"):  # "netcdf4" cannot open such a file
+        raw = opened(path, engine, decode_cf=False)
+        assert {name: raw[name].attrs["_FillValue"] for name in raw} == markers
+    masked = opened(path, "tessel", concat_characters=False)
+    xarray.testing.assert_identical(masked, opened(path, "scipy", concat_characters=False))
+    assert masked.high.isnull().values.tolist() == [False, True, False]
+    copied = str(tmp_path / "copied.nc")
+    to_netcdf(masked[["plain", "high", "letter"]], copied)
+    again = opened(copied, "scipy", decode_cf=False)
+    for name in again:
+        assert again[name].attrs["_FillValue"] == markers[name]
+        assert again[name].values.tobytes() == raw[name].values.tobytes()
 
 
 def test_names_in_utf8(tmp_path: Path) -> None:

@@ -23,6 +23,7 @@ from made_files import MIB, open_descriptors, run_tool
 from tessel.new_dataset import NewDataset
 from tessel.xarray import to_netcdf
 from tessel.xarray.blocks import BlockWriter, Slot, _Open
+from tessel.xarray.writing import Reopened
 
 FORMATS = {"NETCDF3_CLASSIC": "classic", "NETCDF3_64BIT": "64-bit offset"}
 ENGINES = ["netcdf4", "scipy", "tessel"]
@@ -201,6 +202,12 @@ MISFITS: dict[str, tuple[Any, dict[str, Any]]] = {
     "negative as unsigned": ([-1.0], {"dtype": "i1", "_Unsigned": "true", "_FillValue": 255}),
     "a marker": ([1.0], {"dtype": "i2", "_FillValue": -99999}),
     "another marker": ([1.0], {"dtype": "i2", "missing_value": 40000}),
+    "a fractional marker": ([1.0], {"dtype": "i2", "_FillValue": -1.5}),
+    "another fractional marker": ([1], {"missing_value": 0.25}),
+    "a fractional marker of unsigned values": ([1.0], {"dtype": "i1", "_Unsigned": "true",
+                                                       "_FillValue": 254.5}),
+    "a fractional marker of unsigned bits": ([1.0], {"dtype": "i1", "_Unsigned": "true",
+                                                     "_FillValue": -0.5}),
     "a marker in single precision": ([1.0], {"dtype": "f4", "_FillValue": 1e300}),
     "a marker of unsigned values": ([1.0], {"dtype": "i1", "_Unsigned": "true",
                                             "_FillValue": 256}),
@@ -231,6 +238,22 @@ def test_a_misfit_far_into_the_data(tmp_path: Path, scheduler: str) -> None:
     with dask.config.set(scheduler=scheduler), pytest.raises(ValueError, match="could not safely"):
         to_netcdf(xr.Dataset({"x": ("t", values)}), tmp_path / "x.nc")
     assert not list(tmp_path.iterdir())
+
+
+def test_a_marker_among_the_attributes_that_does_not_fit(tmp_path: Path) -> None:
+    for marker in (1.5, -99999):
+        made = xr.Dataset({"x": ("t", np.array([1, 2], "i2"), {"_FillValue": marker})})
+        with pytest.raises(ValueError, match=f"_FillValue of .*'x'.* the value {marker}"):
+            to_netcdf(made, tmp_path / "x.nc")
+
+
+@pytest.mark.parametrize("marker", [-1.0, np.float32(-1), -1, np.int64(-1)])
+def test_a_whole_marker_fits_whatever_its_type(tmp_path: Path, marker: Any) -> None:
+    made = xr.Dataset({"x": ("t", [1.0, np.nan], {}, {"dtype": "i2", "_FillValue": marker})})
+    to_netcdf(made, tmp_path / "x.nc")
+    raw = read(tmp_path / "x.nc", "scipy", decode_cf=False).x
+    assert (raw.values.tolist(), raw.attrs["_FillValue"]) == ([1, -1], -1)
+    assert raw.attrs["_FillValue"].dtype.newbyteorder("=") == "i2"
 
 
 @pytest.mark.parametrize("attribute", [2**31, [1, 2**40], np.uint8(200)])
@@ -286,8 +309,8 @@ def test_types_that_there_are_none_for(tmp_path: Path, values: np.ndarray) -> No
 def test_unlimited_dimensions(tmp_path: Path) -> None:
     made = xr.Dataset({"x": (("t", "y"), np.ones((3, 2)))})
     for given, encoded in [("t", None), (["t"], None), (None, ["t"]), (None, {"t", "gone"}),
-                           (("t",), ["y"])]:
-        made.encoding["unlimited_dims"] = encoded or ()
+                           (("t",), ["y"]), (iter("t"), None), (None, iter(["t", "gone"]))]:
+        made.encoding["unlimited_dims"] = encoded or ()  # an iterator is good for one look
         to_netcdf(made, tmp_path / "x.nc", unlimited_dims=given)
         assert "t = UNLIMITED ; // (3 currently)" in header(tmp_path / "x.nc")
         xr.testing.assert_identical(read(tmp_path / "x.nc", "netcdf4"), made)
@@ -297,7 +320,7 @@ def test_unlimited_dimensions(tmp_path: Path) -> None:
 
 @pytest.mark.parametrize("unlimited, word", [
     (["t", "y"], "onlyOneUnlimitedDimensionAllowed"), ("y", "unlimitedDimensionInTheWrongIndex"),
-    ("z", "badDimensions"), (["t", "z"], "badDimensions")])
+    ("z", "badDimensions"), (["t", "z"], "badDimensions"), (iter("tz"), "badDimensions")])
 def test_unlimited_dimensions_that_cannot_be(tmp_path: Path, unlimited: Any, word: str) -> None:
     with pytest.raises(tessel.Error) as raised:
         to_netcdf(xr.Dataset({"x": (("t", "y"), np.ones((3, 2)))}), tmp_path / "x.nc",
@@ -499,6 +522,64 @@ def test_adding(tmp_path: Path) -> None:
         with pytest.raises(ValueError, match=message):
             to_netcdf(wrong, path, mode="a")
         assert path.read_bytes() == before
+
+
+BEFORE = {"packed": ([1.0, 2.0], {}, {"dtype": "i2", "scale_factor": 0.5, "_FillValue": 7}),
+          "shifted": ([1.0, 2.0], {}, {"dtype": "i2", "add_offset": 5.0, "missing_value": 7}),
+          "times": (np.array([0, 1], "M8[D]").astype("M8[ns]"), {}, {"dtype": "i2"}),
+          "bits": ([255.0, 1.0], {}, {"dtype": "i1", "_Unsigned": "true"}),
+          "flags": ([True, False], {}, {}),
+          "described": ([1, 2], {"units": "m", "valid_min": 0}, {"dtype": "i2"})}
+
+
+@pytest.mark.parametrize("lazy", [False, True])
+@pytest.mark.parametrize("name", BEFORE)
+def test_what_is_put_in_the_place_of_values_means_what_it_says(tmp_path: Path, name: str,
+                                                              lazy: bool) -> None:
+    """Nothing is left of how the values were packed that were there before."""
+    path = tmp_path / "x.nc"
+    to_netcdf(xr.Dataset({name: ("t", *BEFORE[name]), "other": ("t", [1.0, 2.0], {"units": "K"})}),
+              path)
+    dtype = read(path, "scipy", decode_cf=False)[name].dtype.newbyteorder("=")
+    after = xr.Dataset({name: ("t", np.array([7, -1], dtype), {"long_name": "new"})})
+    to_netcdf(chunked(after) if lazy else after, path, mode="a")
+    actual = read(path, "netcdf4")
+    xr.testing.assert_identical(actual[[name]], after)
+    assert actual[name].dtype == dtype and actual.other.attrs == {"units": "K"}
+
+
+def test_values_are_packed_again_in_another_way(tmp_path: Path) -> None:
+    path = tmp_path / "x.nc"
+    made = xr.Dataset({"x": ("t", [1.0, np.nan])})
+    to_netcdf(made, path, encoding={"x": {"dtype": "i2", "scale_factor": 0.5, "_FillValue": 7}})
+    with xr.open_dataset(path, engine="tessel") as opened:
+        to_netcdf(opened, path, mode="a")  # as the dataset says, which has it from the file
+    raw = read(path, "scipy", decode_cf=False).x
+    assert (raw.values.tolist(), raw.attrs) == ([2, 7], {"scale_factor": 0.5, "_FillValue": 7})
+    to_netcdf(made, path, mode="a", encoding={"x": {"dtype": "i2", "add_offset": 5.0,
+                                                    "missing_value": 9}})
+    raw = read(path, "scipy", decode_cf=False).x
+    assert (raw.values.tolist(), raw.attrs) == ([-4, 9], {"add_offset": 5.0, "missing_value": 9})
+    with pytest.raises(ValueError, match="a variable x already.*cannot take float64"):
+        to_netcdf(made, path, mode="a")  # not packed
+
+
+def test_a_file_that_cannot_be_added_to_is_closed(tmp_path: Path,
+                                                  monkeypatch: pytest.MonkeyPatch) -> None:
+    path = tmp_path / "x.nc"
+    to_netcdf(xr.Dataset({"x": 1.0}), path)
+    before = path.read_bytes()
+    original = Reopened.call
+
+    def call(self: Reopened, operation: str, *arguments: object) -> Any:
+        if operation == "redef":
+            raise MemoryError
+        return original(self, operation, *arguments)
+
+    monkeypatch.setattr(Reopened, "call", call)
+    with pytest.raises(MemoryError):
+        to_netcdf(xr.Dataset({"y": 1.0}), path, mode="a")
+    assert path.read_bytes() == before  # and `nothing_left` sees that nothing is open
 
 
 def test_a_file_is_replaced_while_it_is_read(tmp_path: Path) -> None:

@@ -90,6 +90,16 @@ def _converted(data: Any, dtype: np.dtype[Any], what: str, *, unsigned: bool = F
     return convert(np.asarray(data))
 
 
+def _whole(values: NDArray[Any], dtype: np.dtype[Any], what: str) -> NDArray[Any]:
+    """The same as `fitted`, and an error for what an integer type would have to round. Values that
+    are measured may be rounded; one that stands for missing ones would be another one."""
+    if dtype.kind in "iu" and values.dtype.kind == "f":
+        fractional = np.isfinite(values) & (values != np.around(values))
+        if fractional.any():
+            raise _misfit(values, fractional, dtype, what)
+    return fitted(values, dtype, what)
+
+
 def _marker(value: Any, dtype: np.dtype[Any], what: str, unsigned: bool) -> Any:
     """A value that stands for missing ones, as the data have it before the bits become signed."""
     given = np.asarray(value)
@@ -97,9 +107,9 @@ def _marker(value: Any, dtype: np.dtype[Any], what: str, unsigned: bool) -> Any:
         return value
     if unsigned:
         if given >= 0:
-            return fitted(given, np.dtype(f"u{dtype.itemsize}"), what)[()]
-        return fitted(given, dtype, what).view(f"u{dtype.itemsize}")[()]
-    return fitted(given, dtype, what)[()]
+            return _whole(given, np.dtype(f"u{dtype.itemsize}"), what)[()]
+        return _whole(given, dtype, what).view(f"u{dtype.itemsize}")[()]
+    return _whole(given, dtype, what)[()]
 
 
 def checked(variable: Variable, name: Hashable) -> Variable:
@@ -173,7 +183,7 @@ def _fill_value(value: bytes | NDArray[Any], dtype: np.dtype[Any],
         value = value or b"\0"  # with which NumPy fills a text that is shorter than others
     if len(value) != 1:
         raise tessel.Error("TESSEL:python:badShape", f"{what}: it is one value, not {len(value)}.")
-    return value if isinstance(value, bytes) else fitted(value, dtype, what)
+    return value if isinstance(value, bytes) else _whole(value, dtype, what)
 
 
 def attribute(value: Any, what: str) -> bytes | NDArray[Any]:

@@ -54,9 +54,13 @@ class TesselDataStore(AbstractDataStore):
     def _variable(self, variable: Variable) -> XarrayVariable:
         array = LazyArray(self._manager, variable, self.file.mapped)
         attributes = _values(variable.attributes)
-        if variable.is_text and isinstance(attributes.get("_FillValue"), str):
-            # Beside characters, which are bytes, it is bytes.
-            attributes["_FillValue"] = np.bytes_(attributes["_FillValue"].encode("utf-8"))
+        fill = attributes.get("_FillValue")
+        if variable.is_text and isinstance(fill, str):
+            # Beside characters, which are bytes, it is the bytes that are in the file: a text that
+            # has as many characters as bytes is one of Latin-1, or of ASCII.
+            length = int(self.file.call("inq_att", variable.varid, "_FillValue")[1][0, 0])
+            attributes["_FillValue"] = np.bytes_(fill.encode(
+                "latin-1" if len(fill) == length else "utf-8"))
         encoding = {"source": self._path, "original_shape": array.shape, "dtype": array.dtype}
         return XarrayVariable([each.name for each in variable.dimensions],
                               indexing.LazilyIndexedArray(array), attributes, encoding)

@@ -46,7 +46,8 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
 
     The file appears when it is complete, or not at all: it is written aside and renamed, over one
     of that name. With the mode "a", the variables are added to a file that there is, or put into
-    it where it has them; a copy of it is what is worked on.
+    it where it has them, with the attributes that they have now in place of those of before; a copy
+    of it is what is worked on.
 
     A value that the type in the file does not hold is an error. 64-bit and unsigned integers become
     the signed ones of 32 bits or fewer when all of them fit.
@@ -87,10 +88,10 @@ def _unlimited(dataset: xarray.Dataset, given: Any) -> list[Hashable]:
     """The unlimited dimensions: those asked for, or else those that the dataset had in its file and
     has still."""
     wanted = dataset.encoding.get("unlimited_dims", ()) if given is None else given
-    if isinstance(wanted, str) or not isinstance(wanted, Iterable):
-        wanted = [wanted]
+    wanted = [wanted] if isinstance(wanted, str) or not isinstance(wanted, Iterable) \
+        else list(wanted)
     found = [each for each in wanted if each in dataset.dims]
-    if given is not None and len(found) < len(list(wanted)):
+    if given is not None and len(found) < len(wanted):
         missing = [each for each in wanted if each not in dataset.dims]
         raise tessel.Error("TESSEL:python:badDimensions",
                            f"The dataset has no dimensions {missing} that could be unlimited.")
@@ -110,7 +111,11 @@ class Reopened(NewDataset):
         self.ncid = self._netcdf("open", path, "WRITE")
         self._defining = True
         self._closed = False
-        self.call("redef")
+        try:
+            self.call("redef")
+        except BaseException:
+            self._give_up()
+            raise
 
 
 class WritingStore(AbstractWritableDataStore):
@@ -187,6 +192,11 @@ class WritingStore(AbstractWritableDataStore):
                                    f"{name} has the length {length}, and not "
                                    f"{self._lengths[dim]} as elsewhere.")
         varid = self._defined(name, variable)
+        # Of a variable that was there, no attribute may say of the new values what the old ones
+        # meant: their scale, their units, which of them were missing.
+        for key in self._variables[name].attributes if name in self._variables else ():
+            if key not in variable.attrs:
+                self._made.call("del_att", varid, key)
         for key, value in variable.attrs.items():
             self._put_attribute(varid, key, value)
         return Slot(varid, variable.dtype, variable.shape), variable.data
