@@ -47,8 +47,9 @@ constexpr std::array libraryWords = {
 constexpr int firstLibraryStatus = -33;
 static_assert(libraryWords.size() == 32, "one word for each of -33 to -64");
 
-/// The system's statuses, from 1 upwards, in the BSD numbering, which is that of every system but
-/// for 11 and 35.
+/// The system's statuses, from 1 upwards, as BSD numbers them. Linux has other meanings for two of
+/// the numbers, "try again" for 11 and a deadlock for 35; the words stay, as programs match on
+/// them.
 constexpr std::array systemWords = {
     "operationNotPermitted",         // 1
     "noSuchFileOrDirectory",         // 2

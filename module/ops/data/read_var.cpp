@@ -8,6 +8,7 @@
 
 #include <netcdf.h>
 
+#include <algorithm>
 #include <cstdint>
 
 namespace tessel::netcdf {
@@ -15,8 +16,7 @@ namespace {
 
 /// This family counts the characters it hands over in 32 bits, and none when that is negative.
 std::size_t countedIn32Bits(std::size_t n) {
-    const auto count = static_cast<std::int32_t>(n);
-    return count > 0 ? static_cast<std::size_t>(count) : 0;
+    return static_cast<std::size_t>(std::max(static_cast<std::int32_t>(n), 0));
 }
 
 constexpr TextBlock text = {1, countedIn32Bits};
