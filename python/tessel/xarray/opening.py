@@ -149,7 +149,7 @@ class OpenFile(Dataset):
         with self._lock:
             if not self._ids:
                 raise FileWasClosed
-            self._want_all()  # a cut that was there before costs neither time nor memory
+            self._want_length()  # a cut that was there before costs neither time nor memory
             ncid = self._id(once)
             in_host_order = [each[::-1] for each in places]
             _faults.begin()
@@ -163,11 +163,15 @@ class OpenFile(Dataset):
     def _layout_now(self) -> bytes:
         return os.pread(self._descriptor, self._layout_bytes, _LAYOUT_BEGIN)
 
-    def _want_all(self) -> None:
-        """Raises the error for a file that became shorter, or another one."""
+    def _want_length(self) -> None:
+        """Raises the error for a file that became shorter."""
         self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
         if self._gone:
             raise self._error("fileTooShort", "The file became shorter while it was open.")
+
+    def _want_all(self) -> None:
+        """Raises the error for a file that became shorter, or another one."""
+        self._want_length()
         if self._layout_now() != self._layout:
             raise self._error("fileChanged", "The file was overwritten while it was open.")
 
