@@ -25,7 +25,7 @@ from typing import Any
 
 import numpy
 
-from tessel import paths
+from tessel import paths, wording
 from tessel.errors import Error
 
 
@@ -75,10 +75,8 @@ def numbers(value: Any, dtype: numpy.dtype[Any]) -> Any:
     with numpy.errstate(all="ignore"):
         for i, each in enumerate(flat):
             if not _put(made, i, each):
-                from tessel import notes  # here, because only errors need it
-
                 raise Error("TESSEL:python:notExact",
-                            f"{notes.shortened(each)} is not exact as {dtype.name}; pass an array "
+                            f"{wording.abridged(each)} is not exact as {dtype.name}; pass an array "
                             "of that dtype to have it rounded.")
     return made.reshape(objects.shape)
 

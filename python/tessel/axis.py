@@ -8,24 +8,30 @@ import warnings
 from collections.abc import Callable, Iterator
 from dataclasses import dataclass
 from datetime import timedelta
+from types import ModuleType
+from typing import TYPE_CHECKING
 
-import cftime
 import numpy as np
 
 from tessel import wording
 from tessel.dataset import Dataset, Dimension, Variable
+
+if TYPE_CHECKING:
+    import cftime
 
 _EAST = {"degrees_east", "degree_east", "degrees_e", "degree_e", "degreese", "degreee"}
 _NORTH = {"degrees_north", "degree_north", "degrees_n", "degree_n", "degreesn", "degreen"}
 
 
 @contextlib.contextmanager
-def year_zero_allowed() -> Iterator[None]:
-    """For what makes dates: climatologies are written as the year zero, whether or not the calendar
-    has one, and need no warning about it."""
+def calendars() -> Iterator[ModuleType]:
+    """The library of calendars, for what makes dates: climatologies are written as the year zero,
+    whether or not the calendar has one, and need no warning about it."""
+    import cftime  # here, because files without times are shown without it
+
     with warnings.catch_warnings():
         warnings.simplefilter("ignore", cftime.CFWarning)
-        yield
+        yield cftime
 
 
 @dataclass(frozen=True)
@@ -52,23 +58,23 @@ class Calendar:
     def date(self, value: float) -> cftime.datetime | None:
         """The date of a number; None where there is none."""
         try:
-            with year_zero_allowed():
-                date = cftime.num2date(value, self.units, self.calendar, has_year_zero=True)
+            with calendars() as library:
+                date = library.num2date(value, self.units, self.calendar, has_year_zero=True)
         except (ValueError, TypeError, ArithmeticError):
             return None
-        return date if isinstance(date, cftime.datetime) else None
+        return date if isinstance(date, library.datetime) else None
 
     def value(self, date: cftime.datetime) -> float:
         """The number of a date that `date` gave, or one near it."""
-        with year_zero_allowed():
-            return float(cftime.date2num(date, self.units, self.calendar, has_year_zero=True))
+        with calendars() as library:
+            return float(library.date2num(date, self.units, self.calendar, has_year_zero=True))
 
     def written(self, value: float) -> str:
         """A number as a date for people."""
         date = self.date(value)
         if date is None:
             return wording.with_units(wording.number(value), self.units)
-        with year_zero_allowed():
+        with calendars():
             date += timedelta(seconds=30)  # to the nearest minute
         text = f"{date.day} {date.strftime('%B')}"
         if self.climatology:

@@ -4,12 +4,13 @@
 from __future__ import annotations
 
 import argparse
+import contextlib
 import os
-from collections.abc import Callable
+from collections.abc import Callable, Iterator
 from typing import get_args
 
 import tessel
-from tessel import integrity, notes, show, terminal, wording
+from tessel import integrity, notes, operations, reference, show, terminal, wording
 from tessel.dataset import Dataset
 from tessel.new_dataset import FORMATS
 
@@ -67,9 +68,6 @@ def _check(options: argparse.Namespace) -> None:
 
 
 def _ops(options: argparse.Namespace) -> None:
-    # Here, because only this needs the whole table.
-    from tessel import operations, reference
-
     if options.name is None:
         width = max(len(each.short) for each in operations.OPERATIONS)
         for each in operations.OPERATIONS:
@@ -147,19 +145,39 @@ def parser() -> argparse.ArgumentParser:
     return whole
 
 
+# What an error is called that a call for the file raised, even if its path is none of a file.
+_OF_A_FILE = ("TESSEL:netcdf:", "TESSEL:guard:")
+
+
 def _line(error: Exception, options: argparse.Namespace) -> str:
     """What went wrong, with which file, and what is there instead of a dataset."""
     message = terminal.message_of(error)
     if isinstance(error, tessel.Error):
-        path = error.path or getattr(options, "file", getattr(options, "source", None))
+        path = error.path
+        if path is None and error.identifier.startswith(_OF_A_FILE):
+            path = getattr(options, "file", getattr(options, "source", None))
         if path is not None:
             message = ": ".join([terminal.with_file(error.message, path), *notes.instead(error)])
     return f"tessel: {message}"
 
 
+@contextlib.contextmanager
+def _guarded(guard: str | None) -> Iterator[None]:
+    """Has everything in the `with` block load the module with this guard, if one is given."""
+    before = os.environ.get("TESSEL_GUARD")
+    if guard is not None:
+        os.environ["TESSEL_GUARD"] = guard
+    try:
+        yield
+    finally:
+        if before is not None:
+            os.environ["TESSEL_GUARD"] = before
+        elif guard is not None:
+            del os.environ["TESSEL_GUARD"]
+
+
 def main(arguments: list[str] | None = None) -> int:
     """The command line; returns its exit status."""
     options = parser().parse_args(arguments)
-    if getattr(options, "guard", None) is not None:
-        os.environ["TESSEL_GUARD"] = options.guard
-    return terminal.run(lambda: options.action(options), lambda error: _line(error, options))
+    with _guarded(getattr(options, "guard", None)):
+        return terminal.run(lambda: options.action(options), lambda error: _line(error, options))

@@ -66,6 +66,10 @@ class Dimension:
     length: int
     unlimited: bool = False
 
+    def __str__(self) -> str:
+        """Its name and length, and whether it grows."""
+        return f"{self.name}={self.length}{' unlimited' if self.unlimited else ''}"
+
 
 @dataclass(frozen=True)
 class Attribute:
@@ -93,8 +97,7 @@ class Variable:
 
     def __str__(self) -> str:
         """What it is, with its dimensions in the host's order, in printable characters."""
-        lengths = ", ".join(f"{each.name}={each.length}{' unlimited' if each.unlimited else ''}"
-                            for each in self.dimensions[::-1])
+        lengths = ", ".join(map(str, self.dimensions[::-1]))
         shape = f"({lengths})" if lengths else ", a single value"
         return wording.printable(f"{self.type.name} {self.name}{shape}")
 

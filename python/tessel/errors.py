@@ -29,8 +29,8 @@ import errno
 import os
 from typing import Any
 
-# The words by the built-in that says the same. Every word that the module, the host and this
-# package can raise is here, in SYSTEM_ERRORS, or in WITHOUT_BUILT_IN.
+# The words by the built-in that says the same. Every word that the module, the guard, the host and
+# this package can raise is here, in SYSTEM_ERRORS, or in WITHOUT_BUILT_IN.
 BUILT_INS: dict[type[Exception], str] = {
     TypeError: """
         badInputParameterCount badInputArgumentCount badParameterCount tooFewArguments tooManyInputs
@@ -55,6 +55,7 @@ BUILT_INS: dict[type[Exception], str] = {
         unlimitedDimensionInTheWrongIndex onlyOneUnlimitedDimensionAllowed libraryMaxDimsExceeded
         maximumNumberOfAttributesExceeded maximumNumberOfVariablesExceeded
         actionProhibitedOnGlobalVarid mathArgumentOutOfDomainOfFunc
+        alignment closed counts mode records
         badBlockSize badDimensions badEncoding badFormat badMode badModuleName badOutputCount
         badShape badGuard badPath characterTooLarge differentFields dimensionsTooLarge missingInput
         nestedTooDeeply notExact nothingToDraw notText readOnlyArray recordsWithoutVariables
@@ -76,8 +77,9 @@ BUILT_INS: dict[type[Exception], str] = {
     # layer, which all come from what is in a file or from reading and writing it.
     OSError: """
         notANetcdfFile notAClassicFile notARegularFile corruptedFile fileChanged fileTooShort
-        sameFile unknownErrorStatus
+        header sameFile unknownErrorStatus
         """,
+    PermissionError: "remote",
     ModuleNotFoundError: "moduleNotFound",
     ImportError: "notAModule noEntryPoint",
 }
@@ -227,7 +229,7 @@ def raised(module: object, arguments: tuple[object, ...], identifier: str, messa
 
 def explained(error: Error, module: object, arguments: tuple[object, ...]) -> Error:
     """An error of a call, with the note on what was called if it has none yet."""
-    from tessel import notes  # here, because only errors need it
+    from tessel import notes  # not earlier: it needs this module
 
     if error.operation is None:
         notes.explain(error, module, arguments)

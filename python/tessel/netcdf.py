@@ -48,9 +48,9 @@ Numbers = Union[float, Sequence[Any]]
 """Data as Python's own numbers."""
 
 
-# The path of each open dataset, as a tuple of its own, for the notes of errors. By id, for the whole
-# process, as the ids are: an id that others have closed and opened again may lead to the path that
-# it had here. From the root on, so that it leads there from any folder, and for `path_of` to tidy.
+# The path of each open dataset, as a tuple of its own, for the notes of errors. By id, for the
+# whole process, as the ids are: an id that others have closed and opened again may lead to the path
+# that it had here. From the root on, so that it leads there from any folder; `path_of` tidies it.
 _opened: dict[int, tuple[str]] = {}
 
 
@@ -130,7 +130,8 @@ _SCOPE: dict[str, Any] = {
     "call": _call, "constant": _constant, "Error": errors.Error, "explained": errors.explained,
     "dtypes": {name: numpy.dtype(name) for name in
                ("float64", "float32", "int32", "int16", "int8", "uint8")},
-    "file_path": file_path, "forget": _forget, "identifiers": identifiers, "integer": integer, "known": _known,
+    "file_path": file_path, "forget": _forget, "identifiers": identifiers, "integer": integer,
+    "known": _known,
     "ndarray": ndarray, "numbers": numbers, "numpy": numpy, "paths": paths,
     "remember": _remember,
     "vector": vector,

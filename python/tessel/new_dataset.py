@@ -11,7 +11,7 @@ from typing import Any
 import numpy as np
 
 import tessel
-from tessel import notes
+from tessel import wording
 from tessel.dataset import Dataset
 
 FORMATS = {"classic": "NOCLOBBER", "64bit-offset": "64BIT_OFFSET"}
@@ -30,7 +30,7 @@ class NewDataset:
     def __init__(self, path: str, form: str) -> None:
         if not isinstance(form, str) or form not in FORMATS:
             raise tessel.Error("TESSEL:python:badFormat", f"The format is one of "
-                               f"{', '.join(FORMATS)}, not {notes.shortened(form)}.")
+                               f"{', '.join(FORMATS)}, not {wording.abridged(form)}.")
         self._netcdf = tessel.load("netcdf")
         self._defining = True
         self._closed = False
@@ -43,6 +43,8 @@ class NewDataset:
 
     def _create(self, constant: str) -> Any:
         mode = int(self.parameter("NOCLOBBER")) | int(self.parameter(constant))
+        if constant != "NOCLOBBER":
+            return self._netcdf("create", self.path, mode)
         # A mode without a format stands for the default, which only few programs change; for them
         # it is set back. Two threads at it at once would set back each other's.
         with _default_format:

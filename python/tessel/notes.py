@@ -2,9 +2,10 @@
 """The note of an error: what was called, on what.
 
 The message is the module's and stays so. The note is attached to the exception (`__notes__`), and
-Python shows it below the message. All of it is found out when the error is there: nothing of this
-runs when a call succeeds, and nothing here can fail a call in another way. What comes from a file
-is made harmless, because Python shows notes as they are.
+Python shows it below the message. All of it is found out when the error is there, but for the
+current folder, which the functions of this package look up when they begin; and nothing here can
+fail a call in another way. What comes from a file is made harmless, because Python shows notes as
+they are.
 """
 
 from __future__ import annotations
@@ -12,7 +13,6 @@ from __future__ import annotations
 import functools
 import inspect
 import os
-import reprlib
 import threading
 from collections.abc import Callable, Iterator
 from contextlib import suppress
@@ -21,10 +21,11 @@ from typing import Any, TypeVar
 import numpy
 
 from tessel import beginning, operations, paths, wording
+from tessel.dataset import Dimension, Variable, external_type
 from tessel.errors import Error
+from tessel.netcdf import Netcdf, path_of
 from tessel.operation import Operation
 
-_LONGEST = 60
 _MOST = 12
 
 _Function = TypeVar("_Function", bound=Callable[..., Any])
@@ -78,22 +79,20 @@ def told(function: _Function) -> _Function:
 
 def _lines_of_function(error: Error, name: str, values: dict[str, Any],
                        folder: str | None) -> Iterator[str]:
-    written = (f"{each}={shortened(value)}" for each, value in values.items())
+    written = (f"{each}={wording.abridged(value)}" for each, value in values.items())
     yield f"in {name}({', '.join(written)})"
     before = "\n".join(getattr(error, "__notes__", ())).splitlines()
     for each, title in (("path", "file"), ("source", "source"), ("target", "target")):
         value = values.get(each)
         if isinstance(value, (str, bytes, os.PathLike)):
             line = f"{title}: {paths.absolute(os.fsdecode(value), folder)}"
-            if line not in before:
+            if wording.printable(line) not in before:
                 yield line
 
 
 def _lines(error: Error, module: Any, arguments: tuple[Any, ...]) -> Iterator[str]:
     if not arguments or not isinstance(arguments[0], str):
         return
-    from tessel.netcdf import Netcdf  # not earlier: it needs the extension that calls this
-
     name, *given = arguments
     row = operations.find(name) if isinstance(module, Netcdf) else None
     error.operation = row.short if row else name
@@ -110,41 +109,8 @@ def _call(name: str, row: Operation | None, given: list[Any]) -> str:
     """The call as one might write it."""
     names = [f"{each.name}=" for each in row.arguments] if row else []
     names += [""] * (len(given) - len(names))
-    values = (shortened(paths.shown(each)) for each in given)
+    values = (wording.abridged(paths.shown(each)) for each in given)
     return f"{name}({', '.join(map(str.__add__, names, values))})"
-
-
-class _Short(reprlib.Repr):
-    """Writes values, but never all of a large one."""
-
-    def repr_int(self, value: int, level: int) -> str:
-        """An int; Python itself refuses to write one of thousands of digits."""
-        bits = value.bit_length()
-        return super().repr_int(value, level) if bits < 200 else f"<int of {bits} bits>"
-
-
-_short = _Short()
-_short.maxlevel = 2
-_short.maxlist = _short.maxtuple = _short.maxdict = _MOST
-_short.maxstring = _LONGEST - 10
-_short.maxother = _LONGEST
-
-
-def shortened(value: Any) -> str:
-    """A value as Python writes it, on one line, and not all of it if it is long."""
-    if isinstance(value, numpy.ndarray):
-        if value.dtype.kind in "biuf" and value.size == 1:
-            return str(value.item())
-        what = f"{value.dtype.name} array of shape {value.shape}"
-        few = 0 < value.size <= 4
-        return f"<{what}: {_short.repr(value.ravel().tolist())}>" if few else f"<{what}>"
-    if isinstance(value, (str, bytes)):
-        return repr(value if len(value) <= _LONGEST else value[:_LONGEST]) + (
-            f"... ({len(value)} characters)" if len(value) > _LONGEST else "")
-    if isinstance(value, (list, tuple)) and len(value) > _MOST:
-        return f"<{type(value).__name__} of {len(value)}>"
-    text = _short.repr(value)
-    return text if len(text) <= _LONGEST else text[:_LONGEST] + "..."
 
 
 def _file(error: Error, path: Any) -> Iterator[str]:
@@ -212,14 +178,12 @@ class _Subject:
         return None
 
     @staticmethod
-    def _ask(about: Callable[..., str], *arguments: Any) -> Iterator[str]:
+    def _ask(about: Callable[..., Any], *arguments: Any) -> Iterator[Any]:
         """What an inquiry tells; nothing if it is refused as well."""
         with suppress(Exception):
             yield about(*arguments)
 
     def _dataset(self, name: str, ncid: int) -> str:
-        from tessel.netcdf import path_of
-
         path = paths.shown(path_of(ncid))
         if path is None:
             return f"{name} {ncid}: no dataset that was opened here is known by this id"
@@ -230,23 +194,21 @@ class _Subject:
         if varid == -1:
             return f"{name} -1: the dataset itself"
         found = self._module.inq_var(ncid, varid)
-        dimensions = ", ".join(self._dimension(ncid, dimid) for dimid in found.dimids)
-        shape = f"({dimensions})" if dimensions else ", a single value"
-        kind = _TYPES.get(found.xtype, f"type {found.xtype}")
-        return f"{name} {varid}: {kind} {found.name}{shape}"
+        dimensions = (self._dimension(ncid, dimid) for dimid in found.dimids[::-1])
+        variable = Variable(varid, found.name, external_type(found.xtype), tuple(dimensions))
+        return f"{name} {varid}: {variable}"
 
-    def _dimension(self, ncid: int, dimid: int) -> str:
+    def _dimension(self, ncid: int, dimid: int) -> Dimension:
         name, length = self._module.inq_dim(ncid, dimid)
-        unlimited = " unlimited" if self._module.inq(ncid).unlimdimid == dimid else ""
-        return f"{name}={length}{unlimited}"
+        return Dimension(name, length, self._module.inq(ncid).unlimdimid == dimid)
 
     def _dimensions(self, ncid: int) -> Iterator[str]:
         """The dimensions that the call names."""
         dimids = self._values.get("dimids", self._values.get("dimid"))
         if dimids is not None:
             for dimid in map(int, numpy.asarray(dimids).flat[:_MOST]):
-                for text in self._ask(self._dimension, ncid, dimid):
-                    yield f"dimid {dimid}: {text}"
+                for dimension in self._ask(self._dimension, ncid, dimid):
+                    yield f"dimid {dimid}: {dimension}"
 
     def _known(self, ncid: int) -> Iterator[str]:
         """What there is instead of what was not found."""
@@ -260,15 +222,12 @@ class _Subject:
                 yield _list("variables", inq.nvars,
                             lambda i: str(self._module.inq_var(ncid, i).name))
             elif word == "invalidDimensionIdOrName":
-                yield _list("dimensions", inq.ndims, lambda i: self._dimension(ncid, i))
+                yield _list("dimensions", inq.ndims, lambda i: str(self._dimension(ncid, i)))
             elif word == "attributeNotFound":
                 varid = self._number("varid")
                 count = inq.natts if varid == -1 else self._module.inq_var(ncid, varid).natts
                 yield _list("attributes", count,
                             lambda i: str(self._module.inq_attname(ncid, varid, i)))
-
-
-_TYPES = {1: "byte", 2: "char", 3: "short", 4: "int", 5: "float", 6: "double"}
 
 
 def _list(what: str, count: int, name: Callable[[int], str]) -> str:

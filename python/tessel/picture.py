@@ -10,16 +10,19 @@ import warnings
 from collections.abc import Iterator, Mapping
 from dataclasses import dataclass, replace
 from datetime import timedelta
+from typing import TYPE_CHECKING
 
-import cftime
 import matplotlib
 import numpy as np
 
 import tessel
 from tessel import describe, paths, wording
 from tessel.aside import written_aside
-from tessel.axis import Axis, Calendar, latitude, longitude, year_zero_allowed
+from tessel.axis import Axis, Calendar, calendars, latitude, longitude
 from tessel.dataset import Dataset, Variable
+
+if TYPE_CHECKING:
+    import cftime
 
 matplotlib.use("Agg")
 
@@ -74,7 +77,7 @@ def draw(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray, path: 
     _footnote(axes, 0, _plain(os.path.basename(dataset.path)))
     with warnings.catch_warnings(), np.errstate(all="ignore"):
         warnings.filterwarnings("ignore", message="Glyph .* missing")
-        with written_aside(path, overwrite=True, source=dataset.path) as temporary:
+        with written_aside(path, overwrite=True, source=dataset.place) as temporary:
             figure.savefig(temporary, format=ending, dpi=_DPI, bbox_inches="tight", pad_inches=0.15)
     return kind
 
@@ -237,7 +240,7 @@ def _mark(axes: Axes, ruler: Ruler, axis: Axis, reach: tuple[float, float]) -> N
     """Labels one side of the picture with what its positions are."""
     ruler.set_label_text(_plain(axis.label), fontsize=11)
     if axis.calendar is not None:
-        with year_zero_allowed():
+        with calendars():
             ticks = list(_time_ticks(axis.calendar, *reach))
         if len(ticks) >= 2:
             ruler.set_ticks([position for position, _ in ticks], [text for _, text in ticks])

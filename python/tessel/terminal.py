@@ -43,6 +43,10 @@ def message_of(error: Exception) -> str:
         return error.message
     if isinstance(error, MemoryError):
         return "There is not enough memory."
+    if isinstance(error, ModuleNotFoundError) and error.name:
+        library = error.name.partition(".")[0]
+        return (f"This needs {library}, which is not installed; Debian has it in the package "
+                f"python3-{library}.")
     if isinstance(error, OSError) and error.strerror and error.filename:
         return f"{error.strerror}: {os.fsdecode(error.filename)}"
     return str(error)
@@ -65,7 +69,7 @@ def run(command: Callable[[], object], line: Callable[[Exception], str] = messag
         signal.signal(signal.SIGINT, signal.SIG_DFL)
         os.kill(os.getpid(), signal.SIGINT)
         return 128 + signal.SIGINT
-    except (tessel.Error, OSError, MemoryError) as error:
+    except (tessel.Error, OSError, MemoryError, ImportError) as error:
         message = line(error)
     try:
         sys.stdout.flush()

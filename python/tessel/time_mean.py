@@ -42,7 +42,7 @@ def write(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray, path:
     rest = [each for i, each in enumerate(variable.dimensions) if i != place]
     beside = {each.name: each for each in _coordinates(dataset, variable, over)}.values()
 
-    with aside.written_aside(path, overwrite=True, source=dataset.path) as temporary, \
+    with aside.written_aside(path, overwrite=True, source=dataset.place) as temporary, \
             NewDataset(temporary, "64bit-offset") as made:
         used = dict.fromkeys([*rest, *(each for one in beside for each in one.dimensions)])
         dimids = {each: made.define_dimension(each.name, each.length) for each in used}

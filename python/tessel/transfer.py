@@ -15,7 +15,7 @@ import tessel
 from tessel import integrity, notes, wording
 from tessel.aside import written_aside
 from tessel.dataset import TEXT, Dataset, Variable, host_order
-from tessel.new_dataset import NewDataset
+from tessel.new_dataset import FORMATS, NewDataset
 from tessel.paths import Path
 
 Progress = Callable[[int, int], object]
@@ -84,6 +84,10 @@ def copy(source: Path, target: Path,
                                "Only files of the classic formats, 64-bit offset and 64-bit data "
                                "are copied; this one has another format, such as that of HDF5.",
                                path=dataset.place)
+        if format is None and own not in FORMATS:
+            raise tessel.Error("TESSEL:python:badFormat",
+                               f"The file has the format {own}, which copies do not have: give one "
+                               f"of {', '.join(FORMATS)}.", path=dataset.place)
         if check:
             integrity.verify(dataset)
         _judge_records(dataset)

@@ -3,11 +3,14 @@
 
 from __future__ import annotations
 
+import reprlib
 import unicodedata
 from typing import Any
 
 import numpy as np
 
+_LONGEST_VALUE = 60
+_MOST_ELEMENTS = 12
 _UNPRINTABLE = {"Cc", "Cf", "Cs", "Co", "Cn", "Zl", "Zp"}
 
 
@@ -24,6 +27,39 @@ def shortened(text: str, length: int) -> str:
     if len(text) <= length:
         return text
     return f"{text[:length]}… ({count(len(text))} characters)"
+
+
+class _Short(reprlib.Repr):
+    """Writes values, but never all of a large one."""
+
+    def repr_int(self, value: int, level: int) -> str:
+        """An int; Python itself refuses to write one of thousands of digits."""
+        bits = value.bit_length()
+        return super().repr_int(value, level) if bits < 200 else f"<int of {bits} bits>"
+
+
+_short = _Short()
+_short.maxlevel = 2
+_short.maxlist = _short.maxtuple = _short.maxdict = _MOST_ELEMENTS
+_short.maxstring = _LONGEST_VALUE - 10
+_short.maxother = _LONGEST_VALUE
+
+
+def abridged(value: Any) -> str:
+    """A value as Python writes it, on one line, and not all of it if it is long."""
+    if isinstance(value, np.ndarray):
+        if value.dtype.kind in "biuf" and value.size == 1:
+            return str(value.item())
+        what = f"{value.dtype.name} array of shape {value.shape}"
+        few = 0 < value.size <= 4
+        return f"<{what}: {_short.repr(value.ravel().tolist())}>" if few else f"<{what}>"
+    if isinstance(value, (str, bytes)):
+        return repr(value if len(value) <= _LONGEST_VALUE else value[:_LONGEST_VALUE]) + (
+            f"... ({len(value)} characters)" if len(value) > _LONGEST_VALUE else "")
+    if isinstance(value, (list, tuple)) and len(value) > _MOST_ELEMENTS:
+        return f"<{type(value).__name__} of {len(value)}>"
+    text = _short.repr(value)
+    return text if len(text) <= _LONGEST_VALUE else text[:_LONGEST_VALUE] + "..."
 
 
 def number(value: float | np.number[Any]) -> str:

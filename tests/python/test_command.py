@@ -342,11 +342,73 @@ def test_the_file_that_an_error_is_about(capsys, field, tmp_path):
     wide = generate(tmp_path / "wide.nc", "dimensions: x = 2 ; variables: ubyte a(x) ;", "cdf5")
     line = one_line(run(capsys, "copy", wide, tmp_path / "new.nc", "--format", "classic"))
     assert line.endswith(f": {tmp_path}/new.nc") and ".part" not in line
-    assert one_line(run(capsys, "copy", wide, tmp_path / "new.nc")).endswith(f": {wide}")
+    assert one_line(run(capsys, "copy", wide, tmp_path / "new.nc")) == (
+        "The file has the format 64bit-data, which copies do not have: give one of classic, "
+        f"64bit-offset: {wide}")
     new = generate(tmp_path / "new-format.nc", "dimensions: x = 2 ;", "netCDF-4")
     assert one_line(run(capsys, "copy", new, tmp_path / "new.nc")) == (
         "Only files of the classic formats, 64-bit offset and 64-bit data are copied; this one has "
         f"another format, such as that of HDF5: {new}")
+
+
+def test_errors_that_are_about_no_file(capsys, field, monkeypatch):
+    """The file is not to blame, and is not named; an address is."""
+    monkeypatch.setenv("TESSEL_GUARD", "none")
+    for arguments in (["info", field], ["check", field], ["copy", field, "new.nc"]):
+        assert one_line(run(capsys, *arguments)) == \
+            "A guard is one of on, remote, off, and not 'none'."
+    monkeypatch.delenv("TESSEL_GUARD")
+
+    def lost(name):
+        raise tessel.Error("TESSEL:host:moduleNotFound", f"There is no module {name}.")
+
+    monkeypatch.setattr(tessel, "load", lost)
+    for arguments in (["info", field], ["check", field]):
+        assert one_line(run(capsys, *arguments)) == "There is no module netcdf."
+    monkeypatch.undo()
+    for arguments in ([], ["--guard", "off"]):
+        assert one_line(run(capsys, "info", *arguments, "http://[")).endswith(": http://[")
+
+
+@pytest.mark.parametrize("before", [None, "on", "remote"])
+def test_the_guard_of_a_command_is_its_own(capsys, field, monkeypatch, before):
+    if before is None:
+        monkeypatch.delenv("TESSEL_GUARD", raising=False)
+    else:
+        monkeypatch.setenv("TESSEL_GUARD", before)
+    for guard, address in (("off", "http://["), ("on", "http://["), ("off", field)):
+        run(capsys, "info", "--guard", guard, address)
+        assert os.environ.get("TESSEL_GUARD") == before
+
+
+WITHOUT = "import sys; sys.modules[{0!r}] = None; from {1} import main; sys.exit(main(sys.argv[1:]))"
+
+
+@pytest.mark.parametrize(("library", "program", "arguments"), [
+    ("cftime", "tessel.command", ["info", "field.nc"]),
+    ("cftime", "tessel.command", ["plot", "field.nc", "s", "-o", "a.png"]),
+    ("cftime", "tessel.show", ["field.nc"]),
+    ("matplotlib", "tessel.command", ["plot", "field.nc", "t", "-o", "a.png"]),
+    ("matplotlib", "tessel.show", ["field.nc", "profile"])])
+def test_a_library_that_is_not_installed(field, library, program, arguments):
+    folder = Path(field).parent
+    done = subprocess.run([sys.executable, "-B", "-c", WITHOUT.format(library, program),
+                           *arguments], cwd=folder, capture_output=True, text=True, check=False)
+    name = "tessel: " if program == "tessel.command" else ""
+    assert (done.returncode, done.stderr) == (
+        1, f"{name}This needs {library}, which is not installed; Debian has it in the package "
+           f"python3-{library}.\n")
+    assert "a.png" not in os.listdir(folder)
+
+
+def test_what_needs_no_other_library(tmp_path):
+    """Neither Matplotlib nor, without times, cftime."""
+    generate(tmp_path / "a.nc", "dimensions: x = 2 ; variables: int a(x) ; data: a = 1, 2 ;")
+    code = "import sys; sys.modules['matplotlib'] = None; " + WITHOUT.format(
+        "cftime", "tessel.command")
+    for arguments in (["info", "a.nc"], ["check", "a.nc"], ["copy", "a.nc", "b.nc"], ["ops"]):
+        subprocess.run([sys.executable, "-B", "-c", code, *arguments], cwd=tmp_path, check=True,
+                       stdout=subprocess.DEVNULL)
 
 
 def test_memory_that_is_not_there(capsys, field, monkeypatch):

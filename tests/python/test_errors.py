@@ -18,7 +18,7 @@ import pytest
 import tessel
 import tessel.sample
 from made_files import generate
-from tessel import beginning, errors, netcdf, notes
+from tessel import beginning, errors, netcdf, notes, wording
 from tessel.errors import BUILT_INS, CLASSES, SYSTEM_ERRORS, WITHOUT_BUILT_IN, Error
 
 ROOT = Path(__file__).parents[2]
@@ -64,7 +64,7 @@ def words_in(files: typing.Iterable[Path], pattern: str) -> set[str]:
 
 
 def test_every_word_is_in_the_table() -> None:
-    """Those of the module's catalogue and statuses, of the host and of this package."""
+    """Those of the module's catalogue and statuses, of the guard, the host and this package."""
     module = ROOT / "module"
     full = words_in(module.rglob("*.?pp"), r'"TESSEL:[\w:]*?(\w+)"')
     rests = words_in([module / "call" / "catalogue.hpp"], r'\{":?(\w+)",\s+"[^"]*%s')
@@ -73,10 +73,12 @@ def test_every_word_is_in_the_table() -> None:
     full |= {rest for rest in rests if not rest.startswith("Argument")}
     statuses = words_in([module / "call" / "status.cpp"], r'"(\w+)"')
     host = words_in((ROOT / "runtime").rglob("*.?pp"), r'"TESSEL:host:(\w+)"')
+    guard = words_in((ROOT / "guard" / "src").glob("*.?pp"), r'"TESSEL:guard:(\w+)"')
     own = words_in((ROOT / "python" / "src").glob("*.cpp"), r'refuse\(\s*"(\w+)"')
     own |= words_in((ROOT / "python" / "tessel").rglob("*.py"), r'"TESSEL:python:(\w+)"')
     assert len(full) > 50 and len(statuses) > 60 and len(host) > 10 and len(own) > 15
-    assert (full | statuses | host | own) - set(WORDS) == set()
+    assert guard == {"alignment", "closed", "counts", "header", "mode", "records", "remote"}
+    assert (full | statuses | guard | host | own) - set(WORDS) == set()
 
 
 def test_no_word_is_there_twice() -> None:
@@ -465,6 +467,14 @@ def test_names_from_files_cannot_steer_a_terminal(ncid: int) -> None:
     assert "evil\\x1b[2J.nc" in error.__notes__[0]
     nc.close(evil)
 
+
+def test_a_file_is_named_once() -> None:
+    """Also one whose name is shown with escapes."""
+    for name in ("missing.nc", "evil\033[2J.nc"):
+        told = "\n".join(failure(tessel.read, name, "v").__notes__)
+        assert told.count("file: ") == 1
+
+
 def test_an_id_used_again_keeps_its_new_path(monkeypatch: pytest.MonkeyPatch) -> None:
     """Another thread may open a file between the end of a call of close and its record."""
     monkeypatch.setitem(netcdf._opened, 7, ("/the-same.nc",))
@@ -490,7 +500,7 @@ def test_an_id_used_again_keeps_its_new_path(monkeypatch: pytest.MonkeyPatch) ->
     (numpy.array([[1] * 99, None], object), "<object array of shape (2,): "
      "[[1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, 1, ...], None]>")], ids=lambda each: None)
 def test_arguments_are_shortened(value: object, shown: str) -> None:
-    assert notes.shortened(value) == shown
+    assert wording.abridged(value) == shown
 
 
 class Counted(str):
@@ -508,7 +518,7 @@ class Counted(str):
     {i: Counted() for i in range(10**5)}, [[[Counted()] * 10**3] * 10**3]], ids=lambda each: None)
 def test_a_large_argument_is_never_written_whole(large: object) -> None:
     Counted.written = 0
-    assert len(notes.shortened(large)) <= 63
+    assert len(wording.abridged(large)) <= 63
     assert Counted.written < 200
 
 

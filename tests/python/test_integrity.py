@@ -14,7 +14,7 @@ import tessel
 from made_files import (BYTE, CHAR, DOUBLE, EVERYTHING, FLOAT, INT, MEMBERS, NOFILL, OFFSET64,
                         SHORT, generate, netcdf, run_tool)
 from scipy.io import netcdf_file
-from tessel import notes
+from tessel import wording
 from tessel.dataset import Dataset
 
 TOO_SHORT = "TESSEL:python:fileTooShort"
@@ -183,7 +183,7 @@ def test_real_file_cut(tmp_path, missing):
     assert raised.value.message == (f"The file is cut off: it has {len(data) - missing} bytes, and "
                                     f"what is in it needs {len(data)}.")
     assert raised.value.path == str(cut) and raised.value.operation == "check"
-    assert raised.value.__notes__ == [f"in tessel.check(path={notes.shortened(cut)})\nfile: {cut}"]
+    assert raised.value.__notes__ == [f"in tessel.check(path={wording.abridged(cut)})\nfile: {cut}"]
 
 
 def test_what_the_library_does_with_a_cut_file_and_who_refuses_it(tmp_path):

@@ -315,12 +315,14 @@ def test_progress_of_copying(everything, tmp_path):
         assert done == sorted(set(done))
 
 
-def test_the_default_format_is_not_touched(everything, tmp_path):
-    before = netcdf("set_default_format", 2)
+@pytest.mark.parametrize("default", [1, 2, 3, 4])
+@pytest.mark.parametrize(("form", "mark"), [("classic", b"CDF\1"), ("64bit-offset", b"CDF\2")])
+def test_the_default_format_is_neither_used_nor_touched(everything, tmp_path, form, mark, default):
+    before = netcdf("set_default_format", default)
     try:
-        tessel.copy(everything, tmp_path / "copy.nc", "classic")
-        assert (tmp_path / "copy.nc").read_bytes()[:4] == b"CDF\1"
-        assert netcdf("set_default_format", 2)[0, 0] == 2
+        tessel.copy(everything, tmp_path / "copy.nc", form)
+        assert (tmp_path / "copy.nc").read_bytes()[:4] == mark
+        assert netcdf("set_default_format", default)[0, 0] == default
     finally:
         netcdf("set_default_format", before)
 

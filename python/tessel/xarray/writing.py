@@ -16,7 +16,7 @@ from xarray.backends.common import AbstractWritableDataStore
 from xarray.conventions import _update_bounds_encoding, cf_encoder
 
 import tessel
-from tessel import integrity, notes, paths
+from tessel import integrity, notes, paths, wording
 from tessel.aside import written_aside
 from tessel.dataset import Dataset
 from tessel.new_dataset import NewDataset
@@ -61,7 +61,7 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
     form = _format(format)
     if mode not in ("w", "a"):
         raise tessel.Error("TESSEL:python:badMode",
-                           f"The mode is w or a, not {notes.shortened(mode)}.")
+                           f"The mode is w or a, not {wording.abridged(mode)}.")
     size, tell = block_size(block_bytes), listener(progress)
     target = paths.given(path)
     adding = mode == "a" and os.path.exists(target)
@@ -80,7 +80,7 @@ def _format(name: str | None) -> str:
     form = FORMATS.get("NETCDF3_64BIT" if name is None else str(name).upper())
     if form is None:
         raise tessel.Error("TESSEL:python:badFormat", "The format is one of NETCDF3_64BIT, "
-                           f"NETCDF3_CLASSIC, not {notes.shortened(name)}.")
+                           f"NETCDF3_CLASSIC, not {wording.abridged(name)}.")
     return form
 
 
