@@ -564,6 +564,17 @@ def test_values_are_packed_again_in_another_way(tmp_path: Path) -> None:
         to_netcdf(made, path, mode="a")  # not packed
 
 
+@pytest.mark.parametrize("file_format", ["NETCDF4", "NETCDF4_CLASSIC"])
+def test_adding_to_a_file_of_another_format(tmp_path: Path, file_format: str) -> None:
+    path = tmp_path / "x.nc"
+    xr.Dataset({"x": ("t", [1])}).to_netcdf(path, engine="netcdf4", format=file_format)
+    before = path.read_bytes()
+    with pytest.raises(OSError, match="Variables can be added to files of the classic") as raised:
+        to_netcdf(xr.Dataset({"y": ("t", [1])}), path, mode="a")
+    assert raised.value.word == "notAClassicFile" and raised.value.path == str(path)
+    assert path.read_bytes() == before
+
+
 def test_a_file_that_cannot_be_added_to_is_closed(tmp_path: Path,
                                                   monkeypatch: pytest.MonkeyPatch) -> None:
     path = tmp_path / "x.nc"

@@ -209,8 +209,13 @@ def _descriptor_of(path: str) -> int:
 
 
 def _not_ours(path: str) -> tessel.Error:
-    return refusal("notAClassicFile", "The engine \"tessel\" opens files of the classic and of the "
-                   "64-bit offset format, and this is none of them.", path)
+    return not_classic("The engine \"tessel\" opens", path)
+
+
+def not_classic(who_does_what: str, path: str) -> tessel.Error:
+    """The error for a file that is in neither of the two formats."""
+    return refusal("notAClassicFile", f"{who_does_what} files of the classic and of the 64-bit "
+                   "offset format, and this is none of them.", path)
 
 
 def refusal(word: str, message: str, path: str) -> tessel.Error:

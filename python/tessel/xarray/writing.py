@@ -21,7 +21,7 @@ from tessel.aside import written_aside
 from tessel.dataset import Dataset
 from tessel.new_dataset import NewDataset
 from tessel.transfer import BLOCK_BYTES, Progress, block_size, blocks, listener
-from tessel.xarray import fitting
+from tessel.xarray import fitting, opening
 from tessel.xarray.blocks import BlockWriter, Slot
 
 FORMATS = {"NETCDF3_64BIT": "64bit-offset", "NETCDF3_64BIT_OFFSET": "64bit-offset",
@@ -35,7 +35,7 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
               unlimited_dims: Hashable | Iterable[Hashable] | None = None,
               encoding: Mapping[Any, Mapping[str, Any]] | None = None,
               progress: Progress | None = None, block_bytes: int = BLOCK_BYTES) -> None:
-    """Writes a dataset into a file of a classic format.
+    """Writes a dataset into a file of the classic or of the 64-bit offset format.
 
         >>> packed = {"dtype": "int16", "scale_factor": 0.01, "_FillValue": -999}
         >>> tessel.xarray.to_netcdf(dataset, "sst.nc", encoding={"sst": packed})
@@ -65,6 +65,8 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
     size, tell = block_size(block_bytes), listener(progress)
     target = paths.given(path)
     adding = mode == "a" and os.path.exists(target)
+    if adding and os.path.isfile(target) and not opening.is_ours(target):
+        raise opening.not_classic("Variables can be added to", target)
     writer = BlockWriter()
     with written_aside(target, overwrite=True) as temporary:
         if adding:
