@@ -33,6 +33,7 @@ import tessel
 from measuring import NOISE, Work, measure, put_between_marks
 
 FORMAT = "NETCDF3_64BIT_OFFSET"
+MAPPED = 16  # the library's mode flag for mapping a file, which is none of its named constants
 TEN = 10
 
 Places = list[tuple[int, int, int]]
@@ -59,12 +60,14 @@ class Bench:
         self.times = times
         self.path, self.new = folder / "data.nc", folder / "new.nc"
         self.nc = tessel.load("netcdf")
+        self.unguarded = tessel.load("netcdf", guard="off")
         self.shape = (length, 256, 512)
         self.data = np.arange(float(np.prod(self.shape))).reshape(self.shape)
         self.write_netcdf4(True)
         self.path.unlink(missing_ok=True)
         self.write_tessel()
-        self.ncid = int(self.nc("open", self.path, "NOWRITE")[0, 0])
+        self.ncid = self.nc.open(self.path, "NOWRITE")
+        self.mapped = self.nc.open(self.path, MAPPED)
         self.varid = int(self.nc("inq_varid", self.ncid, "v")[0, 0])
         self.dataset = netCDF4.Dataset(self.path)
         self.variable = self.dataset["v"]
@@ -77,12 +80,19 @@ class Bench:
 
     def close(self) -> None:
         self.dataset.close()
-        self.nc("close", self.ncid)
+        self.nc.close(self.ncid)
+        self.nc.close(self.mapped)
 
     # One element and ten. The host's order of dimensions is the reverse of the library's.
 
     def element_tessel(self, places: Places) -> float:
-        nc, ncid, varid = self.nc, self.ncid, self.varid
+        return self.element_of(self.ncid, places)
+
+    def element_mapped(self, places: Places) -> float:
+        return self.element_of(self.mapped, places)
+
+    def element_of(self, ncid: int, places: Places) -> float:
+        nc, varid = self.nc, self.varid
         for t, y, x in places:
             value = nc("get_var1_double", ncid, varid, [x, y, t])
         return value[0, 0]
@@ -154,9 +164,9 @@ class Bench:
 
     # Opening and closing.
 
-    def open_tessel(self) -> None:
+    def open_tessel(self, nc: tessel.Netcdf) -> None:
         for _ in range(self.times):
-            self.nc("close", self.nc("open", self.path, "NOWRITE"))
+            nc("close", nc("open", self.path, "NOWRITE"))
 
     def open_netcdf4(self) -> None:
         for _ in range(self.times):
@@ -187,8 +197,14 @@ class Bench:
         ]
         return [
             *small,
-            Row("open and close", "µs", 1, self.open_tessel,
-                lambda mask: self.open_netcdf4, self.times),
+            Row("one element, anywhere in the file, mapped", "µs", None,
+                partial(self.element_mapped, self.anywhere),
+                self.masked(partial(self.element_netcdf4, self.anywhere)), self.times),
+            *(Row(name, "µs", expected, partial(self.open_tessel, nc),
+                  lambda mask: self.open_netcdf4, self.times)
+              for name, expected, nc in (
+                  ("open and close", 1, self.nc),
+                  ("open and close, without the guard", None, self.unguarded))),
             Row(f"read {large}", "ms", 1, self.read_tessel,
                 self.masked(self.read_netcdf4), 1),
             Row(f"write {large} to a new file", "ms", 1, self.write_tessel,
