@@ -3,6 +3,9 @@
 
 #include <algorithm>
 #include <array>
+#include <cstdint>
+#include <cstring>
+#include <limits>
 #include <type_traits>
 #include <vector>
 
@@ -41,8 +44,8 @@ bool isSurrogate(char32_t c) noexcept {
     return c >= firstSurrogate && c <= lastSurrogate;
 }
 
-/// The first character of a text that is not empty.
-Read readUtf8(std::string_view text) noexcept {
+/// The first character of UTF-8 that is not empty; a byte that begins none stands for itself.
+Read readFirst(std::span<const char> text) noexcept {
     const auto byte = [&](std::size_t i) { return static_cast<unsigned char>(text[i]); };
     const Read single = {byte(0), 1};
     for (const Form &form : forms) {
@@ -67,7 +70,7 @@ Read readUtf8(std::string_view text) noexcept {
 }
 
 /// The first character of host characters that are not empty.
-Read readUtf16(std::span<const tsChar> text) noexcept {
+Read readFirst(std::span<const tsChar> text) noexcept {
     const char32_t first = text[0];
     if (!isSurrogate(first)) {
         return {first, 1};
@@ -92,30 +95,52 @@ const Form &formOf(char32_t character) noexcept {
 }
 
 /// ASCII characters are the same in both forms, and most texts have no others.
-bool isAscii(unsigned unit) noexcept {
-    return unit < 0x80;
+template <class Unit>
+bool isAscii(Unit unit) noexcept {
+    return static_cast<std::make_unsigned_t<Unit>>(unit) < 0x80;
 }
 
-/// How many ASCII characters a text begins with, of as many as are looked at together. Without a
-/// way out of its middle, the loop over them is one that the compiler can make of vectors; what is
-/// done with them next finds them in the nearest cache.
-template <class Text>
-std::size_t asciiAtOnce(const Text &text) noexcept {
-    constexpr std::size_t most = 256;
-    using Unit = std::make_unsigned_t<std::remove_const_t<typename Text::value_type>>;
-    const std::size_t length = std::min(most, text.size());
-    Unit all = 0;
-    for (std::size_t i = 0; i < length; ++i) {
-        all = static_cast<Unit>(all | static_cast<Unit>(text.data()[i]));
-    }
-    if (isAscii(all)) {
-        return length;
-    }
+/// How many ASCII characters a text begins with, or fewer where they are very many: what is done
+/// with them next finds them in the nearest cache. They are looked at a word at a time, and so it
+/// takes hardly longer than they are many, however often others stand between them.
+template <class Unit>
+std::size_t asciiRun(std::span<const Unit> text) noexcept {
+    constexpr std::uint64_t largest = std::numeric_limits<std::make_unsigned_t<Unit>>::max();
+    constexpr std::uint64_t notAscii = ~std::uint64_t{0} / largest * (largest - 0x7F);
+    constexpr std::size_t units = sizeof(notAscii) / sizeof(Unit);
+    constexpr std::size_t most = 4096;
+    const std::size_t end = std::min(most, text.size());
     std::size_t ascii = 0;
-    while (isAscii(static_cast<Unit>(text.data()[ascii]))) {
+    for (; ascii + units <= end; ascii += units) {
+        std::uint64_t word = 0;
+        std::memcpy(&word, text.data() + ascii, sizeof(word));
+        if ((word & notAscii) != 0) {
+            break;
+        }
+    }
+    while (ascii < end && isAscii(text[ascii])) {
         ++ascii;
     }
     return ascii;
+}
+
+/// Goes through a text with a result so far, which `ofRun` takes further with characters that are
+/// ASCII, many at once, and `ofCharacter` with each other one. Gives back what has become of it.
+template <class Unit, class Result, class OfRun, class OfCharacter>
+Result fold(std::span<const Unit> text, Result result, OfRun ofRun,
+            OfCharacter ofCharacter) noexcept {
+    while (!text.empty()) {
+        if (isAscii(text.front())) {
+            const std::size_t ascii = asciiRun(text);
+            result = ofRun(result, text.first(ascii));
+            text = text.subspan(ascii);
+        } else {
+            const Read read = readFirst(text);
+            result = ofCharacter(result, read.character);
+            text = text.subspan(read.units);
+        }
+    }
+    return result;
 }
 
 /// One pass over the text, as wide as the compiler's vectors are; it ends within a page or so of
@@ -146,79 +171,61 @@ bool copyIfAscii(std::span<const tsChar> utf16, char *out) noexcept {
 }
 
 std::size_t utf16Length(std::string_view utf8) noexcept {
-    std::size_t length = 0;
-    while (!utf8.empty()) {
-        if (isAscii(static_cast<unsigned char>(utf8.front()))) {
-            const std::size_t ascii = asciiAtOnce(utf8);
-            length += ascii;
-            utf8.remove_prefix(ascii);
-            continue;
-        }
-        const Read read = readUtf8(utf8);
-        length += read.character >= firstSupplementary ? 2 : 1;
-        utf8.remove_prefix(read.units);
-    }
-    return length;
+    return fold(
+        std::span(utf8), std::size_t{0},
+        [](std::size_t length, std::span<const char> ascii) { return length + ascii.size(); },
+        [](std::size_t length, char32_t character) {
+            return length + (character >= firstSupplementary ? 2 : 1);
+        });
 }
 
 void writeUtf16(std::string_view utf8, tsChar *out) noexcept {
-    while (!utf8.empty()) {
-        if (isAscii(static_cast<unsigned char>(utf8.front()))) {
-            const std::size_t ascii = asciiAtOnce(utf8);
-            out = std::copy_n(utf8.begin(), ascii, out);
-            utf8.remove_prefix(ascii);
-            continue;
-        }
-        const Read read = readUtf8(utf8);
-        if (read.character >= firstSupplementary) {
-            const char32_t offset = read.character - firstSupplementary;
-            *out++ = static_cast<tsChar>(firstSurrogate + (offset >> 10U));
-            *out++ = static_cast<tsChar>(firstLowSurrogate + (offset & 0x3FFU));
-        } else {
-            *out++ = static_cast<tsChar>(read.character);
-        }
-        utf8.remove_prefix(read.units);
-    }
+    fold(
+        std::span(utf8), out,
+        [](tsChar *to, std::span<const char> ascii) {
+            return std::copy(ascii.begin(), ascii.end(), to);
+        },
+        [](tsChar *to, char32_t character) {
+            if (character >= firstSupplementary) {
+                const char32_t offset = character - firstSupplementary;
+                *to++ = static_cast<tsChar>(firstSurrogate + (offset >> 10U));
+                *to++ = static_cast<tsChar>(firstLowSurrogate + (offset & 0x3FFU));
+            } else {
+                *to++ = static_cast<tsChar>(character);
+            }
+            return to;
+        });
 }
 
 std::size_t utf8Length(std::span<const tsChar> utf16) noexcept {
-    std::size_t length = 0;
-    while (!utf16.empty()) {
-        if (isAscii(utf16.front())) {
-            const std::size_t ascii = asciiAtOnce(utf16);
-            length += ascii;
-            utf16 = utf16.subspan(ascii);
-            continue;
-        }
-        const Read read = readUtf16(utf16);
-        length += formOf(read.character).bytes;
-        utf16 = utf16.subspan(read.units);
-    }
-    return length;
+    return fold(
+        utf16, std::size_t{0},
+        [](std::size_t length, std::span<const tsChar> ascii) { return length + ascii.size(); },
+        [](std::size_t length, char32_t character) { return length + formOf(character).bytes; });
 }
 
 void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept {
-    while (!utf16.empty()) {
-        if (isAscii(utf16.front())) {
-            const auto ascii = utf16.first(asciiAtOnce(utf16));
-            out = std::transform(ascii.begin(), ascii.end(), out,
-                                 [](tsChar unit) { return static_cast<char>(unit); });
-            utf16 = utf16.subspan(ascii.size());
-            continue;
-        }
-        const Read read = readUtf16(utf16);
-        const Form &form = formOf(read.character);
-        for (std::size_t i = form.bytes; i-- > 0;) {
-            const auto shift = static_cast<unsigned>(6 * (form.bytes - 1 - i));
-            const auto bits = static_cast<unsigned>(read.character >> shift);
-            out[i] = static_cast<char>(i == 0 ? form.lead | bits : 0x80U | (bits & 0x3FU));
-        }
-        out += form.bytes;
-        utf16 = utf16.subspan(read.units);
-    }
+    fold(
+        utf16, out,
+        [](char *to, std::span<const tsChar> ascii) {
+            return std::transform(ascii.begin(), ascii.end(), to,
+                                  [](tsChar unit) { return static_cast<char>(unit); });
+        },
+        [](char *to, char32_t character) {
+            const Form &form = formOf(character);
+            for (std::size_t i = form.bytes; i-- > 0;) {
+                const auto shift = static_cast<unsigned>(6 * (form.bytes - 1 - i));
+                const auto bits = static_cast<unsigned>(character >> shift);
+                to[i] = static_cast<char>(i == 0 ? form.lead | bits : 0x80U | (bits & 0x3FU));
+            }
+            return to + form.bytes;
+        });
 }
 
 std::string validUtf8(std::string_view text) {
+    if (asciiRun(std::span(text)) == text.size()) {
+        return std::string(text);
+    }
     std::vector<tsChar> characters(utf16Length(text));
     writeUtf16(text, characters.data());
     std::string valid(utf8Length(characters), '\0');

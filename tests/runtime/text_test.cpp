@@ -174,6 +174,29 @@ TEST(Text, OneCharacterAmongManyThatAreAscii) {
     }
 }
 
+/// Or often: between two of them there are none, one, and so on up to more than a word of a
+/// processor holds.
+TEST(Text, CharactersBetweenFewThatAreAscii) {
+    const Module good(testModule("good"));
+    const std::vector<std::pair<std::string, std::u16string>> others = {
+        {"\xc3\xa9", u"\u00e9"}, {"\xe6\xb0\xb4", u"\u6c34"}, {"\xf0\x9f\x98\x80", u"\U0001f600"}};
+    for (const auto &[bytes, units] : others) {
+        for (std::size_t run = 0; run < 20; ++run) {
+            SCOPED_TRACE(testing::Message() << run << " before each " << bytes);
+            std::string utf8;
+            std::u16string characters;
+            for (std::size_t i = 0; i < 50; ++i) {
+                utf8.append(run, static_cast<char>('a' + i % 26)).append(bytes);
+                characters.append(run, static_cast<char16_t>(u'a' + i % 26)).append(units);
+            }
+            const Array text = Array::text(utf8);
+            ASSERT_EQ(charactersOf(text), characters);
+            ASSERT_EQ(text.utf8(), utf8);
+            ASSERT_EQ(good("text", text)[0].utf8(), utf8);
+        }
+    }
+}
+
 TEST(Text, ShapeIsNotText) {
     constexpr std::array<std::size_t, 2> dims = {2, 2};
     const Array array = Array::characters(dims);
