@@ -16,6 +16,9 @@ install(FILES
     ${CMAKE_CURRENT_LIST_DIR}/tessel-add-module.cmake
     DESTINATION ${package_dir} COMPONENT development)
 
+# Where it is installed is known when it is used: packages are made for another prefix than this.
+file(RELATIVE_PATH to_prefix /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
+string(REGEX REPLACE "/$" "" to_prefix ${to_prefix})
 configure_file(${CMAKE_CURRENT_LIST_DIR}/tessel.pc.in ${CMAKE_BINARY_DIR}/tessel.pc @ONLY)
 install(FILES ${CMAKE_BINARY_DIR}/tessel.pc
     DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)

@@ -65,7 +65,7 @@ def put_together(source: Path) -> None:
         for folder in (source, source / "concepts", source / "howto", source / "inside"):
             shutil.copy(picture, folder)
     shutil.copytree(ROOT / "examples", source / "code")
-    make_reference.write(make_reference.rst_pages(), source / "reference")
+    make_reference.write(make_reference.encoded(make_reference.rst_pages()), source / "reference")
 
 
 def run(*command: str | Path, **more: object) -> str:

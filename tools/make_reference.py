@@ -9,6 +9,7 @@ Everything comes from the package's tables; what a page consists of is in tessel
 from __future__ import annotations
 
 import argparse
+import gzip
 import re
 import sys
 from collections.abc import Callable, Iterable
@@ -284,16 +285,26 @@ def rst_pages() -> dict[str, str]:
             **{f"{each.short}.rst": rst_page(each) for each in OPERATIONS}}
 
 
-def write(pages: dict[str, str], folder: Path) -> None:
+def compressed(pages: dict[str, str]) -> dict[str, bytes]:
+    """Pages as manual pages are installed, with nothing in them of when that was."""
+    return {f"{name}.gz": gzip.compress(text.encode(), mtime=0) for name, text in pages.items()}
+
+
+def encoded(pages: dict[str, str]) -> dict[str, bytes]:
+    """Pages as they are."""
+    return {name: text.encode() for name, text in pages.items()}
+
+
+def write(files: dict[str, bytes], folder: Path) -> None:
     """Writes what is new or different, so that builds after this see what has changed."""
-    for name, text in pages.items():
+    for name, content in files.items():
         file = folder / name
         file.parent.mkdir(parents=True, exist_ok=True)
-        if not file.exists() or file.read_text() != text:
-            file.write_text(text)
+        if not file.exists() or file.read_bytes() != content:
+            file.write_bytes(content)
 
 
 if __name__ == "__main__":
     if len(sys.argv) != 3 or sys.argv[1] not in ("man", "rst"):
         sys.exit(__doc__)
-    write(man() if sys.argv[1] == "man" else rst_pages(), Path(sys.argv[2]))
+    write(compressed(man()) if sys.argv[1] == "man" else encoded(rst_pages()), Path(sys.argv[2]))

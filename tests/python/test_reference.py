@@ -174,7 +174,7 @@ def test_the_index_has_all() -> None:
 
 def test_manual_pages_are_clean(tmp_path: Path) -> None:
     """The formatter has nothing to complain of in any of them."""
-    make_reference.write(MAN, tmp_path)
+    make_reference.write(make_reference.encoded(MAN), tmp_path)
     assert len(MAN) == 104
     run = subprocess.run(["groff", "-man", "-ww", "-Tutf8", "-z", *(str(tmp_path / each)
                                                                   for each in MAN)],

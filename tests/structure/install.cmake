@@ -13,7 +13,7 @@ function(expect printed)
 endfunction()
 
 set(ENV{PKG_CONFIG_PATH} ${lib}/pkgconfig)
-execute_process(COMMAND pkg-config --define-prefix --cflags --libs tessel
+execute_process(COMMAND pkg-config --cflags --libs tessel
     OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
 separate_arguments(flags)
 execute_process(COMMAND ${COMPILER} -std=c++20 ${PROGRAM} ${flags} -Wl,-rpath,${lib}
