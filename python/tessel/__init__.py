@@ -60,6 +60,7 @@ unknown              tessel.Unknown                      tessel.Unknown
 
 from __future__ import annotations
 
+import functools
 import os
 from typing import Literal, get_args, overload
 
@@ -93,12 +94,24 @@ def load(module: str | os.PathLike[str], guard: Guard | None = None) -> Module:
     has a method for every operation and a guard: it refuses the few calls that the netCDF library
     does not survive, and file names that are addresses, which the library would fetch
     (identifiers that begin with "TESSEL:guard:"). `guard` is "on", "remote" (addresses are
-    allowed) or "off"; None takes it from the variable TESSEL_GUARD, and "on" without one.
+    allowed) or "off"; None takes it from the variable TESSEL_GUARD, and "on" without one. A name is
+    looked up once: as long as the guard and the folders are the same, so is the object.
     """
-    loaded = _load(module)
+    chosen = os.environ.get("TESSEL_GUARD", "on") if guard is None else guard
+    if type(module) is type(chosen) is str and "/" not in module:
+        return _kept(module, chosen, os.environ.get("TESSEL_MODULE_PATH"))
+    return _guarded(_load(module), chosen)
+
+
+@functools.lru_cache
+def _kept(module: str, chosen: str, _folders: str | None) -> Module:
+    """To find a module takes longer than to open a file, and whatever opens one loads it."""
+    return _guarded(_load(module), chosen)
+
+
+def _guarded(loaded: Module, chosen: str) -> Module:
     if loaded.file.name != "netcdf.tsx":
         return loaded
-    chosen = os.environ.get("TESSEL_GUARD", "on") if guard is None else guard
     if chosen not in get_args(Guard):
         raise Error("TESSEL:python:badGuard", f"A guard is one of {', '.join(get_args(Guard))}, "
                                               f"and not {chosen!r}.")

@@ -68,6 +68,25 @@ def test_a_word_that_is_no_guard(monkeypatch, argument, variable):
     assert "on, remote, off" in raised.value.message
 
 
+def test_a_name_is_looked_up_once_for_each_guard_and_folder(tmp_path, monkeypatch):
+    """And a path each time."""
+    monkeypatch.delenv("TESSEL_GUARD", raising=False)
+    on, off = tessel.load("netcdf"), tessel.load("netcdf", "off")
+    assert on is not off and tessel.load("netcdf", "on") is on and tessel.load("netcdf") is on
+    monkeypatch.setenv("TESSEL_GUARD", "off")
+    assert tessel.load("netcdf") is off
+    copy = tmp_path / "netcdf.tsx"
+    copy.write_bytes(on.file.read_bytes())
+    monkeypatch.setenv("TESSEL_MODULE_PATH", str(tmp_path))
+    assert tessel.load("netcdf", "on").file == copy
+    monkeypatch.undo()
+    assert tessel.load("netcdf", "on") is on
+    monkeypatch.chdir(tmp_path)  # where another folder could follow
+    assert tessel.load("./netcdf.tsx") is not tessel.load("./netcdf.tsx")
+    with pytest.raises(ValueError, match="A guard is one of"):
+        tessel.load("netcdf", [])
+
+
 def test_read_and_check_refuse_addresses_too():
     for call in (lambda: tessel.read("https://127.0.0.1:1/a.nc", "v"),
                  lambda: tessel.check("https://127.0.0.1:1/a.nc"),
