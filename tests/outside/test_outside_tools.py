@@ -19,7 +19,7 @@ netcdf = tessel.load("netcdf")
 
 CLASSIC, OFFSET64 = 0, 512
 FORMATS = {"classic": CLASSIC, "64-bit offset": OFFSET64}
-COLUMNS, RECORDS = 6, 3
+COLUMNS, RECORDS = 8, 3
 
 
 class External(NamedTuple):
@@ -44,14 +44,16 @@ class External(NamedTuple):
 
 F32, F64 = numpy.finfo(numpy.float32), numpy.finfo(numpy.float64)
 TYPES = [
-    External("byte", 1, "schar", numpy.dtype("i1"), [-128, -1, 0, 1, 100, 127]),
-    External("char", 2, "text", numpy.dtype("S1"), [b"a", b"Z", b" ", b'"', b"\\", b"~"]),
-    External("short", 3, "short", numpy.dtype("i2"), [-32768, -1, 0, 1, 258, 32767]),
-    External("int", 4, "int", numpy.dtype("i4"), [-(2**31), -1, 0, 1, 16909060, 2**31 - 1]),
+    External("byte", 1, "schar", numpy.dtype("i1"), [-128, -1, 0, 1, 100, 127, -2, 2]),
+    # Bytes beyond ASCII, none of which begin a character of UTF-8 here, and NUL within the text.
+    External("char", 2, "text", numpy.dtype("S1"),
+             [b"a", b"\xe9", b"\0", b'"', b"\\", b"~", b" ", b"\xff"]),
+    External("short", 3, "short", numpy.dtype("i2"), [-32768, -1, 0, 1, 258, 32767, -2, 2]),
+    External("int", 4, "int", numpy.dtype("i4"), [-(2**31), -1, 0, 1, 16909060, 2**31 - 1, -2, 2]),
     External("float", 5, "float", numpy.dtype("f4"),
-             [F32.min, -0.0, F32.smallest_subnormal, 0.1, numpy.inf, F32.max]),
+             [F32.min, -0.0, F32.smallest_subnormal, 0.1, numpy.inf, F32.max, -numpy.inf, 1e-9]),
     External("double", 6, "double", numpy.dtype("f8"),
-             [F64.min, -0.0, F64.smallest_subnormal, 0.1, numpy.inf, F64.max]),
+             [F64.min, -0.0, F64.smallest_subnormal, 0.1, numpy.inf, F64.max, -numpy.inf, 1e-9]),
 ]
 each_type = pytest.mark.parametrize("external", TYPES, ids=lambda t: t.name)
 each_format = pytest.mark.parametrize("mode", FORMATS.values(), ids=FORMATS.keys())
@@ -80,11 +82,20 @@ def for_host(external: External, values: numpy.ndarray):
 
 def from_host(external: External, result) -> numpy.ndarray:
     """A result as values of the external type, in the library's order of dimensions."""
-    if isinstance(result, str):
+    if isinstance(result, str):  # of an attribute: what is no UTF-8 has the byte's code
         return numpy.frombuffer(result.encode("latin-1"), "S1")
-    if external.name == "char":
-        return numpy.char.encode(result.T, "latin-1")
+    if external.name == "char":  # of a variable: each byte is widened with its sign
+        codes = numpy.ascontiguousarray(result.T).view(numpy.uint32).astype(numpy.uint16)
+        found = codes.astype(numpy.uint8)
+        assert (codes == found.astype(numpy.int8).astype(numpy.uint16)).all()
+        return found.view("S1")
     return result.T
+
+
+def of_attribute(external: External) -> numpy.ndarray:
+    """What the module reads of an attribute: text ends before a NUL."""
+    values = fixed(external)
+    return values[:external.values.index(b"\0")] if external.name == "char" else values
 
 
 def number(value) -> int:
@@ -135,8 +146,9 @@ def check_with_module(path: Path, external: External) -> None:
             attribute = "a_" + external.name
             kind, length = netcdf("inq_att", ncid, owner, attribute)
             assert (number(kind), number(length)) == (external.code, COLUMNS)
-            found = from_host(external, netcdf(f"get_att_{external.member}", ncid, owner, attribute))
-            assert same(found.ravel(), fixed(external)), attribute
+            values = netcdf(f"get_att_{external.member}", ncid, owner, attribute)
+            found = from_host(external, values)
+            assert same(found.ravel(), of_attribute(external)), attribute
     finally:
         netcdf("close", ncid)
 
@@ -144,16 +156,18 @@ def check_with_module(path: Path, external: External) -> None:
 def run(*command: object) -> str:
     """What a tool prints; a tool that fails, fails the test."""
     return subprocess.run([str(c) for c in command], check=True, capture_output=True,
-                          text=True).stdout
+                          encoding="latin-1").stdout
 
 
 def cdl_values(external: External, text: str) -> numpy.ndarray:
     """The values of a list in ncdump's notation, without the type suffixes of attributes."""
     if external.name == "char":
         strings = re.findall(r'"((?:\\.|[^"\\])*)"', text)
-        return numpy.frombuffer(re.sub(r"\\(.)", r"\1", "".join(strings)).encode("latin-1"), "S1")
+        text = re.sub(r"\\([0-7]{3}|.)", lambda m: chr(int(m[1], 8)) if m[1].isdigit() else m[1],
+                      "".join(strings))
+        return numpy.frombuffer(text.encode("latin-1"), "S1")
     items = [item.strip().rstrip("bsf" if external.code != 5 else "f") for item in text.split(",")]
-    items = [{"In": "inf", "Ininity": "inf"}.get(item, item) for item in items]
+    items = [re.sub("^(-?)In.*", r"\1inf", item) for item in items]
     return numpy.array([external.dtype.type(item) for item in items], external.dtype)
 
 
@@ -185,7 +199,8 @@ def test_ours_through_ncgen(tmp_path: Path, external: External, mode: int) -> No
     write_with_module(tmp_path / "ours.nc", mode)
     text = tmp_path / "text.cdl"
     # ncdump writes the number -0.0 without a point, and ncgen reads that as the integer 0.
-    text.write_text(re.sub(r"-0(?=[,\s])", "-0.", run("ncdump", "-p", "9,17", tmp_path / "ours.nc")))
+    cdl = run("ncdump", "-p", "9,17", tmp_path / "ours.nc")
+    text.write_text(re.sub(r"-0(?=[,\s])", "-0.", cdl), encoding="latin-1")
     run("ncgen", "-k", "classic" if mode == CLASSIC else "64-bit offset", "-o",
         tmp_path / "theirs.nc", text)
     check_with_module(tmp_path / "theirs.nc", external)
@@ -245,3 +260,22 @@ def test_we_read_scipy(tmp_path: Path, external: External, mode: int) -> None:
         setattr(dataset, "a_" + external.name, as_attribute)
         dataset.createVariable(external.records, kind, ("t", "x"))[:] = records(external)
     check_with_module(tmp_path / "theirs.nc", external)
+
+
+@each_format
+def test_text_of_attributes_is_written_as_bytes_and_read_as_utf8(tmp_path: Path, mode: int) -> None:
+    """Others see the low byte of each character of ours; theirs is UTF-8 where it can be."""
+    ncid = netcdf("create", str(tmp_path / "ours.nc"), float(mode))
+    netcdf("put_att_text", ncid, -1, "title", "Gr\u00fc\u00df \u6c34")
+    netcdf("close", ncid)
+    with netcdf_file(tmp_path / "ours.nc", mmap=False) as dataset:
+        assert dataset.title == b"Gr\xfc\xdf \x34"
+    assert ':title = "Gr\xfc\xdf 4" ;' in run("ncdump", tmp_path / "ours.nc")
+
+    with netcdf_file(tmp_path / "theirs.nc", "w", version=1 if mode == CLASSIC else 2) as dataset:
+        dataset.title = "Gr\u00fc\u00df \u6c34 ".encode() + b"\xfc"
+    run("ncks", tmp_path / "theirs.nc", tmp_path / "copied.nc")
+    for name in ("theirs.nc", "copied.nc"):
+        ncid = netcdf("open", str(tmp_path / name), "NOWRITE")
+        assert netcdf("get_att_text", ncid, -1, "title") == "Gr\u00fc\u00df \u6c34 \u00fc"
+        netcdf("close", ncid)
