@@ -32,13 +32,13 @@ struct Functions {
 
 // clang-format off
 constexpr std::tuple types = {
-    Functions<double>{nc_get_att_double, nc_put_att_double, nc_get_var_double, nc_put_var_double, nc_get_var1_double, nc_put_var1_double, nc_get_vara_double, nc_put_vara_double, nc_get_vars_double, nc_put_vars_double},
-    Functions<float>{nc_get_att_float, nc_put_att_float, nc_get_var_float, nc_put_var_float, nc_get_var1_float, nc_put_var1_float, nc_get_vara_float, nc_put_vara_float, nc_get_vars_float, nc_put_vars_float},
-    Functions<int>{nc_get_att_int, nc_put_att_int, nc_get_var_int, nc_put_var_int, nc_get_var1_int, nc_put_var1_int, nc_get_vara_int, nc_put_vara_int, nc_get_vars_int, nc_put_vars_int},
-    Functions<short>{nc_get_att_short, nc_put_att_short, nc_get_var_short, nc_put_var_short, nc_get_var1_short, nc_put_var1_short, nc_get_vara_short, nc_put_vara_short, nc_get_vars_short, nc_put_vars_short},
-    Functions<signed char>{nc_get_att_schar, nc_put_att_schar, nc_get_var_schar, nc_put_var_schar, nc_get_var1_schar, nc_put_var1_schar, nc_get_vara_schar, nc_put_vara_schar, nc_get_vars_schar, nc_put_vars_schar},
-    Functions<unsigned char>{nc_get_att_uchar, nc_put_att_uchar, nc_get_var_uchar, nc_put_var_uchar, nc_get_var1_uchar, nc_put_var1_uchar, nc_get_vara_uchar, nc_put_vara_uchar, nc_get_vars_uchar, nc_put_vars_uchar},
-    Functions<char>{nc_get_att_text, nullptr, nc_get_var_text, nc_put_var_text, nc_get_var1_text, nc_put_var1_text, nc_get_vara_text, nc_put_vara_text, nc_get_vars_text, nc_put_vars_text},
+    Functions<double>       {nc_get_att_double, nc_put_att_double, nc_get_var_double, nc_put_var_double, nc_get_var1_double, nc_put_var1_double, nc_get_vara_double, nc_put_vara_double, nc_get_vars_double, nc_put_vars_double},
+    Functions<float>        {nc_get_att_float,  nc_put_att_float,  nc_get_var_float,  nc_put_var_float,  nc_get_var1_float,  nc_put_var1_float,  nc_get_vara_float,  nc_put_vara_float,  nc_get_vars_float,  nc_put_vars_float},
+    Functions<int>          {nc_get_att_int,    nc_put_att_int,    nc_get_var_int,    nc_put_var_int,    nc_get_var1_int,    nc_put_var1_int,    nc_get_vara_int,    nc_put_vara_int,    nc_get_vars_int,    nc_put_vars_int},
+    Functions<short>        {nc_get_att_short,  nc_put_att_short,  nc_get_var_short,  nc_put_var_short,  nc_get_var1_short,  nc_put_var1_short,  nc_get_vara_short,  nc_put_vara_short,  nc_get_vars_short,  nc_put_vars_short},
+    Functions<signed char>  {nc_get_att_schar,  nc_put_att_schar,  nc_get_var_schar,  nc_put_var_schar,  nc_get_var1_schar,  nc_put_var1_schar,  nc_get_vara_schar,  nc_put_vara_schar,  nc_get_vars_schar,  nc_put_vars_schar},
+    Functions<unsigned char>{nc_get_att_uchar,  nc_put_att_uchar,  nc_get_var_uchar,  nc_put_var_uchar,  nc_get_var1_uchar,  nc_put_var1_uchar,  nc_get_vara_uchar,  nc_put_vara_uchar,  nc_get_vars_uchar,  nc_put_vars_uchar},
+    Functions<char>         {nc_get_att_text,   nullptr,           nc_get_var_text,   nc_put_var_text,   nc_get_var1_text,   nc_put_var1_text,   nc_get_vara_text,   nc_put_vara_text,   nc_get_vars_text,   nc_put_vars_text},
 };
 // clang-format on
 
