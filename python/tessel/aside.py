@@ -63,6 +63,8 @@ def written_aside(target: paths.Path, *, overwrite: bool = False,
     Errors name the target, never the file that is there meanwhile.
     """
     given = paths.given(target)
+    if not given:
+        raise tessel.Error("TESSEL:python:badPath", "The target has no name.")
     wanted = paths.absolute(given)
     _judge(wanted, overwrite, source)
     real = paths.given(os.path.realpath(wanted))

@@ -156,7 +156,7 @@ def _line(error: Exception, options: argparse.Namespace) -> str:
         path = error.path
         if path is None and error.identifier.startswith(_OF_A_FILE):
             path = getattr(options, "file", getattr(options, "source", None))
-        if path is not None:
+        if path:
             message = ": ".join([terminal.with_file(error.message, path), *notes.instead(error)])
     return f"tessel: {message}"
 

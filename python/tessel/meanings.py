@@ -374,7 +374,8 @@ _PYTHON = {
         "A module is named by nothing that can be a name or a path.",
         "Give a name such as netcdf, or a pathlib.Path for a file."),
     "badPath": (
-        "A path has a NUL, or bytes that are no UTF-8.", "Rename the file, or link to it."),
+        "A path has a NUL, or bytes that are no UTF-8, or a new file's is empty.",
+        "Rename the file, or link to it."),
     "badShape": (
         "A shape does not fit what it is for.", "Look at the message, which has both shapes."),
     "characterTooLarge": (

@@ -22,7 +22,7 @@ import numpy
 
 from tessel import beginning, operations, paths, wording
 from tessel.dataset import Dimension, Variable, external_type
-from tessel.errors import Error
+from tessel.errors import SYSTEM_ERRORS, Error
 from tessel.netcdf import Netcdf, path_of
 from tessel.operation import Operation
 
@@ -84,7 +84,7 @@ def _lines_of_function(error: Error, name: str, values: dict[str, Any],
     before = "\n".join(getattr(error, "__notes__", ())).splitlines()
     for each, title in (("path", "file"), ("source", "source"), ("target", "target")):
         value = values.get(each)
-        if isinstance(value, (str, bytes, os.PathLike)):
+        if value and isinstance(value, (str, bytes, os.PathLike)):
             line = f"{title}: {paths.absolute(os.fsdecode(value), folder)}"
             if wording.printable(line) not in before:
                 yield line
@@ -129,7 +129,7 @@ def _file(error: Error, path: Any) -> Iterator[str]:
 def instead(error: Error) -> Iterator[str]:
     """What there is in place of the dataset that an operation was to open or create."""
     path = error.path
-    if path is None or error.operation not in _OPENING:
+    if path is None or error.operation not in _OPENING or not _blames_the_file(error):
         return
     if error.word == "noSuchFileOrDirectory":
         missing, folder = path, os.path.dirname(path)
@@ -142,10 +142,20 @@ def instead(error: Error) -> Iterator[str]:
     elif os.path.isdir(path):
         yield "it is a folder"
     elif error.operation in ("open", "_open") and os.path.isfile(path):
-        yield f"it {beginning.described(path)}"
+        # What the system refuses is not due to what is in the file, unless that cannot be read.
+        if error.word not in SYSTEM_ERRORS or not os.access(path, os.R_OK):
+            yield f"it {beginning.described(path)}"
 
 
-_OPENING = {each.short for each in operations.OPERATIONS if each.opens}
+_OPENING = {each.short: each for each in operations.OPERATIONS if each.opens}
+_OF_ARGUMENTS = {identifier for each in _OPENING.values() for identifier, _ in (
+    each.errors[0], *(error for argument in each.arguments for error in argument.kind.errors))}
+
+
+def _blames_the_file(error: Error) -> bool:
+    """Whether an operation that opens failed over the file, and not over its arguments."""
+    return error.word == "header" or (error.identifier.startswith("TESSEL:netcdf:")
+                                      and error.identifier not in _OF_ARGUMENTS)
 
 
 class _Subject:

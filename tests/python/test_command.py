@@ -366,6 +366,7 @@ def test_errors_that_are_about_no_file(capsys, field, monkeypatch):
     for arguments in (["info", field], ["check", field]):
         assert one_line(run(capsys, *arguments)) == "There is no module netcdf."
     monkeypatch.undo()
+    assert one_line(run(capsys, "info", "")).endswith('Malformed URL"')
     for arguments in ([], ["--guard", "off"]):
         assert one_line(run(capsys, "info", *arguments, "http://[")).endswith(": http://[")
 

@@ -568,6 +568,17 @@ def test_success_makes_no_notes(ncid: int, monkeypatch: pytest.MonkeyPatch) -> N
 
 # Files that are no datasets.
 
+@pytest.mark.parametrize("mode", [None, "BAD", [], 0x8000])
+def test_a_file_is_not_blamed_for_the_arguments(ncid: int, mode: typing.Any) -> None:
+    assert note_of(failure(nc.open, "sample.nc", mode))[1:] == [f"file: {Path.cwd()}/sample.nc"]
+
+
+def test_a_file_is_not_blamed_for_what_the_system_refuses(ncid: int) -> None:
+    error = Error("TESSEL:netcdf:open:permissionDenied", "m")
+    notes.explain(error, nc, ("open", "sample.nc", "WRITE"))
+    assert note_of(error)[1:] == [f"file: {Path.cwd()}/sample.nc"]
+
+
 def file_note(content: bytes) -> list[str]:
     """What the note says about such a file."""
     Path("some.nc").write_bytes(content)

@@ -186,6 +186,7 @@ def test_paths_that_the_module_would_take_for_others(everything, tmp_path, path,
     for call in (lambda: tessel.copy(everything, path), lambda: tessel.copy(path, "copy.nc"),
                  lambda: tessel.read(path, "r3"), lambda: tessel.check(path)):
         assert identifier_of(call) == "TESSEL:python:badPath"
+    assert identifier_of(lambda: tessel.copy(everything, "")) == "TESSEL:python:badPath"
     monkeypatch.chdir(b"\xff")
     assert identifier_of(lambda: tessel.copy(everything, "copy.nc")) == "TESSEL:python:badPath"
     assert len(os.listdir(tmp_path)) == 2
