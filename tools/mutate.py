@@ -27,6 +27,8 @@ from pathlib import Path
 from typing import NamedTuple
 
 ROOT = Path(__file__).resolve().parent.parent
+sys.path.append(str(ROOT / "bench"))
+from measuring import put_between_marks  # noqa: E402
 
 COMPARISONS = {"==": "!=", "!=": "==", "<": "<=", ">": ">=", "<=": "<", ">=": ">", "&&": "||",
                "||": "&&"}
@@ -282,18 +284,8 @@ def report(options: argparse.Namespace, possible: int, verdicts: dict[Mutant, st
     lines += ["Never made, since nobody who calls the module could see them:", ""]
     lines += [f"- `{each.file}`, {each.kind} in `{each.text.strip()}`"
               f"{f', `{each.old}`' if each.old else ''}: {each.reason}" for each in EQUIVALENT]
-    return "".join(textwrap.fill(line, 100, subsequent_indent="  ", break_long_words=False,
-                                 break_on_hyphens=False) + "\n" for line in lines)
-
-
-def write(document: Path, text: str) -> None:
-    """Puts the text between the marks of the document."""
-    begin, end = (f"<!-- tools/mutate.py: {word} -->" for word in ("begin", "end"))
-    before, _, rest = document.read_text().partition(begin + "\n")
-    _, found, after = rest.partition(end)
-    if not found:
-        raise SystemExit(f"{document} has no marks")
-    document.write_text(before + begin + "\n" + text + end + after)
+    return "\n".join(textwrap.fill(line, 100, subsequent_indent="  ", break_long_words=False,
+                                   break_on_hyphens=False) for line in lines)
 
 
 def main() -> int:
@@ -320,7 +312,7 @@ def main() -> int:
     result = report(options, len(possible), verdicts)
     print(f"\n{result}\n{time.monotonic() - start:.0f} s")
     if options.write:
-        write(options.write, result)
+        put_between_marks(options.write, "tools/mutate.py", result)
     outcome = Counter(verdicts.values())
     judged = outcome["killed"] + outcome["survived"]
     return 0 if outcome["killed"] >= 0.98 * judged and judged else 1
