@@ -382,7 +382,8 @@ def test_the_guard_of_a_command_is_its_own(capsys, field, monkeypatch, before):
         assert os.environ.get("TESSEL_GUARD") == before
 
 
-WITHOUT = "import sys; sys.modules[{0!r}] = None; from {1} import main; sys.exit(main(sys.argv[1:]))"
+WITHOUT = ("import sys; sys.modules[{0!r}] = None; "
+           "from {1} import main; sys.exit(main(sys.argv[1:]))")
 
 
 @pytest.mark.parametrize(("library", "program", "arguments"), [
