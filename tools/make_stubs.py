@@ -17,15 +17,20 @@ from tessel.operations import OPERATIONS
 FOLDER = Path(__file__).parents[1] / "python" / "tessel"
 
 RUNTIME = '''
+from collections.abc import Callable
 from pathlib import Path
 from typing import Any
 
 class Module:
-    def __init__(self, module: Module) -> None: ...
+    def __new__(
+        cls, module: Module, instead: dict[str, Callable[..., Any]] = ...
+    ) -> Module: ...
     def __call__(self, *arguments: Any) -> Any: ...
     @property
     def file(self) -> Path: ...
 
+def call(module: Module, /, *arguments: Any) -> Any: ...
+def call_ints(module: Module, /, *arguments: Any) -> Any: ...
 def find(name: bytes | str) -> Module: ...
 def guarded(module: Module, remote: bool) -> Module: ...
 def load_file(path: bytes | str) -> Module: ...
@@ -116,12 +121,12 @@ def made() -> dict[str, str]:
         assert getattr(errors, each.__name__) is each and hasattr(builtins, each.__name__)
     results = "".join(several(each) for each in OPERATIONS if each.several)
     methods = "".join(method(each, name) for each in OPERATIONS for name in each.names)
-    call = "class Netcdf(Module):\n    def __call__(self, *arguments: Any) -> Any: ...\n"
+    netcdf = "class Netcdf(Module):\n    def __new__(cls, module: Module) -> Netcdf: ...\n"
     return {
         "_faults.pyi": heading("_faults.pyi") + FAULTS,
         "_runtime.pyi": heading("_runtime.pyi") + RUNTIME,
         "errors.pyi": heading("errors.pyi") + ERRORS + doubles,
-        "netcdf.pyi": heading("netcdf.pyi") + NETCDF + results + call + methods,
+        "netcdf.pyi": heading("netcdf.pyi") + NETCDF + results + netcdf + methods,
     }
 
 

@@ -31,6 +31,11 @@ py::object toPython(Array array);
 /// Raises the Error "TESSEL:python:" + word.
 [[noreturn]] void refuse(std::string_view word, const std::string &message);
 
+/// Makes an instance of an exception class, or what it is for an error, the exception that Python
+/// is raising.
+void raiseInPython(const py::object &exception);
+void raiseInPython(const Error &error);
+
 /// The classes of the package that the extension makes and recognises.
 struct PythonClasses {
     py::object error;

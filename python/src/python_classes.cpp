@@ -27,6 +27,14 @@ void refuse(std::string_view word, const std::string &message) {
     throw Error(std::string("TESSEL:python:").append(word), message);
 }
 
+void raiseInPython(const py::object &exception) {
+    PyErr_SetObject(py::type::handle_of(exception).ptr(), exception.ptr());
+}
+
+void raiseInPython(const Error &error) {
+    raiseInPython(PythonClasses::get().error(toStr(error.identifier()), toStr(error.message())));
+}
+
 py::str toStr(std::string_view utf8) {
     PyObject *text = PyUnicode_DecodeUTF8(utf8.data(), static_cast<py::ssize_t>(utf8.size()),
                                           "backslashreplace");

@@ -210,7 +210,9 @@ double plainNumber(py::handle value) {
     if (!PyIndex_Check(value.ptr())) { // a NumPy float
         return py::float_(py::reinterpret_borrow<py::object>(value));
     }
-    const std::optional<double> number = exactDouble(steal(PyNumber_Index(value.ptr())));
+    const std::optional<double> number = PyLong_CheckExact(value.ptr())
+                                             ? exactDouble(value)
+                                             : exactDouble(steal(PyNumber_Index(value.ptr())));
     if (!number) {
         refuse("notRepresentable", "An integer in a list of numbers is not exact as a double; "
                                    "use a NumPy array of a 64-bit integer type.");
@@ -222,6 +224,25 @@ double plainNumber(py::handle value) {
 Array fromNumbers(const py::tuple &items) {
     const std::array<std::size_t, 2> dims = {1, items.size()};
     Array row = Array::numeric(tsDOUBLE, items.empty() ? zeroByZero : dims);
+    std::transform(items.begin(), items.end(), row.elements<double>().begin(), plainNumber);
+    return row;
+}
+
+/// The row of a list of nothing but Python's own float and int; no array for any other. To convert
+/// them runs no code of anybody's, and so neither a copy nor a level is needed.
+Array fromOwnNumbers(py::handle list) {
+    PyObject *const object = list.ptr();
+    if (!PyList_CheckExact(object) && !PyTuple_CheckExact(object)) {
+        return {};
+    }
+    const std::span<PyObject *const> items(
+        PySequence_Fast_ITEMS(object), static_cast<std::size_t>(PySequence_Fast_GET_SIZE(object)));
+    if (items.empty() || !std::all_of(items.begin(), items.end(), [](PyObject *item) {
+            return PyFloat_CheckExact(item) || PyLong_CheckExact(item);
+        })) {
+        return {};
+    }
+    Array row = Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{1, items.size()});
     std::transform(items.begin(), items.end(), row.elements<double>().begin(), plainNumber);
     return row;
 }
@@ -369,6 +390,9 @@ Array Nest::fromObjects(const py::array &array) {
 }
 
 Array Nest::fromList(py::handle list) {
+    if (Array row = fromOwnNumbers(list)) {
+        return row;
+    }
     const Level level(*this, list);
     // A copy, because converting an item may run Python code that changes the list.
     const py::tuple items = steal(PySequence_Tuple(list.ptr()));

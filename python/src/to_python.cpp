@@ -16,11 +16,41 @@ namespace {
 /// The most dimensions that a NumPy array can have.
 constexpr std::size_t mostDimensions = 32;
 
-/// Keeps a host array as long as anything in Python looks at its memory.
-py::capsule ownerOf(std::unique_ptr<Array> array) {
-    py::capsule owner(array.get(), [](void *held) { delete static_cast<Array *>(held); });
-    static_cast<void>(array.release());
-    return owner;
+/// An object of Python's that keeps a host array as long as anything looks at its memory.
+struct Owner {
+    PyObject base;
+    Array array;
+};
+
+/// Made once, and never freed: the interpreter may be gone before this library is.
+PyTypeObject *ownerClass() {
+    static PyTypeObject *const made = [] {
+        const auto destroy = [](PyObject *self) {
+            PyTypeObject *const type = Py_TYPE(self);
+            std::destroy_at(&reinterpret_cast<Owner *>(self)->array);
+            PyObject_Free(self);
+            Py_DECREF(type);
+        };
+        std::array<PyType_Slot, 2> slots = {
+            {{Py_tp_dealloc, reinterpret_cast<void *>(static_cast<destructor>(destroy))},
+             {0, nullptr}}};
+        PyType_Spec spec = {"tessel._runtime.Owner", sizeof(Owner), 0,
+                            Py_TPFLAGS_DEFAULT | Py_TPFLAGS_DISALLOW_INSTANTIATION, slots.data()};
+        return reinterpret_cast<PyTypeObject *>(PyType_FromSpec(&spec));
+    }();
+    if (made == nullptr) {
+        throw py::error_already_set();
+    }
+    return made;
+}
+
+py::object ownerOf(Array array) {
+    Owner *const owner = PyObject_New(Owner, ownerClass());
+    if (owner == nullptr) {
+        throw py::error_already_set();
+    }
+    std::construct_at(&owner->array, std::move(array));
+    return py::reinterpret_steal<py::object>(&owner->base);
 }
 
 /// A column-major NumPy array over memory that belongs to `owner`; over new memory without one.
@@ -174,9 +204,8 @@ py::object toPython(Array array) {
     if (array.classID() == tsCHAR) { // always copied, so nothing needs to be kept
         return fromCharacters(array);
     }
-    auto held = std::make_unique<Array>(std::move(array));
-    const Array &source = *held;
-    return convert(source, ownerOf(std::move(held)));
+    const py::object owner = ownerOf(std::move(array));
+    return convert(reinterpret_cast<const Owner *>(owner.ptr())->array, owner);
 }
 
 } // namespace tessel::python

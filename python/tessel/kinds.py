@@ -66,14 +66,14 @@ def data_kind(dtype: str, host_class: str) -> Kind:
                 (("TESSEL:python:notExact", f"has a number of Python's that no {dtype} is"),))
 
 
-NUMBER = ResultKind("int", "int", "double, 1-by-1", "int({value}.item())")
+NUMBER = ResultKind("int", "int", "double, 1-by-1", "{value}", count=True)
 TEXT = ResultKind("str", "str", "char, a row", "{value}")
 CONSTANT = ResultKind("Any", "int or float", "double, 1-by-1",
                       "constant({value})")  # as a union, of use to nobody
 NAMES = ResultKind("list[str]", "list of str", "cell of char rows, n-by-1",
                    "{value}.ravel().tolist()")
 DIMENSION_LIST = ResultKind("tuple[int, ...]", "tuple of int", "double, a row; 0-by-0 for none",
-                            "tuple(map(int, {value}.flat))")
+                            "ids({value})", count=True)
 
 
 def data_result(dtype: str, host_class: str, row: bool) -> ResultKind:

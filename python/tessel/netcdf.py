@@ -36,7 +36,7 @@ from numpy import ndarray
 from numpy.typing import NDArray
 
 from tessel import errors, paths
-from tessel._runtime import Module
+from tessel._runtime import Module, call, call_ints
 from tessel.arguments import file_path, identifiers, integer, numbers, vector
 from tessel.operation import Operation
 from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS
@@ -93,25 +93,37 @@ def _constant(value: ndarray[Any, Any]) -> int | float:
     return int(number) if abs(number) < 2**53 else number
 
 
-_LIVES = {name: each for each in OPERATIONS if each.opens or each.ends for name in each.names}
+def _opening(module: Module, *arguments: Any) -> Any:
+    """A call by name of an operation that opens."""
+    result = call(module, *arguments)
+    ncid = result[-1] if type(result) is tuple else result
+    _remember(arguments[1], int(ncid.item()))
+    return result
+
+
+def _ending(module: Module, *arguments: Any) -> None:
+    """A call by name of an operation that ends a dataset."""
+    before = _known(arguments[1]) if len(arguments) > 1 else (-1, None)
+    _forget(before, call(module, *arguments))
+
+
+_INSTEAD = {name: _opening if each.opens else _ending
+            for each in OPERATIONS if each.opens or each.ends for name in each.names}
 
 
 class Netcdf(Module):
-    """The module "netcdf". Every operation is a method; see `help(tessel.netcdf)`."""
+    """The module "netcdf". Every operation is a method; see `help(tessel.netcdf)`.
 
-    def __call__(self, *arguments: Any) -> Any:
-        """Call an operation by name: the host's arrays in and out, unchanged."""
-        name = arguments[0] if arguments else None
-        operation = _LIVES.get(name.lower()) if type(name) is str else None
-        if operation is None:
-            return _call(self, *arguments)
-        if operation.opens:
-            result = _call(self, *arguments)
-            ncid = result[-1] if type(result) is tuple else result
-            _remember(arguments[1], int(ncid.item()))
-            return result
-        before = _known(arguments[1]) if len(arguments) > 1 else (-1, None)
-        return _forget(before, _call(self, *arguments))
+    Called with an operation's name, it takes and gives the host's arrays, unchanged.
+    """
+
+    def __new__(cls, module: Module) -> Netcdf:
+        return super().__new__(cls, module, _INSTEAD)
+
+
+def _ids(value: Any) -> tuple[int, ...]:
+    """A list of ids, of which `call_ints` makes an int when it is one id."""
+    return (value,) if type(value) is int else tuple(map(int, value.flat))
 
 
 def _id(value: Any) -> int:
@@ -122,19 +134,16 @@ def _id(value: Any) -> int:
         return -1
 
 
-_call = Module.__call__
-
 _SCOPE: dict[str, Any] = {
     "Any": Any, "Indices": Indices, "NDArray": NDArray, "Numbers": Numbers,
     "PLAIN": (list, tuple, ndarray), "SupportsIndex": SupportsIndex, "__name__": __name__,
-    "call": _call, "constant": _constant, "Error": errors.Error, "explained": errors.explained,
+    "call": call, "call_ints": call_ints, "constant": _constant, "Error": errors.Error,
+    "explained": errors.explained,
     "dtypes": {name: numpy.dtype(name) for name in
                ("float64", "float32", "int32", "int16", "int8", "uint8")},
-    "file_path": file_path, "forget": _forget, "identifiers": identifiers, "integer": integer,
-    "known": _known,
-    "ndarray": ndarray, "numbers": numbers, "numpy": numpy, "paths": paths,
-    "remember": _remember,
-    "vector": vector,
+    "file_path": file_path, "forget": _forget, "identifiers": identifiers, "ids": _ids,
+    "integer": integer, "known": _known, "ndarray": ndarray, "numbers": numbers, "numpy": numpy,
+    "paths": paths, "remember": _remember, "vector": vector,
 }
 
 
@@ -147,7 +156,7 @@ def _source(operation: Operation) -> str:
         lines.append(f"    path = {made['path']}")
         made["path"] = "path"
     given = "".join(f", {each}" for each in made.values())
-    value = f"call(self, '{operation.short}'{given})"
+    value = f"{'call_ints' if operation.counts else 'call'}(self, '{operation.short}'{given})"
     if len(operation.results) > 1:
         names = ", ".join(f"r{i}" for i in range(len(operation.results)))
         lines.append(f"    {names} = {value}")

@@ -62,7 +62,11 @@ class ResultKind:
     """The class and shape of the host array that the module gives."""
 
     conversion: str
-    """The expression that makes it of {value}, what the call form gives."""
+    """The expression that makes it of {value}, what the call form gives; or `call_ints`, for a
+    count."""
+
+    count: bool = False
+    """Whether it is made of ints."""
 
 
 @dataclass(frozen=True)
@@ -103,6 +107,11 @@ class Operation:
     def names(self) -> tuple[str, ...]:
         """The names that it has, each once."""
         return (self.short,) if self.short == self.long else (self.short, self.long)
+
+    @property
+    def counts(self) -> bool:
+        """Whether it gives counts; none gives counts and data."""
+        return any(each.kind.count for each in self.results)
 
     @property
     def returns(self) -> str:

@@ -1,0 +1,389 @@
+// python/src/module_object.cpp: the class `tessel._runtime.Module`, and calls.
+//
+// The class is made by hand, because a call through the module takes less time than it takes to
+// find out, as pybind11 does for any class and function, which of them is meant by what.
+#include "module_object.hpp"
+
+#include <pybind11/stl/filesystem.h>
+
+#include <array>
+#include <cstddef>
+#include <memory>
+#include <memory_resource>
+#include <optional>
+#include <span>
+#include <structmember.h>
+#include <unordered_map>
+#include <utility>
+#include <vector>
+
+namespace tessel::python {
+namespace {
+
+/// The arguments of a call of Python's, which are borrowed.
+using Arguments = std::span<PyObject *const>;
+
+/// The name of an operation: the host's array for it, made once.
+struct Name {
+    py::object str; ///< kept, so that no other object has its address
+    Array text;
+    py::object instead; ///< the function of Python's that takes the calls of this name, if any does
+};
+
+/// Names by the address of the str that they are. Constants of a program's that look like names
+/// are interned, each of them one object, and only those are kept; never more than `most`, however
+/// many a program makes. What is kept stays where it is, for calls that are in progress.
+class Names {
+  public:
+    static constexpr std::size_t most = 512;
+
+    /// nullptr for one that is not kept.
+    [[nodiscard]] const Name *find(PyObject *str) const {
+        const auto found = names.find(str);
+        return found == names.end() ? nullptr : &found->second;
+    }
+
+    const Name *keep(Name name) {
+        PyObject *const str = name.str.ptr();
+        return &names.emplace(str, std::move(name)).first->second;
+    }
+
+    [[nodiscard]] bool mayKeep(PyObject *str) const {
+        return PyUnicode_CHECK_INTERNED(str) != 0 && names.size() < most;
+    }
+
+  private:
+    std::unordered_map<PyObject *, Name> names;
+};
+
+/// What an instance of the class is.
+struct ModuleObject {
+    PyObject ob_base;
+    PyObject *weakReferences;
+    vectorcallfunc vectorcall;
+    Module module;
+    py::object instead; ///< a dict: functions of Python's by the names that they take the calls of
+    Names names;
+};
+
+PyTypeObject *moduleClass = nullptr; ///< never freed: the interpreter may be gone before it
+
+ModuleObject &of(PyObject *self) {
+    return *reinterpret_cast<ModuleObject *>(self);
+}
+
+/// What `work` gives; an Error that leaves it is made Python's.
+template <class Work>
+py::object orError(const Work &work) {
+    try {
+        return work();
+    } catch (const Error &error) {
+        raiseInPython(error);
+    }
+    throw py::error_already_set();
+}
+
+/// What `work` gives to Python; nullptr with Python's exception for any that leaves it.
+template <class Work>
+PyObject *orException(const Work &work) {
+    try {
+        return orError(work).release().ptr();
+    } catch (py::error_already_set &error) {
+        error.restore();
+    } catch (const py::builtin_exception &error) {
+        error.set_error();
+    } catch (const std::bad_alloc &) {
+        PyErr_NoMemory();
+    } catch (const std::exception &error) {
+        PyErr_SetString(PyExc_RuntimeError, error.what());
+    }
+    return nullptr;
+}
+
+/// Lets other threads of Python's run.
+class OthersRun {
+  public:
+    OthersRun() noexcept : state(PyEval_SaveThread()) {}
+    ~OthersRun() { PyEval_RestoreThread(state); }
+    OthersRun(const OthersRun &) = delete;
+    OthersRun &operator=(const OthersRun &) = delete;
+
+  private:
+    PyThreadState *state;
+};
+
+/// The arguments of a call as the host's arrays. Nearly all calls have so few that none of this
+/// needs memory of its own.
+class Inputs {
+  public:
+    Inputs(const Name *name, Arguments arguments) {
+        made.reserve(arguments.size());
+        inputs.reserve(arguments.size());
+        if (name != nullptr) {
+            inputs.push_back(name->text.get());
+            arguments = arguments.subspan(1);
+        }
+        for (PyObject *argument : arguments) {
+            made.push_back(toHost(argument, lenders));
+            inputs.push_back(std::as_const(made.back()).get());
+        }
+    }
+
+    std::span<const tsArray *> get() { return inputs; }
+
+  private:
+    static constexpr std::size_t usual = 8;
+    std::array<std::byte, usual *(sizeof(Array) + sizeof(tsArray *))> room;
+    std::pmr::monotonic_buffer_resource memory{room.data(), room.size()};
+    Lenders lenders;
+    std::pmr::vector<Array> made{&memory};
+    std::pmr::vector<const tsArray *> inputs{&memory};
+};
+
+/// Makes the value of one result.
+using ToPython = py::object (*)(Array array);
+
+/// A double by itself as an int; anything else as always.
+py::object toInt(Array array) {
+    if (array && array.classID() == tsDOUBLE && array.size() == 1 && array.imaginary() == nullptr) {
+        PyObject *const number = PyLong_FromDouble(array.number());
+        if (number == nullptr) {
+            throw py::error_already_set();
+        }
+        return py::reinterpret_steal<py::object>(number);
+    }
+    return toPython(std::move(array));
+}
+
+py::object valueOf(Results results, ToPython convert) {
+    switch (results.size()) {
+    case 0:
+        return py::none();
+    case 1:
+        return convert(std::move(results[0]));
+    default: {
+        py::tuple values(results.size());
+        for (std::size_t i = 0; i < results.size(); ++i) {
+            values[i] = convert(std::move(results[i]));
+        }
+        return values;
+    }
+    }
+}
+
+py::tuple tupleOf(Arguments arguments) {
+    py::tuple tuple(arguments.size());
+    for (std::size_t i = 0; i < arguments.size(); ++i) {
+        tuple[i] = py::reinterpret_borrow<py::object>(arguments[i]);
+    }
+    return tuple;
+}
+
+bool isName(Arguments arguments) {
+    return !arguments.empty() && PyUnicode_CheckExact(arguments[0]);
+}
+
+/// The function of Python's that takes the calls of this name, if any does.
+py::object insteadOf(const ModuleObject &self, Arguments arguments) {
+    if (!self.instead || !isName(arguments)) {
+        return {};
+    }
+    const py::object lower = py::handle(arguments[0]).attr("lower")();
+    return py::reinterpret_borrow<py::object>(
+        PyDict_GetItemWithError(self.instead.ptr(), lower.ptr()));
+}
+
+/// The name that was called; nullptr where it is not kept.
+const Name *nameOf(ModuleObject &self, Arguments arguments) {
+    if (!isName(arguments)) {
+        return nullptr;
+    }
+    PyObject *const str = arguments[0];
+    if (const Name *const kept = self.names.find(str)) {
+        return kept;
+    }
+    if (!self.names.mayKeep(str)) {
+        return nullptr;
+    }
+    Lenders none;
+    return self.names.keep(
+        {py::reinterpret_borrow<py::object>(str), toHost(str, none), insteadOf(self, arguments)});
+}
+
+/// A call of the module; its error is one that Python makes, which adds what was called.
+py::object call(ModuleObject &self, const Name *name, Arguments arguments, bool named,
+                ToPython convert) {
+    std::optional<Error> failure;
+    try {
+        if (named) {
+            refuse("namedArgument", "Operations take their arguments by position.");
+        }
+        Inputs inputs(name, arguments);
+        return valueOf(
+            [&] {
+                const OthersRun others;
+                return self.module.call(inputs.get());
+            }(),
+            convert);
+    } catch (const Error &error) {
+        failure = error;
+    }
+    // Outside of the handler, because Python asks the module, which raises in its turn.
+    raiseInPython(PythonClasses::get().raised(py::handle(&self.ob_base), tupleOf(arguments),
+                                              toStr(failure->identifier()),
+                                              toStr(failure->message())));
+    throw py::error_already_set();
+}
+
+/// module(name, *arguments)
+PyObject *callObject(PyObject *self, PyObject *const *given, std::size_t flags, PyObject *names) {
+    return orException([&]() -> py::object {
+        const Arguments arguments(given, static_cast<std::size_t>(PyVectorcall_NARGS(flags)));
+        ModuleObject &module = of(self);
+        const Name *const name = nameOf(module, arguments);
+        const py::object instead = name != nullptr ? name->instead : insteadOf(module, arguments);
+        const bool named = names != nullptr && PyTuple_GET_SIZE(names) != 0;
+        if (instead && !named) {
+            return instead(py::handle(self), *tupleOf(arguments));
+        }
+        return call(module, name, arguments, named, toPython);
+    });
+}
+
+/// call(module, name, *arguments): the module itself, whatever else takes the calls of a name.
+template <ToPython convert>
+PyObject *callFunction(PyObject * /*extension*/, PyObject *const *given, Py_ssize_t count) {
+    return orException([&] {
+        static_cast<void>(moduleOf(count == 0 ? Py_None : given[0]));
+        ModuleObject &module = of(given[0]);
+        const Arguments arguments(given + 1, static_cast<std::size_t>(count - 1));
+        return call(module, nameOf(module, arguments), arguments, false, convert);
+    });
+}
+
+/// A new instance of the class or of one that was derived from it.
+py::object make(PyTypeObject *type, Module module, py::object instead) {
+    PyObject *const self = type->tp_alloc(type, 0);
+    if (self == nullptr) {
+        throw py::error_already_set();
+    }
+    ModuleObject &made = of(self);
+    made.vectorcall = callObject;
+    std::construct_at(&made.module, std::move(module));
+    std::construct_at(&made.instead, std::move(instead));
+    std::construct_at(&made.names);
+    return py::reinterpret_steal<py::object>(self);
+}
+
+PyObject *makeNew(PyTypeObject *type, PyObject *arguments, PyObject *named) {
+    static const std::array<const char *, 3> keywords = {"module", "instead", nullptr};
+    PyObject *module = nullptr;
+    PyObject *instead = nullptr;
+    if (PyArg_ParseTupleAndKeywords(arguments, named, "O!|O!:Module",
+                                    const_cast<char **>(keywords.data()), moduleClass, &module,
+                                    &PyDict_Type, &instead) == 0) {
+        return nullptr;
+    }
+    return orException(
+        [&] { return make(type, of(module).module, py::reinterpret_borrow<py::object>(instead)); });
+}
+
+void destroy(PyObject *self) {
+    PyTypeObject *const type = Py_TYPE(self);
+    ModuleObject &module = of(self);
+    if (module.weakReferences != nullptr) {
+        PyObject_ClearWeakRefs(self);
+    }
+    std::destroy_at(&module.names);
+    std::destroy_at(&module.instead);
+    std::destroy_at(&module.module);
+    type->tp_free(self);
+    Py_DECREF(type);
+}
+
+PyObject *fileOf(PyObject *self, void * /*closure*/) {
+    return orException([&] { return py::cast(of(self).module.file()); });
+}
+
+PyObject *represent(PyObject *self) {
+    return orException([&]() -> py::object {
+        return py::str("<tessel.Module {}>").format(of(self).module.file());
+    });
+}
+
+constexpr const char *classDoc = R"(Module(module, instead={})
+--
+
+A loaded module. Call it with the name of an operation, then the operation's own arguments, by
+position: module("open", "new.nc", "NOWRITE").
+
+A call returns None, the one result, or a tuple of several, and raises tessel.Error. The docstring
+of the package has the table of what becomes what. Other threads run while the module works.
+
+Module(module) is the same module. `instead` has functions by the lower-case names of operations:
+such a function is given the module and the arguments when the module is called with that name.)";
+
+constexpr const char *callDoc = R"(call(module, /, *arguments)
+--
+
+What module(*arguments) gives if nothing else takes the calls of that name.)";
+
+constexpr const char *callIntsDoc = R"(call_ints(module, /, *arguments)
+--
+
+The same, with an int for each result that is a double by itself.)";
+
+/// A function as Python's tables have it.
+template <class Pointer, class Function>
+Pointer as(Function *function) {
+    return reinterpret_cast<Pointer>(reinterpret_cast<void (*)()>(function));
+}
+
+// What Python keeps pointers to for as long as it runs.
+
+std::array<PyGetSetDef, 2> properties = {
+    {{"file", fileOf, nullptr, "The file that it was loaded from.", nullptr}, {}}};
+
+std::array<PyMemberDef, 3> members = {
+    {{"__vectorcalloffset__", T_PYSSIZET, offsetof(ModuleObject, vectorcall), READONLY, nullptr},
+     {"__weaklistoffset__", T_PYSSIZET, offsetof(ModuleObject, weakReferences), READONLY, nullptr},
+     {}}};
+
+std::array<PyMethodDef, 3> functions = {
+    {{"call", as<PyCFunction>(callFunction<toPython>), METH_FASTCALL, callDoc},
+     {"call_ints", as<PyCFunction>(callFunction<toInt>), METH_FASTCALL, callIntsDoc},
+     {}}};
+
+} // namespace
+
+void addModuleClass(py::module_ &extension) {
+    std::array<PyType_Slot, 8> slots = {{{Py_tp_doc, const_cast<char *>(classDoc)},
+                                         {Py_tp_new, as<void *>(makeNew)},
+                                         {Py_tp_dealloc, as<void *>(destroy)},
+                                         {Py_tp_repr, as<void *>(represent)},
+                                         {Py_tp_call, as<void *>(PyVectorcall_Call)},
+                                         {Py_tp_getset, properties.data()},
+                                         {Py_tp_members, members.data()},
+                                         {0, nullptr}}};
+    PyType_Spec spec = {"tessel._runtime.Module", sizeof(ModuleObject), 0,
+                        Py_TPFLAGS_DEFAULT | Py_TPFLAGS_BASETYPE | Py_TPFLAGS_HAVE_VECTORCALL,
+                        slots.data()};
+    moduleClass = reinterpret_cast<PyTypeObject *>(PyType_FromSpec(&spec));
+    if (moduleClass == nullptr || PyModule_AddFunctions(extension.ptr(), functions.data()) != 0) {
+        throw py::error_already_set();
+    }
+    extension.add_object("Module", reinterpret_cast<PyObject *>(moduleClass));
+}
+
+py::object newModuleObject(Module module) {
+    return make(moduleClass, std::move(module), {});
+}
+
+const Module &moduleOf(py::handle instance) {
+    if (PyObject_TypeCheck(instance.ptr(), moduleClass) == 0) {
+        throw py::type_error("the first argument is no Module");
+    }
+    return of(instance.ptr()).module;
+}
+
+} // namespace tessel::python
