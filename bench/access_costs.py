@@ -7,11 +7,16 @@ A file of 256 MB, in the system's cache, is read in ways that one of the costs d
 value (a call), a column of single values (a run), a block of a megabyte (a byte), every second and
 every fifth value (the strided operation), and a copy in memory (a picked byte). A time is the
 shortest of ten, because other work can only add to it.
+
+What a column consists of is shown as well: the same by one call of the library, without the module,
+and by NumPy from a mapping of the file, which is the memory alone.
 """
 
 from __future__ import annotations
 
 import argparse
+import ctypes
+import ctypes.util
 import itertools
 import tempfile
 from collections.abc import Callable
@@ -21,7 +26,7 @@ import netCDF4
 import numpy as np
 from measuring import put_between_marks, seconds
 from tessel.xarray.array import DTYPES, LazyArray
-from tessel.xarray.opening import OpenFile
+from tessel.xarray.opening import MAPPED, OpenFile
 from tessel.xarray.planning import COSTS, Costs
 from xarray.backends import CachingFileManager
 
@@ -71,6 +76,39 @@ def measured(path: str, mapped: bool, text: bool) -> Costs:
                  shortest(pick) / room.nbytes, strided)
 
 
+def column(path: str) -> str:
+    """What a column costs in three ways, in one line."""
+    manager = CachingFileManager(OpenFile, path)
+    file = manager.acquire()
+    variable = file.variables[MEMBERS[False]]
+    array = LazyArray(manager, variable, mapped=True)
+    ours = shortest(lambda: array.block([0, 0, 7], [*SHAPE[:2], 1]))
+
+    library = ctypes.CDLL(ctypes.util.find_library("netcdf"))
+    ncid = ctypes.c_int()
+    places = [(ctypes.c_size_t * 3)(*each) for each in ((0, 0, 7), (*SHAPE[:2], 1))]
+    room = np.empty(SHAPE[:2], "f4")
+
+    def call() -> None:
+        if library.nc_get_vara_float(ncid, variable.varid, *places, ctypes.c_void_p(
+                room.ctypes.data)):
+            raise RuntimeError("The library cannot read the column.")
+
+    if library.nc_open(path.encode(), MAPPED, ctypes.byref(ncid)):
+        raise RuntimeError("The library cannot open the file.")
+    by_library = shortest(call)
+    library.nc_close(ncid)
+
+    begin = file.begin_of(variable.varid)
+    values = np.memmap(path, ">f4", "r", begin, SHAPE)
+    by_numpy = shortest(lambda: values[:, :, 7].astype("f4"))
+    np.testing.assert_array_equal(array.block([0, 0, 7], [*SHAPE[:2], 1])[:, :, 0], room)
+    np.testing.assert_array_equal(values[:, :, 7], room)
+    return (f"A column of {room.size} numbers, mapped: {ours * 1e3:.1f} ms by the engine, "
+            f"{by_library * 1e3:.1f} ms by one call of the library without the module, "
+            f"{by_numpy * 1e3:.1f} ms by NumPy from a mapping.")
+
+
 def main() -> None:
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
     parser.add_argument("--write", type=Path, metavar="DOCUMENT",
@@ -87,6 +125,7 @@ def main() -> None:
                 lines.append(f"| {kind} | {title} | {costs.call * 1e6:.1f} µs | "
                              f"{costs.run * 1e9:.0f} ns | {costs.byte * 1e9:.2f} ns | "
                              f"{costs.picked * 1e9:.2f} ns | {costs.strided * 1e9:.0f} ns |")
+        lines += ["", column(path)]
     print(text := "\n".join(lines))
     if options.write:
         put_between_marks(options.write, "bench/access_costs.py", text)

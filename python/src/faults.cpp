@@ -10,16 +10,23 @@
 // each fault would be a mapping more for each, of which a process may have some 65,000, and a
 // column of a large file touches more pages than that.
 #include <pybind11/pybind11.h>
+#include <pybind11/stl.h>
 
 #include <algorithm>
+#include <bit>
 #include <cerrno>
 #include <csignal>
 #include <cstdint>
 #include <fcntl.h>
+#include <span>
 #include <sys/mman.h>
 #include <unistd.h>
+#include <vector>
 
 namespace tessel::python {
+
+namespace py = pybind11;
+
 namespace {
 
 /// What the handler knows of the thread that it runs in. The memory for it must be there before,
@@ -137,6 +144,26 @@ bool end() {
     return watch.faulted != 0;
 }
 
+/// Asks for what is at an address, and as many steps further along each of the dimensions.
+void fetchEach(std::uintptr_t address, std::span<const std::size_t> counts,
+               std::span<const std::size_t> steps) {
+    if (counts.empty()) {
+        __builtin_prefetch(std::bit_cast<const void *>(address));
+        return;
+    }
+    for (std::size_t i = 0; i < counts.front(); ++i) {
+        fetchEach(address + i * steps.front(), counts.subspan(1), steps.subspan(1));
+    }
+}
+
+void fetch(std::uintptr_t address, const std::vector<std::size_t> &counts,
+           const std::vector<std::size_t> &steps) {
+    if (counts.size() != steps.size()) {
+        throw py::value_error("As many counts as steps are wanted.");
+    }
+    fetchEach(address, counts, steps);
+}
+
 } // namespace
 
 PYBIND11_MODULE(_faults, extension) {
@@ -145,6 +172,9 @@ PYBIND11_MODULE(_faults, extension) {
     extension.def("begin", begin,
                   "From now on, what is gone from a mapped file is read as zeros by this thread.");
     extension.def("end", end, "Until now. Whether anything was gone.");
+    extension.def("fetch", fetch,
+                  "Has the processor bring memory into its caches. A hint: where there is none, "
+                  "nothing happens.");
 }
 
 } // namespace tessel::python

@@ -15,7 +15,6 @@ from __future__ import annotations
 
 import math
 import os
-from collections.abc import Iterator
 from dataclasses import dataclass
 from typing import NamedTuple
 
@@ -92,27 +91,33 @@ def verify(dataset: Dataset) -> int | None:
 
 
 class Extent(NamedTuple):
-    """How many bytes a file needs."""
+    """How many bytes a file needs, and where in it they are."""
 
     header: int
     least: int
     """The least size that it must have, with all values."""
 
+    begins: list[int | None]
+    """Where each variable begins, by its number; None where the header does not tell."""
+
+    record: int
+    """From each record to the next."""
+
 
 def extent(dataset: Dataset) -> Extent | None:
-    """The same, with the length of the header."""
+    """The same, with what else is known then."""
     form = _form(dataset.place)
     if form is None:
         return None
     header = _Header(dataset, form)
     with open(dataset.place, "rb") as file:
-        least = header.least_size(file.read(header.length))
+        found = header.extent(file.read(header.length))
         there = os.fstat(file.fileno()).st_size
-    if there < least:
+    if there < found.least:
         raise tessel.Error("TESSEL:python:fileTooShort",
                            f"The file is cut off: it has {there} bytes, and what is in it needs "
-                           f"{least}.", path=dataset.place)
-    return Extent(header.length, least)
+                           f"{found.least}.", path=dataset.place)
+    return found
 
 
 def _padded(length: int) -> int:
@@ -173,25 +178,26 @@ class _Header:
         self.length += _WORD + self._form.count + self._form.place
         return _Variable(kind.number, size, in_records, entry)
 
-    def least_size(self, header: bytes) -> int:
-        """The bytes that the file must have, given those of its header."""
+    def extent(self, header: bytes) -> Extent:
+        """What the file must have, given the bytes of its header."""
         records = self._lengths[self._unlimited] if self._unlimited >= 0 else 0
         recorded = [each.size for each in self._variables if each.in_records]
         # A single variable of records goes without padding between them.
         step = recorded[0] if len(recorded) == 1 else sum(map(_padded, recorded))
         total = self.length
         ends = [0]
-        for variable in self._variables:
+        begins = [self._beginning(each, header) for each in self._variables]
+        for variable, begin in zip(self._variables, begins):
             repeated = records if variable.in_records else 1
             total += repeated * variable.size
-            if repeated and variable.size:
-                ends += [begin + (repeated - 1) * step + variable.size
-                         for begin in self._beginning(variable, header)]
-        return max(total, *ends)
+            if repeated and variable.size and begin is not None:
+                ends.append(begin + (repeated - 1) * step + variable.size)
+        return Extent(self.length, max(total, *ends), begins, step)
 
-    def _beginning(self, variable: _Variable, header: bytes) -> Iterator[int]:
-        """Where a variable begins; nothing where the header is not as the inquiries say."""
+    def _beginning(self, variable: _Variable, header: bytes) -> int | None:
+        """Where a variable begins; None where the header is not as the inquiries say."""
         place = variable.entry + _WORD + self._form.count
         number = int.from_bytes(header[variable.entry:variable.entry + _WORD], "big")
-        if number == variable.type and place + self._form.place <= len(header):
-            yield int.from_bytes(header[place:place + self._form.place], "big")
+        if number != variable.type or place + self._form.place > len(header):
+            return None
+        return int.from_bytes(header[place:place + self._form.place], "big")

@@ -3,6 +3,8 @@
 
 from __future__ import annotations
 
+import math
+import operator
 from typing import Any
 
 import numpy as np
@@ -10,6 +12,7 @@ from xarray.backends import BackendArray, CachingFileManager
 from xarray.core import indexing
 
 from tessel.dataset import Variable
+from tessel.transfer import blocks
 from tessel.xarray import planning
 from tessel.xarray.opening import FileWasClosed, OpenFile, refusal
 
@@ -18,6 +21,13 @@ DTYPES = {"schar": "i1", "text": "S1", "short": "i2", "int": "i4", "float": "f4"
 
 # A character takes two bytes in the host, one in its buffer, and four in Python.
 _MEMORY_OF_CHARACTER = 12
+
+_LINE = 64
+"""The bytes that the processor brings into its caches together."""
+
+_AT_ONCE = 1024
+"""So many lines that are fetched ahead are still in the inner caches when the library comes to them.
+For as many it is not worth it."""
 
 
 class LazyArray(BackendArray):
@@ -37,6 +47,10 @@ class LazyArray(BackendArray):
         self.dtype = np.dtype(DTYPES[str(variable.type.member)])
         self.memory = _MEMORY_OF_CHARACTER if variable.is_text else self.dtype.itemsize
         self.costs = planning.COSTS[mapped, variable.is_text]
+        self._strides = [math.prod(self.shape[each + 1:]) * self.dtype.itemsize
+                         for each in range(len(self.shape))]
+        if self._in_records:
+            self._strides[0] = 0  # which depends on what else is in a record
 
     def __getstate__(self) -> dict[str, Any]:
         return {**self.__dict__, "_file": None}
@@ -54,7 +68,23 @@ class LazyArray(BackendArray):
         """The values of a block."""
         if not count:
             return self._values(count, "get_var")
-        return self._values(count, "get_vara", start, count)
+        if not self._is_scattered(count):
+            return self._values(count, "get_vara", start, count)
+        values = np.empty(count, self.dtype)
+        for offset, part in blocks(count, _AT_ONCE):
+            first = list(map(operator.add, start, offset))
+            file = self._file  # which another thread may take away
+            if file and self._place in file.varids:
+                file.fetch(file.varids[self._place], first, part, self._strides)
+            values[tuple(slice(a, a + n) for a, n in zip(offset, part))] = self._values(
+                part, "get_vara", first, part)
+        return values
+
+    def _is_scattered(self, count: list[int]) -> bool:
+        """Whether a block is many values that are far from each other in the file."""
+        return (math.prod(count) > _AT_ONCE and count[-1] == 1
+                and self.shape[-1] * self.dtype.itemsize >= 2 * _LINE
+                and self.memory <= self.dtype.itemsize)
 
     def strided(self, start: list[int], count: list[int], step: list[int]) -> np.ndarray:
         """Every n-th value from a start on."""

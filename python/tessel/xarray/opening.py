@@ -20,6 +20,7 @@ its header must be, after each read, what it was when it was opened.
 
 from __future__ import annotations
 
+import operator
 import os
 import threading
 from typing import Any, NamedTuple
@@ -77,6 +78,9 @@ class OpenFile(Dataset):
         self._ids: list[int] = []
         self._data: int | None = None
         self._gone = False
+        self._address: int | None = None
+        """Where the library has mapped the file to."""
+
         self.varids: dict[tuple[str, bool], int] = {}
         """The numbers of the variables that were found to be what they are expected to be, by name
         and by whether they are read only once."""
@@ -88,8 +92,8 @@ class OpenFile(Dataset):
             self._layout_bytes = _LAYOUT_END - _LAYOUT_BEGIN
             self._layout = self._layout_now()  # before the library looks at it
             super().__init__(path)
-            header, self._least = integrity.extent(self) or (0, 0)
-            self._layout = self._layout[:max(header - _LAYOUT_BEGIN, 0)]
+            self._extent = integrity.extent(self) or integrity.Extent(0, 0, [], 0)
+            self._layout = self._layout[:max(self._extent.header - _LAYOUT_BEGIN, 0)]
             self._layout_bytes = len(self._layout)
             if not self._is_at_its_path():
                 raise self._error("fileChanged", "The file was replaced while it was being opened.")
@@ -130,11 +134,42 @@ class OpenFile(Dataset):
 
     def _opened_for_data(self) -> int:
         if self.mapped:
+            before = self._mappings()
             try:
-                return self._opened(MAPPED, LARGE_BUFFER)
+                opened = self._opened(MAPPED, LARGE_BUFFER)
+                self._address = next(iter(self._mappings() - before), None)
+                return opened
             except tessel.Error:
                 self.mapped = False  # the file system, or what memory there is, does not have it
         return self._opened("NOWRITE", LARGE_BUFFER)
+
+    def _mappings(self) -> set[int]:
+        """The addresses that this file is mapped to, from its beginning on; none where the system
+        does not tell."""
+        inode = str(os.fstat(self._descriptor).st_ino)
+        try:
+            with open("/proc/self/maps", encoding="utf-8", errors="replace") as mappings:
+                fields = [line.split(None, 5) for line in mappings]
+        except OSError:
+            return set()
+        return {int(each[0].partition("-")[0], 16) for each in fields
+                if each[4] == inode and int(each[2], 16) == 0}
+
+    def begin_of(self, varid: int) -> int | None:
+        """Where a variable begins in the file; None where its header does not tell."""
+        begins = self._extent.begins
+        return begins[varid] if varid < len(begins) else None
+
+    def fetch(self, varid: int, start: list[int], count: list[int], strides: list[int]) -> None:
+        """Has the processor bring what is going to be read, in many places far from each other,
+        into its caches: it does so for all of them at once, and the library asks for one after the
+        other. `strides` has the bytes between the places along each dimension, and 0 for records.
+        This is no access: nothing happens where there is no memory."""
+        begin = self.begin_of(varid)
+        if self._address is not None and begin is not None:
+            steps = [each or self._extent.record for each in strides]
+            first = self._address + begin + sum(map(operator.mul, start, steps))
+            _faults.fetch(first, count, steps)
 
     def _error(self, word: str, message: str) -> tessel.Error:
         return refusal(word, message, self.place)
@@ -165,7 +200,7 @@ class OpenFile(Dataset):
 
     def _want_length(self) -> None:
         """Raises the error for a file that became shorter."""
-        self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._least
+        self._gone |= os.lseek(self._descriptor, 0, os.SEEK_END) < self._extent.least
         if self._gone:
             raise self._error("fileTooShort", "The file became shorter while it was open.")
 
