@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
 """tools/mutate.py: changes module/ in one place at a time and shows that the suite notices.
 
-usage: tools/mutate.py [--count N] [--seed S] [--only TEXT] [--write FILE]
+usage: tools/mutate.py [--count N] [--seed S] [--only TEXT] [--list] [--write FILE]
 
 Each mutant is a copy of the module with one comparison, constant, text, table row, order of checks,
 argument or statement changed, but for what only the compiler runs. It is built, and the programs of
@@ -293,11 +293,15 @@ def main() -> int:
     parser.add_argument("--count", type=int, default=260, help="how many to try (default 260)")
     parser.add_argument("--seed", type=int, default=1)
     parser.add_argument("--only", default="", help="only those whose description has this in it")
+    parser.add_argument("--list", action="store_true", help="show them, and do nothing")
     parser.add_argument("--write", type=Path, help="the document that the result is written into")
     options = parser.parse_args()
     possible = all_mutants()
     mutants = chosen([m for m in possible if options.only in describe(m)],
                      options.count, options.seed)
+    if options.list:
+        print(*map(describe, mutants), sep="\n")
+        return 0
     verdicts: dict[Mutant, str] = {}
     start = time.monotonic()
     with tempfile.TemporaryDirectory() as folder:
