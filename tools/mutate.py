@@ -237,7 +237,8 @@ class Tree:
         # A number that is converted where it does not fit would often come out right.
         subprocess.run(["cmake", "-S", self.source, "-B", self.build, "-G", "Ninja",
                         "-DCMAKE_BUILD_TYPE=Debug", "-DTESSEL_PYTHON=OFF", "-DTESSEL_BENCH=OFF",
-                        "-DCMAKE_CXX_FLAGS=-O0 -g0 -fsanitize=float-cast-overflow "
+                        "-DCMAKE_CXX_FLAGS_DEBUG=-O0",  # and nothing for a debugger
+                        "-DCMAKE_CXX_FLAGS=-fsanitize=float-cast-overflow "
                         "-fno-sanitize-recover=all"],
                        check=True, capture_output=True)
 
