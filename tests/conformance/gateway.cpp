@@ -32,6 +32,8 @@ Rows rows() {
         {"a name in the second place is not found",   On::nothing, {58, "inq_libvers"},             refuses(notChar, notCharText)},
 
         {"an unknown name is shown in lower case",    On::nothing, {"Foo"},                         refuses(unknownName, "Unrecognized operation:  \"foo\"")},
+        {"every letter of it, and nothing beside them", On::nothing, {"ABCDEFGHIJKLMNOPQRSTUVWXYZ@[`{"},
+         refuses(unknownName, "Unrecognized operation:  \"abcdefghijklmnopqrstuvwxyz@[`{\"")},
         {"an unknown name with arguments",            On::nothing, {"foo", 1, 2},                   refuses(unknownName, "Unrecognized operation:  \"foo\"")},
         {"the empty name",                            On::nothing, {""},                            refuses(unknownName, "Unrecognized operation:  \"\"")},
         {"the empty name of 0x0",                     On::nothing, {empty(tsCHAR)},                 refuses(unknownName, "Unrecognized operation:  \"\"")},
