@@ -1,4 +1,4 @@
-# Debian packages, split as Debian would. In a build tree where the book was made: cpack -G DEB
+# Debian packages, split as Debian would. After the book: cpack --preset release
 #
 # debian/finish.cmake puts in what every package has; debian/amend.cmake mends what CPack cannot say.
 set(CPACK_GENERATOR DEB)
@@ -74,8 +74,8 @@ arrays, its engine for xarray, and the command tessel, which shows, draws,
 copies and checks netCDF files.")
     math(EXPR next "${Python3_VERSION_MINOR} + 1")
     set(CPACK_DEBIAN_PYTHON_PACKAGE_DEPENDS "${library} ${exactly}, tessel-module-netcdf ${exactly}, \
-python3 (<< 3.${next}), python3 (>= 3.${Python3_VERSION_MINOR}~), python3-numpy")
-    set(CPACK_DEBIAN_PYTHON_PACKAGE_RECOMMENDS "python3-cftime, python3-matplotlib")
+python3 (<< 3.${next}), python3 (>= 3.${Python3_VERSION_MINOR}~), python3-cftime, python3-numpy")
+    set(CPACK_DEBIAN_PYTHON_PACKAGE_RECOMMENDS python3-matplotlib)
     set(CPACK_DEBIAN_PYTHON_PACKAGE_SUGGESTS
         "python3-dask, python3-distributed, python3-xarray, tessel-doc")
     set(CPACK_DEBIAN_PYTHON_PACKAGE_CONTROL_EXTRA

@@ -7,21 +7,22 @@ fail() {
     exit 1
 }
 
-# The packages of packages.txt that are not installed, one a line.
+# missing_packages [full]: the packages of packages.txt that are not installed, one a line.
 missing_packages() {
-    local name
-    sed 's/#.*//' "$project/packages.txt" | xargs -n1 | while read -r name; do
+    local name only_full='/^# full:/,$d'
+    [[ ${1-} != full ]] || only_full=
+    sed "$only_full; s/#.*//" "$project/packages.txt" | xargs -n1 | while read -r name; do
         [[ $(dpkg-query -W -f='${db:Status-Status}' "$name" 2>/dev/null) == installed ]] ||
             printf '%s\n' "$name"
     done
 }
 
-# Installs what is missing. Needs neither network nor root where nothing is.
+# install_packages [full]: installs what is missing. Needs neither network nor root where nothing is.
 install_packages() {
     command -v dpkg-query >/dev/null ||
         fail "This needs Debian's dpkg. Install what packages.txt lists, then use CMakePresets.json."
     local missing as_root=()
-    mapfile -t missing < <(missing_packages)
+    mapfile -t missing < <(missing_packages "$@")
     ((${#missing[@]})) || return 0
     if ((EUID)); then
         command -v sudo >/dev/null ||
