@@ -4,10 +4,10 @@
 usage: xarray_engine.py [--write DOCUMENT] [--quick]
 
 The file has 1000 records of 256 by 512 floats, 524 MB, and a series of 8 million floats, in the
-64-bit offset format, and is in the system's cache. Each row is one piece of work done through each engine, on datasets that are open
-(but for opening) and keep no values. The engines take turns, in another order in each repetition.
-A time is the shortest of all repetitions, which other work on the machine disturbs least. Before
-anything is measured, the engines must give the same values.
+64-bit offset format, and is in the system's cache. Each row is one piece of work done through each
+engine, on datasets that are open (but for opening) and keep no values. The engines take turns, in
+another order in each repetition. A time is the shortest of all repetitions, which other work on the
+machine disturbs least. Before anything is measured, the engines must give the same values.
 
 --write puts the table between the marks in the document. --quick does everything once, on small
 data: it shows that the program works, and measures nothing. Run it on a machine that does nothing

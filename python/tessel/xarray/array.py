@@ -26,8 +26,8 @@ _LINE = 64
 """The bytes that the processor brings into its caches together."""
 
 _AT_ONCE = 1024
-"""So many lines that are fetched ahead are still in the inner caches when the library comes to them.
-For as many it is not worth it."""
+"""So many lines that are fetched ahead are still in the inner caches when the library comes to
+them. For fewer it is not worth it."""
 
 
 class LazyArray(BackendArray):

@@ -23,6 +23,7 @@ from __future__ import annotations
 import operator
 import os
 import threading
+from functools import cached_property
 from typing import Any, NamedTuple
 
 import tessel
@@ -30,8 +31,8 @@ from tessel import _faults, integrity
 from tessel.dataset import Dataset
 
 _LAYOUT_BEGIN, _LAYOUT_END = 8, 2**16
-"""The bytes of a file that may not change while it is open: those of its header, without the number of
-records at its beginning. Of a header that is longer, the rest is not compared."""
+"""The bytes of a file that may not change while it is open: those of its header, without the number
+of records at its beginning. Of a header that is longer, the rest is not compared."""
 
 FORMATS = (b"CDF\1", b"CDF\2")
 """How the files begin that the engine opens: the classic format and the one of 64-bit offsets."""
@@ -78,9 +79,6 @@ class OpenFile(Dataset):
         self._ids: list[int] = []
         self._data: int | None = None
         self._gone = False
-        self._address: int | None = None
-        """Where the library has mapped the file to."""
-
         self.varids: dict[tuple[str, bool], int] = {}
         """The numbers of the variables that were found to be what they are expected to be, by name
         and by whether they are read only once."""
@@ -134,26 +132,24 @@ class OpenFile(Dataset):
 
     def _opened_for_data(self) -> int:
         if self.mapped:
-            before = self._mappings()
             try:
-                opened = self._opened(MAPPED, LARGE_BUFFER)
-                self._address = next(iter(self._mappings() - before), None)
-                return opened
+                return self._opened(MAPPED, LARGE_BUFFER)
             except tessel.Error:
                 self.mapped = False  # the file system, or what memory there is, does not have it
         return self._opened("NOWRITE", LARGE_BUFFER)
 
-    def _mappings(self) -> set[int]:
-        """The addresses that this file is mapped to, from its beginning on; none where the system
-        does not tell."""
+    @cached_property
+    def _address(self) -> int | None:
+        """Where the file is mapped to, from its beginning on; None where the system does not tell.
+        Where it is mapped more than once, each of these places leads to the same memory."""
         inode = str(os.fstat(self._descriptor).st_ino)
         try:
             with open("/proc/self/maps", encoding="utf-8", errors="replace") as mappings:
                 fields = [line.split(None, 5) for line in mappings]
         except OSError:
-            return set()
-        return {int(each[0].partition("-")[0], 16) for each in fields
-                if each[4] == inode and int(each[2], 16) == 0}
+            return None
+        return next((int(each[0].partition("-")[0], 16) for each in fields
+                     if each[4] == inode and int(each[2], 16) == 0), None)
 
     def begin_of(self, varid: int) -> int | None:
         """Where a variable begins in the file; None where its header does not tell."""
@@ -166,9 +162,11 @@ class OpenFile(Dataset):
         other. `strides` has the bytes between the places along each dimension, and 0 for records.
         This is no access: nothing happens where there is no memory."""
         begin = self.begin_of(varid)
-        if self._address is not None and begin is not None:
+        with self._lock:
+            address = self._address if self.mapped and self._data is not None else None
+        if address is not None and begin is not None:
             steps = [each or self._extent.record for each in strides]
-            first = self._address + begin + sum(map(operator.mul, start, steps))
+            first = address + begin + sum(map(operator.mul, start, steps))
             _faults.fetch(first, count, steps)
 
     def _error(self, word: str, message: str) -> tessel.Error:
