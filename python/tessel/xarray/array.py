@@ -25,7 +25,7 @@ _MEMORY_OF_CHARACTER = 12
 _LINE = 64
 """The bytes that the processor brings into its caches together."""
 
-_AT_ONCE = 1024
+_AT_ONCE = 2048
 """So many lines that are fetched ahead are still in the inner caches when the library comes to
 them. For fewer it is not worth it."""
 
