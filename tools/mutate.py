@@ -208,14 +208,14 @@ def chosen(mutants: list[Mutant], count: int, seed: int) -> list[Mutant]:
     result: list[Mutant] = []
     while any(by_kind.values()) and len(result) < count:
         result += [of_kind.pop() for of_kind in by_kind.values() if of_kind]
-    return result
+    return result[:count]
 
 
 def describe(mutant: Mutant) -> str:
     text = (ROOT / mutant.file).read_text()
     line = text.count("\n", 0, mutant.start) + 1
-    old = text[mutant.start:mutant.end].strip().replace("\n", " ")
-    new = "(exchanged)" if mutant.new.startswith("\0") else mutant.new.strip().replace("\n", " ")
+    old = " ".join(text[mutant.start:mutant.end].split())
+    new = "(exchanged)" if mutant.new.startswith("\0") else " ".join(mutant.new.split())
     return f"{mutant.file}:{line}: {mutant.kind}: {old[:90]!r} -> {new[:90]!r}"
 
 
@@ -234,12 +234,13 @@ class Tree:
         self.source = folder / "source"
         self.build = folder / "build"
         shutil.copytree(ROOT, self.source, ignore=shutil.ignore_patterns("build", ".git", "output"))
-        # A number that is converted where it does not fit would often come out right.
+        # A number that is converted where it does not fit would often come out right, and so would
+        # one that is not there.
         subprocess.run(["cmake", "-S", self.source, "-B", self.build, "-G", "Ninja",
                         "-DCMAKE_BUILD_TYPE=Debug", "-DTESSEL_PYTHON=OFF", "-DTESSEL_BENCH=OFF",
                         "-DCMAKE_CXX_FLAGS_DEBUG=-O0",  # and nothing for a debugger
                         "-DCMAKE_CXX_FLAGS=-fsanitize=float-cast-overflow "
-                        "-fno-sanitize-recover=all"],
+                        "-fno-sanitize-recover=all -D_GLIBCXX_ASSERTIONS"],
                        check=True, capture_output=True)
 
     def compiles(self) -> bool:
