@@ -1,12 +1,13 @@
 // tests/long/mixed_calls.cpp: very many calls of all kinds, every third of which is an error.
 // Memory, descriptors and speed must not change. Usage:
 //
-//   long_mixed_calls [--calls N] [--hours H] [--leak]
+//   long_mixed_calls [--calls N] [--hours H] [--guard] [--leak]
 //
 // The run ends after N calls or H hours, whichever is given and comes last. It is looked at in
-// twenty parts. With --leak a result of every
-// hundredth call is kept, and one descriptor in a part; that must be noticed.
+// twenty parts. With --guard the module is behind its guard, as it is in Python. With --leak a
+// result of every hundredth call is kept, and one descriptor in a part; that must be noticed.
 #include "support/process.hpp"
+#include "tessel/netcdf_guard.hpp"
 #include "tessel/runtime.hpp"
 
 #include <fcntl.h>
@@ -40,6 +41,7 @@ using Clock = std::chrono::steady_clock;
 struct Options {
     std::size_t calls = 0;
     double hours = 0;
+    bool guard = false;
     bool leak = false;
 };
 
@@ -49,6 +51,8 @@ Options optionsOf(int argc, char **argv) {
         const std::string_view option = argv[i];
         if (option == "--leak") {
             options.leak = true;
+        } else if (option == "--guard") {
+            options.guard = true;
         } else if (option == "--calls" && i + 1 < argc) {
             options.calls = std::stoul(argv[++i]);
         } else if (option == "--hours" && i + 1 < argc) {
@@ -74,14 +78,16 @@ Array pair(double first, double second) {
 /// What calls are made with: a dataset that is open all the time, and a file that is opened and
 /// made anew.
 struct Scene {
-    Module netcdf{TESSEL_NETCDF_MODULE};
+    Module netcdf;
     tessel::test::Folder folder{tessel::test::placeInMemory()}; // the disk is not measured
     std::string file = folder.file("open.nc");
     std::string other = folder.file("other.nc");
     double ncid = 0;
     Array block = Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{columns, rows});
 
-    Scene() {
+    explicit Scene(bool guarded)
+        : netcdf(guarded ? Module(TESSEL_NETCDF_MODULE).watchedBy(tessel::netcdfGuard())
+                         : Module(TESSEL_NETCDF_MODULE)) {
         for (double &value : block.elements<double>()) {
             value = 21;
         }
@@ -250,7 +256,7 @@ class Run {
     }
 
     Options options;
-    Scene scene;
+    Scene scene{options.guard};
     std::mt19937 lot{1};
     std::vector<Array> kept;
     std::chrono::duration<double> hours{options.hours * 3600};
