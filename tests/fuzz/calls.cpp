@@ -131,12 +131,47 @@ bool asksForHdf5(std::string_view operation, const std::vector<Array> &inputs) {
                    : value >= 3 && value < 5;
 }
 
+/// An operation's name as the module reads it.
+std::string lowered(std::string text) {
+    text.resize(std::min(text.size(), text.find('\0')));
+    for (char &c : text) {
+        c = c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c;
+    }
+    return text;
+}
+
+bool opensFile(std::string_view operation) {
+    return operation.ends_with("open") || operation.ends_with("create");
+}
+
+/// Whether a step keeps a file in memory. There is no full disk, and the library fills variables
+/// there a block at a time, each of which moves all that is there: minutes for some MiB.
+bool keepsInMemory(const Step &step) {
+    constexpr unsigned flags = 0x8 | 0x10 | 0x8000;
+    return opensFile(lowered(step.operation)) && step.inputs.size() > 1 &&
+           !step.inputs[1].elements.empty() &&
+           (static_cast<unsigned>(nearest<std::int32_t>(step.inputs[1].elements[0])) & flags) != 0;
+}
+
+/// Whether a call may define what has more than some thousand values.
+bool definesMuch(std::string_view operation, const std::vector<Array> &inputs) {
+    constexpr std::size_t mostDimensions = 4;
+    constexpr double mostLength = 8;
+    if (operation.ends_with("def_var")) {
+        return inputs.size() > 4 && inputs[4].size() > mostDimensions;
+    }
+    return operation.ends_with("def_dim") && inputs.size() > 3 && inputs[3].size() > 0 &&
+           (inputs[3].classID() != tsDOUBLE || inputs[3].number() > mostLength);
+}
+
 /// One run: what it opened, so that calls can name it, and that all of it is ended.
 class Session {
   public:
-    explicit Session(const tessel::Module &module) : netcdf(module) {}
+    Session(const tessel::Module &module, const Sequence &sequence)
+        : netcdf(module), inMemory(std::any_of(sequence.begin(), sequence.end(), keepsInMemory)) {}
 
-    void call(const Step &step) {
+    /// Makes a call, and says what came of it.
+    std::string call(const Step &step) {
         std::vector<Array> held;
         held.push_back(arrayOf(characters(step.operation)));
         for (const Value &value : step.inputs) {
@@ -144,45 +179,52 @@ class Session {
                                                               : arrayOf(value));
         }
         const std::string name = lowered(step.operation);
-        const bool opens = name.ends_with("open") || name.ends_with("create");
+        const bool opens = opensFile(name);
         if (opens && held.size() > 1) {
             keepInFolder(held[1]);
         }
-        if (asksForHdf5(name, held)) {
-            return;
+        if (asksForHdf5(name, held) || (inMemory && definesMuch(name, held))) {
+            return "left out";
         }
         std::vector<const tsArray *> inputs(held.size());
         std::transform(held.begin(), held.end(), inputs.begin(),
                        [](const Array &array) { return array.get(); });
         const Outcome outcome = calledWith(netcdf, inputs, step.outputs);
-        note(outcome.identifier.empty() ? name + std::to_string(outcome.results.size())
-                                        : outcome.identifier);
+        std::string came = outcome.identifier.empty()
+                               ? name + std::to_string(outcome.results.size())
+                               : outcome.identifier;
+        note(came);
+        noteEnd(name, came);
+        changesFormat = changesFormat || name.ends_with("set_default_format");
         if (opens && outcome.identifier.empty()) {
             opened.push_back(lastNumber(outcome.results));
         }
+        return came;
     }
 
     /// Ends all datasets, the ones that the disk is too full for once there is room again. What is
-    /// left are the files of those that a failed close has ended half, which the library forgets.
+    /// left are the files of those that a failed end has ended half, which the library forgets.
     Scratch::Left end() {
-        Scratch::Left left = Scratch::Left::nothing;
         for (const int ncid : opened) {
             std::string identifier = called(netcdf, "abort", ncid).identifier;
-            if (identifier == ended) {
-                left = Scratch::Left::files;
-            } else if (!isGone(identifier)) {
-                note("end" + identifier);
-                Scratch::setFull(false);
-                identifier.append(1, ' ').append(called(netcdf, "close", ncid).identifier);
-                Scratch::setFull(true);
+            if (isGone(identifier)) {
+                left = identifier == ended ? Scratch::Left::files : left;
+                continue;
             }
+            note("end" + identifier);
+            noteEnd("abort", identifier);
+            Scratch::setFull(false);
+            identifier.append(1, ' ').append(called(netcdf, "close", ncid).identifier);
+            Scratch::setFull(true);
             const std::string after = called(netcdf, "inq", ncid).identifier;
             if (after.empty() || !isGone(after)) {
                 die("a dataset is still there after its end: " +
                     identifier.append(" ").append(after));
             }
         }
-        called(netcdf, "set_default_format", 1);
+        if (changesFormat) {
+            called(netcdf, "set_default_format", 1);
+        }
         return left;
     }
 
@@ -193,22 +235,24 @@ class Session {
         return identifier.empty() || identifier.ends_with(":notNetcdfID") || identifier == ended;
     }
 
+    /// An abort in data mode forgets the dataset and not its file, when there is no room for the
+    /// header.
+    void noteEnd(std::string_view operation, std::string_view identifier) {
+        if (operation.ends_with("abort") && identifier.ends_with(":fileTooLarge")) {
+            left = Scratch::Left::files;
+        }
+    }
+
     [[nodiscard]] int idOf(std::size_t slot) const {
         constexpr int noDataset = 7;
         return opened.empty() ? noDataset : opened[slot % opened.size()];
     }
 
-    /// The operation as the module reads it.
-    static std::string lowered(std::string text) {
-        text.resize(std::min(text.size(), text.find('\0')));
-        for (char &c : text) {
-            c = c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c;
-        }
-        return text;
-    }
-
     const tessel::Module &netcdf;
+    bool inMemory; // one of the files
     std::vector<int> opened;
+    Scratch::Left left = Scratch::Left::nothing;
+    bool changesFormat = false;
 };
 
 } // namespace
@@ -221,12 +265,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t *data, std::size_t size
     const fuzz::Sequence sequence =
         fuzz::parsed(std::string_view(reinterpret_cast<const char *>(data), size));
     fuzz::Scratch::setFull(true);
-    fuzz::Session session(netcdf);
+    fuzz::Session session(netcdf, sequence);
     for (const fuzz::Step &step : sequence) {
         if (shows) {
             std::cerr << fuzz::printed({step}) << std::flush;
         }
-        session.call(step);
+        const std::string came = session.call(step);
+        if (shows) {
+            std::cerr << "  " << came << std::endl;
+        }
     }
     const fuzz::Scratch::Left left = session.end();
     fuzz::Scratch::setFull(false);

@@ -1,6 +1,8 @@
 // tests/fuzz/scratch.hpp: where the fuzzers work, and what they may use there.
 #pragma once
 
+#include <dirent.h>
+
 #include <cstddef>
 #include <span>
 #include <string>
@@ -25,8 +27,8 @@ class Scratch {
 
     enum class Left { nothing, files };
 
-    /// Removes every file, and dies if one is open. Where some are known to be left, it closes
-    /// them.
+    /// Removes every file of the folder, and dies if one is open. Where some are known to be left,
+    /// it closes them.
     void clean(Left left = Left::nothing) const;
 
     /// Whether the disk is full for files above a MiB. The fuzzer's own files are larger.
@@ -37,6 +39,7 @@ class Scratch {
 
     std::string root;
     std::string folder;
+    DIR *entries = nullptr; // of the folder
 };
 
 /// Tells the fuzzer that something of this description happened, so that it keeps inputs that make

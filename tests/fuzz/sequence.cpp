@@ -195,9 +195,11 @@ std::size_t sizeOf(const Value &value) {
 
 Sequence parsed(std::string_view text) {
     Sequence sequence;
+    sequence.reserve(mostSteps);
     while (!text.empty() && sequence.size() < mostSteps) {
         std::string_view line = taken(text, '\n');
         Step step{std::string(taken(line, ' ')), {}};
+        step.inputs.reserve(mostInputs);
         while (!line.empty() && step.inputs.size() < mostInputs) {
             const std::string_view word = taken(line, ' ');
             if (word.starts_with('>')) {
