@@ -15,6 +15,7 @@ namespace tessel::guard {
 struct Dataset {
     std::string path;
     bool classic = true; // not based on HDF5
+    bool writable = true;
     bool defining = false;
     bool filling = true;
     bool dead = false; // its end failed

@@ -14,8 +14,10 @@
 #include <array>
 #include <cctype>
 #include <cstddef>
+#include <filesystem>
 #include <iterator>
 #include <string_view>
+#include <system_error>
 
 namespace tessel {
 namespace guard {
@@ -94,6 +96,55 @@ bool lookAtOpening(const std::string &path, int flags) {
         refuse(header, "the header of " + inQuotes(path) + " " + *found.claim);
     }
     return found.classic;
+}
+
+/// Whether a file that is opened with this mode may be written to.
+bool opensForWriting(const tsArray *mode) {
+    constexpr int write = 1;
+    if (tsGetClassID(mode) != tsCHAR) {
+        return (integer(mode).value_or(0) & write) != 0;
+    }
+    std::string name = utf8Of(mode);
+    std::transform(name.begin(), name.end(), name.begin(),
+                   [](unsigned char c) { return std::toupper(c); });
+    return name == "WRITE" || name == "NC_WRITE";
+}
+
+/// Synchronising a dataset that is open for reading makes the library read its header again. Which
+/// of the open files is the dataset's is not known, when its name leads to another one by now.
+void lookAtOpenHeaders() {
+    for (const std::string &file : filesOpenForReading()) {
+        if (const Header found = headerOf(file); found.claim) {
+            std::error_code ignored;
+            refuse(header, "the header of " +
+                               inQuotes(std::filesystem::read_symlink(file, ignored).string()) +
+                               " " + *found.claim);
+        }
+    }
+}
+
+/// Closing in data mode synchronises first. When that fails the library has freed the dataset's
+/// memory, and not its id; and what it writes then may fail unnoticed. A synchronisation by itself
+/// that fails leaves all as it is, so that closing can be repeated; its error is that of closing.
+void synchronise(int ncid, const Ask &ask) {
+    try {
+        ask("sync", ncid);
+    } catch (const Error &error) {
+        std::string identifier = error.identifier();
+        std::string message = error.message();
+        const auto replace = [](std::string &text, std::string_view what, std::string_view by) {
+            const std::size_t at = text.find(what);
+            if (at != std::string::npos) {
+                text.replace(at, what.size(), by);
+            }
+        };
+        if (identifier.ends_with(":operationNotAllowedInDefineMode")) {
+            return; // the module was called without its guard meanwhile
+        }
+        replace(identifier, ":sync:", ":close:");
+        replace(message, "sync", "close");
+        throw Error(identifier, message);
+    }
 }
 
 /// Whether so much memory can be mapped.
@@ -277,6 +328,7 @@ class Guard : public Watcher {
             }
             lookAtName(*name, options);
             path = withoutBlanks(*std::move(name));
+            writable = kind == Kind::create || opensForWriting(inputs[2]);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             classic =
@@ -290,6 +342,13 @@ class Guard : public Watcher {
             return;
         }
         Dataset *const dataset = datasets().find(*ncid);
+        if (kind == Kind::sync && dataset != nullptr && dataset->classic && !dataset->writable) {
+            lookAtOpenHeaders();
+        }
+        if (kind == Kind::close && dataset != nullptr && dataset->writable &&
+            survivesItsEnd(*dataset)) {
+            synchronise(*ncid, ask);
+        }
         try {
             if (kind == Kind::tunedEndDefinition) {
                 lookAtAlignment(inputs, *ncid, dataset, ask);
@@ -325,7 +384,7 @@ class Guard : public Watcher {
             return;
         }
         Dataset *const dataset = datasets().find(*first);
-        if (kind == Kind::end) {
+        if (kind == Kind::close || kind == Kind::abort) {
             rememberEnd(*first, dataset, error);
         } else if (error == nullptr && dataset != nullptr) {
             rememberChange(inputs, *dataset);
@@ -337,6 +396,7 @@ class Guard : public Watcher {
         dataset.path = std::move(path);
         dataset.defining = kind == Kind::create;
         dataset.classic = classic;
+        dataset.writable = writable;
         datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
     }
 
@@ -376,9 +436,10 @@ class Guard : public Watcher {
     }
 
     GuardOptions options;
-    Kind kind = Kind::other;      // of the call in progress
-    std::string path;             // of what it opens
-    bool classic = false;         // whether that is of a classic format
+    Kind kind = Kind::other; // of the call in progress
+    std::string path;        // of what it opens
+    bool classic = false;    // whether that is of a classic format
+    bool writable = true;
     std::uint64_t recordsEnd = 0; // where it ends, if it writes records
 };
 

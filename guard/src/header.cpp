@@ -3,12 +3,14 @@
 
 #include "external_types.hpp"
 
+#include <dirent.h>
 #include <fcntl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
 #include <array>
+#include <charconv>
 #include <cstddef>
 #include <cstdint>
 #include <optional>
@@ -216,6 +218,26 @@ Header headerOf(const std::string &path) {
         found.claim = distrusted.claim;
     }
     return found;
+}
+
+std::vector<std::string> filesOpenForReading() {
+    const std::string folder = "/proc/self/fd/";
+    std::vector<std::string> files;
+    DIR *const entries = opendir(folder.c_str());
+    while (const dirent *entry = entries == nullptr ? nullptr : readdir(entries)) {
+        const std::string_view name = entry->d_name;
+        int file = -1;
+        std::from_chars(name.data(), name.data() + name.size(), file);
+        struct stat status {};
+        if (file >= 0 && fstat(file, &status) == 0 && S_ISREG(status.st_mode) &&
+            (fcntl(file, F_GETFL) & O_ACCMODE) == O_RDONLY) {
+            files.push_back(std::string(folder).append(name));
+        }
+    }
+    if (entries != nullptr) {
+        closedir(entries);
+    }
+    return files;
 }
 
 } // namespace tessel::guard

@@ -3,6 +3,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace tessel::guard {
 
@@ -19,5 +20,9 @@ struct Header {
 /// NC_MAX_NAME and variables of more than NC_MAX_VAR_DIMS dimensions (both overflow the buffers
 /// that the library's documentation tells programs to use).
 Header headerOf(const std::string &path);
+
+/// The files that the process has open for reading only, by names that lead to them whatever became
+/// of their own.
+std::vector<std::string> filesOpenForReading();
 
 } // namespace tessel::guard

@@ -16,7 +16,9 @@ enum class Kind {
     other,
     open,
     create,
-    end, // close and abort
+    close,
+    abort,
+    sync,
     redefine,
     endDefinition,
     tunedEndDefinition,

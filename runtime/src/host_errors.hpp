@@ -3,6 +3,7 @@
 
 #include "tessel/runtime/error.hpp"
 
+#include <initializer_list>
 #include <new>
 #include <string>
 #include <string_view>
@@ -53,10 +54,18 @@ auto orOutOfMemory(const Make &make) {
     }
 }
 
-[[noreturn]] inline void raise(const HostError &error, std::string_view detail) {
-    throw Error(error.identifier, orOutOfMemory([&] {
-                    return std::string(error.message) + ": " + std::string(detail);
-                }));
+/// An error whose message goes on with what is given.
+inline Error completed(const HostError &error,
+                       std::initializer_list<std::string_view> texts) noexcept {
+    try {
+        std::string message = error.message;
+        for (const std::string_view text : texts) {
+            message += text;
+        }
+        return {error.identifier, message};
+    } catch (const std::bad_alloc &) {
+        return {host_errors::outOfMemory.identifier, host_errors::outOfMemory.message};
+    }
 }
 
 } // namespace tessel

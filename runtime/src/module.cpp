@@ -107,22 +107,18 @@ std::vector<std::filesystem::path> searchFolders() {
     return folders;
 }
 
-/// What went wrong in the module, as a host error. Called while the exception is being handled.
+/// What left the module and is no Error, as one. Called while the exception is being handled.
 Error translated() {
     try {
         throw;
-    } catch (const Error &error) {
-        return error;
     } catch (const std::bad_alloc &) {
         return {host_errors::outOfMemory.identifier, host_errors::outOfMemory.message};
     } catch (const std::exception &error) {
-        return {host_errors::foreignException.identifier,
-                std::string(host_errors::foreignException.message) + ": " + error.what()};
+        return completed(host_errors::foreignException, {": ", error.what()});
     } catch (const abi::__forced_unwind &) {
         throw; // the thread is being cancelled, which is not an error and must go on
     } catch (...) {
-        return {host_errors::foreignException.identifier,
-                std::string(host_errors::foreignException.message) + "."};
+        return completed(host_errors::foreignException, {"."});
     }
 }
 
@@ -183,6 +179,45 @@ const std::filesystem::path &Module::file() const noexcept {
     return loaded->file;
 }
 
+/// How a call ended: with results, or with an error, which is raised once all is tidy.
+struct Module::Ending {
+    Results results;
+    std::optional<Error> error;
+
+    Results given() {
+        if (error) {
+            throw *error;
+        }
+        return std::move(results);
+    }
+};
+
+/// Tells a watcher how a call ended, also when it ends by the end of its thread, which is
+/// cancelled.
+class Module::Told {
+  public:
+    Told(Watcher &watching, Inputs watched) : watcher(watching), inputs(watched) {}
+    ~Told() {
+        if (!told) {
+            const Error cancelled =
+                completed(host_errors::foreignException, {": the thread was cancelled."});
+            watcher.after(inputs, Results(), &cancelled);
+        }
+    }
+    Told(const Told &) = delete;
+    Told &operator=(const Told &) = delete;
+
+    void tell(const Ending &ending) noexcept {
+        told = true;
+        watcher.after(inputs, ending.results, ending.error ? &*ending.error : nullptr);
+    }
+
+  private:
+    Watcher &watcher;
+    Inputs inputs;
+    bool told = false;
+};
+
 Results Module::call(std::span<const tsArray *> inputs, const CallOptions &options) const {
     if (CallFrame::current() != nullptr) {
         raise(host_errors::nestedCall);
@@ -198,17 +233,13 @@ Results Module::call(std::span<const tsArray *> inputs, const CallOptions &optio
     }
     const std::lock_guard lock(callLock);
     if (!watcher) {
-        return run(inputs, options);
+        return run(inputs, options).given();
     }
     orOutOfMemory([&] { watcher->before(inputs, Ask(*this)); });
-    try {
-        Results results = run(inputs, options);
-        watcher->after(inputs, results, nullptr);
-        return results;
-    } catch (const Error &error) {
-        watcher->after(inputs, Results(), &error);
-        throw;
-    }
+    Told told(*watcher, inputs);
+    Ending ending = run(inputs, options);
+    told.tell(ending);
+    return ending.given();
 }
 
 Module Module::watchedBy(std::shared_ptr<Watcher> next) const {
@@ -218,12 +249,12 @@ Module Module::watchedBy(std::shared_ptr<Watcher> next) const {
 }
 
 Results Ask::call(std::span<const tsArray *> inputs) const {
-    return module.run(inputs, {});
+    return module.run(inputs, {}).given();
 }
 
 /// One call, by a thread that has the lock.
-Results Module::run(std::span<const tsArray *> inputs, const CallOptions &options) const {
-    Results results;
+Module::Ending Module::run(std::span<const tsArray *> inputs, const CallOptions &options) const {
+    Ending ending;
     CallFrame frame(options);
     std::array<tsArray *, Results::slots> slots{};
     const auto enter = [&] {
@@ -232,24 +263,25 @@ Results Module::run(std::span<const tsArray *> inputs, const CallOptions &option
                            inputs.data());
         for (std::size_t i = 0; i < slots.size(); ++i) {
             if (slots[i] != nullptr) {
-                results.arrays[i] = frame.give(slots[i]);
-                results.count = i + 1;
+                ending.results.arrays[i] = frame.give(slots[i]);
+                ending.results.count = i + 1;
             }
         }
     };
-    std::optional<Error> error;
     try {
         enter();
+    } catch (const Error &error) {
+        ending.error = error;
     } catch (...) {
-        error = translated();
+        ending.error = translated();
     }
     if (const char *fault = frame.inspect()) {
-        raise(host_errors::violation, fault);
+        ending.error = completed(host_errors::violation, {": ", fault});
     }
-    if (error) {
-        throw *std::move(error);
+    if (ending.error) {
+        ending.results = Results();
     }
-    return results;
+    return ending;
 }
 
 } // namespace tessel

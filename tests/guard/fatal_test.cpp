@@ -6,6 +6,9 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <csignal>
+#include <cstdio>
+#include <cstring>
 #include <functional>
 #include <ostream>
 
@@ -18,8 +21,9 @@ constexpr double wraps = -1; // as a count: 2^64-1
 
 struct Fatal {
     const char *name;
-    const char *identifier;
-    const char *why; // what the message says
+    int signal;             // that ends the process without the guard
+    const char *identifier; // of the guard's error
+    const char *why;        // what the message says
     std::function<void(const Module &netcdf, const Folder &folder)> call;
 };
 
@@ -41,7 +45,7 @@ int unclosable(const Module &netcdf, const Folder &folder) {
 void writeStrided(const Module &netcdf, const Folder &folder, const char *operation, int varid,
                   const Array &start, const Array &count, const Array &stride) {
     const int ncid = newDataset(netcdf, folder.file("a.nc"));
-    netcdf("set_fill", ncid, 256);
+    netcdf("set_fill", ncid, noFill);
     const Array one = Array::scalar(1);
     if (stride) {
         netcdf(operation, ncid, varid, start, count, stride, one);
@@ -54,6 +58,11 @@ int open(const Module &netcdf, const Folder &folder, const std::string &bytes) {
     return intOf(netcdf("open", written(folder, "a.nc", bytes), "NOWRITE"));
 }
 
+std::string variableOfType(std::uint32_t type) {
+    return "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) + "v\0\0\0"s +
+           words({1, 0, 0, 0, type, 4, 100}) + std::string(16, '\0');
+}
+
 /// In define mode, with a variable.
 int definingDataset(const Module &netcdf, const Folder &folder) {
     const int ncid = newDataset(netcdf, folder.file("a.nc"));
@@ -62,79 +71,100 @@ int definingDataset(const Module &netcdf, const Folder &folder) {
 }
 
 const Fatal rows[] = {
-    {"AlignmentOfTheData", "TESSEL:guard:alignment", "an alignment is 0, and the library divides",
+    {"AlignmentOfTheData", SIGFPE, "TESSEL:guard:alignment",
+     "an alignment is 0, and the library divides",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_enddef", definingDataset(netcdf, folder), 0, 0, 0, 4);
      }},
-    {"AlignmentOfTheRecords", "TESSEL:guard:alignment", "an alignment is 0",
+    {"AlignmentOfTheRecords", SIGFPE, "TESSEL:guard:alignment", "an alignment is 0",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("nc__enddef", definingDataset(netcdf, folder), 0, 4, 0, 0.5);
      }},
-    {"CreateWithAUserFormat", "TESSEL:guard:mode", "the flag 64 (a user-defined format) is set",
+    {"CreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode",
+     "the flag 64 (a user-defined format) is set",
      [](const Module &netcdf, const Folder &folder) { netcdf("create", folder.file("a.nc"), 64); }},
-    {"CreateWithTheOtherUserFormat", "TESSEL:guard:mode", "the flag 128",
+    {"CreateWithTheOtherUserFormat", SIGSEGV, "TESSEL:guard:mode", "the flag 128",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("NC_CREATE", folder.file("a.nc"), 128 + 1);
      }},
-    {"TunedCreateWithAUserFormat", "TESSEL:guard:mode", "the flag 64",
+    {"TunedCreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode", "the flag 64",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 64, 1024, 1024);
      }},
-    {"OpenInMemory", "TESSEL:guard:mode", "the flag 32768 (NC_INMEMORY) is set",
+    {"OpenInMemory", SIGSEGV, "TESSEL:guard:mode", "the flag 32768 (NC_INMEMORY) is set",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("open", folder.file("a.nc"), 32768);
      }},
-    {"TunedOpenInMemory", "TESSEL:guard:mode", "the flag 32768",
+    {"TunedOpenInMemory", SIGSEGV, "TESSEL:guard:mode", "the flag 32768",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("nc__open", folder.file("a.nc"), 32768 + 1, 1024);
      }},
-    {"CreateInMoreMemoryThanThereIs", "TESSEL:guard:mode",
+    {"CreateInMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mode",
      "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
      }},
-    {"OpenOfATypeWithoutSize", "TESSEL:guard:header", "has a variable of the type 12",
-     [](const Module &netcdf, const Folder &folder) {
-         open(netcdf, folder,
-              "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) +
-                  "v\0\0\0"s + words({1, 0, 0, 0, 12, 4, 100}));
-     }},
-    {"NameWhoseLengthTheFileEndsIn", "TESSEL:guard:header", "characters in a name",
+    {"OpenOfATypeWithoutSize", SIGFPE, "TESSEL:guard:header", "has a variable of the type 12",
+     [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); }},
+    {"NameWhoseLengthTheFileEndsIn", SIGSEGV, "TESSEL:guard:header", "characters in a name",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),
                 0);
      }},
-    {"CloseAfterACloseThatFailed", "TESSEL:guard:closed", "a.nc\"",
+    {"CloseAfterACloseThatFailed", SIGSEGV, "TESSEL:guard:closed", "a.nc\"",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", unclosable(netcdf, folder));
      }},
-    {"AbortAfterACloseThatFailed", "TESSEL:guard:closed", "a.nc\"",
+    {"AbortAfterACloseThatFailed", SIGSEGV, "TESSEL:guard:closed", "a.nc\"",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("abort", unclosable(netcdf, folder));
      }},
-    {"CountsThatWrapInRecords", "TESSEL:guard:counts", "multiply to more than 64 bits hold",
+    {"CloseAgainAfterAChangeOnAFullDisk", SIGSEGV, "TESSEL:netcdf:close:fileTooLarge",
+     "Unable to close netCDF file, library error message \"File too large\"",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+         const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
+         netcdf("def_var", ncid, "v", ncDouble, x);
+         netcdf("set_fill", ncid, noFill);
+         netcdf("enddef", ncid);
+         netcdf("rename_var", ncid, 0, "w");
+         netcdf("put_var1_double", ncid, 0, 19999, 1);
+         const FullDisk full;
+         EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }),
+                   "TESSEL:netcdf:close:fileTooLarge");
+         netcdf("close", ncid);
+     }},
+    {"SynchronisingAHeaderThatWasOverwritten", SIGFPE, "TESSEL:guard:header",
+     "has a variable of the type 12",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = open(netcdf, folder, variableOfType(4));
+         written(folder, "a.nc", variableOfType(12));
+         netcdf("sync", ncid);
+     }},
+    {"CountsThatWrapInRecords", SIGALRM, "TESSEL:guard:counts",
+     "multiply to more than 64 bits hold",
      [](const Module &netcdf, const Folder &folder) {
          writeStrided(netcdf, folder, "put_vars_double", 1, Array::row({1, 0}),
                       Array::row({wraps, wraps}), Array::row({2, 1}));
      }},
-    {"CountsThatWrapInABlock", "TESSEL:guard:counts", "or for ever",
+    {"CountsThatWrapInABlock", SIGXFSZ, "TESSEL:guard:counts", "or for ever",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = newDataset(netcdf, folder.file("a.nc"));
          netcdf("put_vara_double", ncid, 1, Array::row({0, 0}), Array::row({2, 0x1p63 + 2048}),
                 Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{2, 2048}));
      }},
-    {"AnElementFarBeyondTheRecords", "TESSEL:guard:records",
+    {"AnElementFarBeyondTheRecords", SIGXFSZ, "TESSEL:guard:records",
      "ends at record 4000000000, and 4000000000 records of 80 bytes",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = newDataset(netcdf, folder.file("a.nc"));
          netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
      }},
-    {"ABlockFarBeyondTheRecords", "TESSEL:guard:records", "NC_NOFILL",
+    {"ABlockFarBeyondTheRecords", SIGXFSZ, "TESSEL:guard:records", "NC_NOFILL",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = newDataset(netcdf, folder.file("a.nc"));
          netcdf("put_vara_double", ncid, 1, Array::row({0, 4e9}), Array::row({1, 1}), 1);
      }},
-    {"AStepFarBeyondTheRecords", "TESSEL:guard:records", "ends at record 2000000000",
+    {"AStepFarBeyondTheRecords", SIGXFSZ, "TESSEL:guard:records", "ends at record 2000000000",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = newDataset(netcdf, folder.file("a.nc"));
          netcdf("put_vars_double", ncid, 1, Array::row({0, 0}), Array::row({1, 2}),
@@ -142,19 +172,21 @@ const Fatal rows[] = {
      }},
 };
 
-class FatalCall : public testing::TestWithParam<Fatal> {};
-
-enum class End { survived, raised, notSurvived };
 constexpr int survivedCode = 100;
 constexpr int raisedCode = 101;
 
-/// What becomes of a process that makes the call without the guard: it is given two seconds, and
-/// little room on the disk.
-End endWithoutGuard(const Fatal &fatal) {
+class FatalCall : public testing::TestWithParam<Fatal> {};
+
+/// How a process ends that makes the call without the guard: it is given two seconds, and little
+/// room on the disk.
+std::string endWithoutGuard(const Fatal &fatal) {
     const Folder folder;
     const pid_t child = fork();
     if (child == 0) {
         std::freopen("/dev/null", "w", stderr);
+        for (const int signal : {SIGSEGV, SIGBUS, SIGFPE, SIGABRT}) {
+            std::signal(signal, SIG_DFL); // a sanitizer would exit
+        }
         const rlimit room = {std::size_t{64} << 20U, std::size_t{64} << 20U};
         const rlimit none = {0, 0};
         setrlimit(RLIMIT_FSIZE, &room);
@@ -165,17 +197,14 @@ End endWithoutGuard(const Fatal &fatal) {
     }
     int status = 0;
     waitpid(child, &status, 0);
-    if (WIFEXITED(status) && WEXITSTATUS(status) == survivedCode) {
-        return End::survived;
+    if (WIFSIGNALED(status)) {
+        return strsignal(WTERMSIG(status));
     }
-    if (WIFEXITED(status) && WEXITSTATUS(status) == raisedCode) {
-        return End::raised;
-    }
-    return End::notSurvived; // by a signal, or by the sanitizer, which exits with 1
+    return "exit with " + std::to_string(WEXITSTATUS(status));
 }
 
 TEST_P(FatalCall, IsFatalWithoutTheGuard) {
-    EXPECT_EQ(endWithoutGuard(GetParam()), End::notSurvived);
+    EXPECT_EQ(endWithoutGuard(GetParam()), strsignal(GetParam().signal));
 }
 
 TEST_P(FatalCall, IsRefusedByTheGuard) {

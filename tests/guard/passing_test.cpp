@@ -1,17 +1,16 @@
-// tests/guard/passing_test.cpp: what looks like a refused call and is none, addresses, and the
-// watcher itself.
+// tests/guard/passing_test.cpp: what looks like a refused call and is none, addresses, and closing.
 #include "support.hpp"
 
-#include <sys/resource.h>
-
-#include <csignal>
 #include <cstddef>
 #include <functional>
 #include <ostream>
+#include <utility>
 #include <vector>
 
 namespace tessel::test {
 namespace {
+
+using namespace std::string_literals;
 
 struct Passing {
     const char *name;
@@ -263,20 +262,6 @@ TEST(ClosedDatasets, AreKnownEvenIfTheyWereOpenedWithoutTheGuard) {
     EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:guard:closed");
 }
 
-/// What a call raises while files cannot grow beyond 64 KiB.
-template <class Call>
-std::string identifierOnFullDisk(const Call &call) {
-    rlimit before{};
-    getrlimit(RLIMIT_FSIZE, &before);
-    const rlimit full = {rlim_t{1} << 16U, before.rlim_max};
-    auto *const handler = std::signal(SIGXFSZ, SIG_IGN);
-    setrlimit(RLIMIT_FSIZE, &full);
-    std::string identifier = identifierOf(call);
-    setrlimit(RLIMIT_FSIZE, &before);
-    std::signal(SIGXFSZ, handler);
-    return identifier;
-}
-
 TEST(ClosedDatasets, CanBeClosedAgainWhenTheDiskWasFull) {
     const Folder folder;
     const Module netcdf = guardedModule();
@@ -287,7 +272,10 @@ TEST(ClosedDatasets, CanBeClosedAgainWhenTheDiskWasFull) {
     netcdf("enddef", ncid);
     netcdf("put_var1_double", ncid, 0, 0, 7);
     const auto close = [&] { netcdf("close", ncid); };
-    EXPECT_TRUE(identifierOnFullDisk(close).starts_with("TESSEL:netcdf:close:"));
+    {
+        const FullDisk full;
+        EXPECT_EQ(identifierOf(close), "TESSEL:netcdf:close:fileTooLarge");
+    }
     EXPECT_EQ(netcdf("inq_dim", ncid, 0)[1].number(), 20000) << "it is open still";
     EXPECT_EQ(identifierOf(close), "");
     const int again = intOf(netcdf("open", folder.file("a.nc"), "NOWRITE"));
@@ -295,38 +283,91 @@ TEST(ClosedDatasets, CanBeClosedAgainWhenTheDiskWasFull) {
     netcdf("close", again);
 }
 
-/// Notes what it sees.
-class Notes : public Watcher {
-  public:
-    void before(Inputs inputs, const Ask &ask) override {
-        seen.push_back(utf8Of(inputs[0]));
-        asked = ask("inq_libvers")[0].utf8();
-        if (seen.back() == "refuse") {
-            throw Error("test:refused", "No.");
+/// A file of 160 kB, whose last value is changed, is closed on a full disk, and again when there is
+/// room. What the first closing raised, and the value then.
+std::pair<std::string, double> closedOnAFullDisk(const Module &netcdf, const Folder &folder) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
+    netcdf("def_var", ncid, "v", ncDouble, x);
+    netcdf("enddef", ncid);
+    netcdf("sync", ncid);
+    netcdf("put_var1_double", ncid, 0, 19999, 7);
+    const auto close = [&] { netcdf("close", ncid); };
+    std::string raised;
+    {
+        const FullDisk full;
+        raised = identifierOf(close);
+    }
+    EXPECT_EQ(identifierOf(close), raised.empty() ? "TESSEL:netcdf:close:notNetcdfID" : "");
+    const int again = intOf(netcdf("open", folder.file("a.nc"), "NOWRITE"));
+    const double value = netcdf("get_var1_double", again, 0, 19999)[0].number();
+    netcdf("close", again);
+    return {raised, value};
+}
+
+TEST(Closing, SaysWithTheGuardThatTheLastBufferWasNotWritten) {
+    const Folder folder;
+    constexpr double filled = 9.9692099683868690e+36;
+    EXPECT_EQ(closedOnAFullDisk(plainModule(), folder), std::pair(""s, filled)) << "7 is lost";
+    EXPECT_EQ(closedOnAFullDisk(guardedModule(), folder),
+              std::pair("TESSEL:netcdf:close:fileTooLarge"s, 7.0));
+}
+
+TEST(Closing, SynchronisesWhatIsOpenForWriting) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+    const Array modes[] = {Array::text("WRITE"), Array::text("nc_Write"), Array::scalar(1),
+                           Array::scalar(1)};
+    for (const Array &mode : modes) {
+        const int ncid = intOf(netcdf("open", folder.file("a.nc"), mode));
+        netcdf("put_var1_double", ncid, 1, Array::row({0, 1000}), 7); // 80 kB
+        netcdf("sync", ncid);
+        netcdf("put_var1_double", ncid, 1, Array::row({0, 1000}), 8);
+        const auto close = [&] { netcdf("close", ncid); };
+        {
+            const FullDisk full;
+            EXPECT_EQ(identifierOf(close), "TESSEL:netcdf:close:fileTooLarge");
         }
+        EXPECT_EQ(identifierOf(close), "");
     }
-    void after(Inputs /*inputs*/, const Results &results, const Error *error) noexcept override {
-        ended.push_back(error == nullptr ? std::to_string(results.size()) : error->identifier());
+}
+
+TEST(Closing, DoesNotReadTheHeaderAgain) {
+    const Array modes[] = {Array::text("NOWRITE"), Array::text("nc_NoWrite"),
+                           Array::text("NC_NOWRITE"), Array::scalar(0)};
+    const Module netcdf = guardedModule();
+    for (const Array &mode : modes) {
+        const Folder folder;
+        netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+        const int ncid = intOf(netcdf("open", folder.file("a.nc"), mode));
+        written(folder, "a.nc", "no header");
+        EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "");
     }
+}
 
-    std::vector<std::string> seen;
-    std::vector<std::string> ended;
-    std::string asked;
-};
+TEST(Synchronising, LooksAtTheFileThatIsOpenWhateverItsName) {
+    const Module netcdf = guardedModule();
+    const Folder folder;
+    const std::string path = folder.file("a.nc");
+    netcdf("close", newDataset(netcdf, path));
+    const auto sync = [&](int ncid) { return identifierOf([&] { netcdf("sync", ncid); }); };
+    const std::string bad = "CDF\1"s + words({0, 10, 0x7FFFFFFF});
 
-TEST(Watching, SeesEveryCallAndItsEnd) {
-    const auto notes = std::make_shared<Notes>();
-    const Module netcdf = plainModule();
-    const Module watched = netcdf.watchedBy(notes);
-    watched("param", "NC_DOUBLE");
-    EXPECT_EQ(identifierOf([&] { watched("nothing"); }), "TESSEL:netcdf:InvalidOperation");
-    EXPECT_EQ(identifierOf([&] { watched("refuse"); }), "test:refused");
-    netcdf("param", "NC_INT");
-    const Module notWatched = watched.watchedBy(nullptr);
-    notWatched("param", "NC_INT");
-    EXPECT_EQ(notes->seen, (std::vector<std::string>{"param", "nothing", "refuse"}));
-    EXPECT_EQ(notes->ended, (std::vector<std::string>{"1", "TESSEL:netcdf:InvalidOperation"}));
-    EXPECT_EQ(notes->asked, netcdf("inq_libvers")[0].utf8());
+    const int replaced = intOf(netcdf("open", path, "NOWRITE"));
+    EXPECT_EQ(sync(replaced), "");
+    std::filesystem::rename(path, folder.file("b.nc"));
+    written(folder, "a.nc", bad);
+    EXPECT_EQ(sync(replaced), "") << "nobody has opened the bad file";
+    written(folder, "b.nc", bad);
+    EXPECT_EQ(sync(replaced), "TESSEL:guard:header");
+    std::filesystem::remove(folder.file("b.nc"));
+    EXPECT_EQ(sync(replaced), "TESSEL:guard:header");
+
+    const int writing = newDataset(netcdf, path);
+    EXPECT_EQ(sync(writing), "") << "what is open for writing is not read again";
+    netcdf("close", writing);
+    netcdf("close", replaced);
 }
 
 } // namespace

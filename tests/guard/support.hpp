@@ -6,6 +6,9 @@
 
 #include <gtest/gtest.h>
 
+#include <sys/resource.h>
+
+#include <csignal>
 #include <cstdint>
 #include <filesystem>
 #include <fstream>
@@ -34,6 +37,26 @@ std::string identifierOf(const Call &call) {
     return "";
 }
 
+/// As long as it lives, files cannot grow beyond 64 KiB.
+class FullDisk {
+  public:
+    FullDisk() {
+        getrlimit(RLIMIT_FSIZE, &before);
+        const rlimit full = {rlim_t{1} << 16U, before.rlim_max};
+        setrlimit(RLIMIT_FSIZE, &full);
+    }
+    ~FullDisk() {
+        setrlimit(RLIMIT_FSIZE, &before);
+        std::signal(SIGXFSZ, handler);
+    }
+    FullDisk(const FullDisk &) = delete;
+    FullDisk &operator=(const FullDisk &) = delete;
+
+  private:
+    rlimit before{};
+    void (*handler)(int) = std::signal(SIGXFSZ, SIG_IGN); // an error like any other
+};
+
 /// A new file with these bytes.
 inline std::string written(const Folder &folder, std::string_view name, std::string_view bytes) {
     std::ofstream(folder.file(name), std::ios::binary) << bytes;
@@ -56,6 +79,7 @@ inline std::string words(std::initializer_list<std::uint32_t> values) {
 }
 
 constexpr double ncDouble = 6;
+constexpr double noFill = 256; // of set_fill
 constexpr double ncInt = 4;
 
 /// A dataset in data mode: the fixed variable 0 over x (10), and the record variable 1 over t and

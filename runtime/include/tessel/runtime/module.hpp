@@ -114,7 +114,9 @@ class Module {
 
   private:
     friend class Ask;
-    [[nodiscard]] Results run(std::span<const tsArray *> inputs, const CallOptions &options) const;
+    struct Ending;
+    class Told;
+    [[nodiscard]] Ending run(std::span<const tsArray *> inputs, const CallOptions &options) const;
 
     struct Loaded;
     std::shared_ptr<const Loaded> loaded;

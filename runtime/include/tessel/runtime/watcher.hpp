@@ -44,10 +44,16 @@ class Watcher {
     Watcher &operator=(const Watcher &) = delete;
 
     /// Before the module sees the call. To raise an Error is to refuse it: the module is not
-    /// called, nor is `after`, and the program gets that error.
+    /// called, nor is `after`, and the program gets that error. std::bad_alloc becomes the error
+    /// "TESSEL:host:outOfMemory"; any other exception is a mistake of the watcher's, which refuses
+    /// the call too and reaches the program as it is.
     virtual void before(Inputs inputs, const Ask &ask) = 0;
 
-    /// After the module has answered with results, or raised `error` (then there are none).
+    /// After the module has answered with results, or with an error (then there are none). Called
+    /// once for every call that `before` let through, whatever ended it: what is no Error when it
+    /// leaves the module is given as the Error that the program gets, and a thread that ends within
+    /// the call, because it is cancelled, as "TESSEL:host:foreignException". It cannot refuse
+    /// anything any more, and an exception that left it would end the program.
     virtual void after(Inputs inputs, const Results &results, const Error *error) noexcept = 0;
 };
 
