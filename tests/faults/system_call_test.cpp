@@ -3,6 +3,7 @@
 // silence.
 #include "support.hpp"
 #include "system_calls.hpp"
+#include "tessel/netcdf_guard.hpp"
 
 #include <gtest/gtest.h>
 
@@ -27,6 +28,13 @@ void create(const std::string &file) {
     netcdf()("create", file + ".new", "NOCLOBBER");
 }
 
+/// A new file up to its first synchronised record.
+void make(const std::string &file) {
+    const int ncid = log::create(file + ".new");
+    log::append(ncid, 0);
+    netcdf()("sync", ncid);
+}
+
 void read(const std::string &file) {
     netcdf()("get_var_double", opened(file), 0);
 }
@@ -41,6 +49,14 @@ void appendAndClose(const std::string &file) {
     const int ncid = opened(file);
     log::append(ncid, 3);
     netcdf()("close", ncid);
+}
+
+/// The same behind the guard, which synchronises before the dataset is closed.
+void appendAndCloseGuarded(const std::string &file) {
+    const Module guarded = netcdf().watchedBy(netcdfGuard());
+    const int ncid = idOf(guarded("open", file, "WRITE"));
+    log::append(ncid, 3);
+    guarded("close", ncid);
 }
 
 void appendAndAbort(const std::string &file) {
@@ -83,6 +99,9 @@ const Row rows[] = {
     {"CreateStat",    create,         SystemCall::stat,  {"create"}},
     {"CreateSeek",    create,         SystemCall::seek,  {"create"}},
     {"CreateWrite",   create,         SystemCall::write, {"create"}},
+    {"MakeSeek",      make,           SystemCall::seek,  {"create", "putVara", "sync"}},
+    {"MakeRead",      make,           SystemCall::read,  {"putVara", "sync"}},
+    {"MakeWrite",     make,           SystemCall::write, {"create", "pEndDef", "putVara", "sync"}},
     {"ReadSeek",      read,           SystemCall::seek,  {"open", "getVar"}},
     {"ReadRead",      read,           SystemCall::read,  {"open", "getVar"}},
     {"SyncSeek",      appendAndSync,  SystemCall::seek,  {"open", "putVara", "sync"}},
@@ -95,6 +114,8 @@ const Row rows[] = {
     {"CloseRead",     appendAndClose, SystemCall::read,  {"open", "putVara", "close"}},
     {"CloseStat",     appendAndClose, SystemCall::stat,  {"open", "close"}},
     {"CloseClose",    appendAndClose, SystemCall::close, {}, Silent::all},
+    {"GuardedSeek",   appendAndCloseGuarded, SystemCall::seek,  {"open", "putVara", "close"}},
+    {"GuardedWrite",  appendAndCloseGuarded, SystemCall::write, {"putVara", "close"}},
     {"AbortSeek",     appendAndAbort, SystemCall::seek,  {"open", "putVara", "abort"}, Silent::last},
     {"AbortWrite",    appendAndAbort, SystemCall::write, {"putVara", "abort"}, Silent::last},
     {"AbortClose",    appendAndAbort, SystemCall::close, {}, Silent::all},
@@ -113,7 +134,16 @@ struct Error {
     int number;
     const char *word;
 };
-constexpr Error errors[] = {{EIO, "IOError"}, {ENOSPC, "noSpaceLeftOnDevice"}};
+// Of a quota that is used up only the message says it. Reads that a signal interrupts are another
+// test's.
+constexpr Error errors[] = {
+    {EIO, "IOError"},
+    {ENOSPC, "noSpaceLeftOnDevice"},
+    {EROFS, "readOnlyFileSystem"},
+    {EACCES, "permissionDenied"},
+    {EINTR, "interruptedSystemCall"},
+    {EDQUOT, "unknownErrorStatus"},
+};
 
 /// What an act raises while a fault is there. Everything is done in a child: open datasets with
 /// faults are left behind.
@@ -172,6 +202,9 @@ TEST_P(SystemCalls, FailInTurn) {
     const std::size_t calls = callsOf(row.act, row.call, row.headerRoom);
     ASSERT_GT(calls, 0U) << "the act makes no call to " << nameOf(row.call);
     for (const Error &error : errors) {
+        if (error.number == EINTR && row.call == SystemCall::read) {
+            continue;
+        }
         std::vector<bool> seen(row.reportedBy.size() + 1);
         std::size_t place = 0;
         for (std::size_t n = 1; n <= calls; ++n) {
@@ -243,7 +276,7 @@ TEST(Reads, ThatAreInterruptedAreMadeAgain) {
 TEST(Reads, ThatEndEarlyGiveOtherValues) {
     std::size_t wrong = 0;
     const std::size_t calls = callsOf(read, SystemCall::read);
-    for (std::size_t n = 2; n <= calls; ++n) { // the first is the header's
+    for (std::size_t n = 1; n <= calls; ++n) { // the first is the header's
         const std::string said = readWith(n, {0, true});
         EXPECT_TRUE(said == "right" || said.starts_with("another value")) << said;
         wrong += said == "right" ? 0U : 1U;

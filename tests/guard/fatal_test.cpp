@@ -106,6 +106,27 @@ const Fatal rows[] = {
      }},
     {"OpenOfATypeWithoutSize", SIGFPE, "TESSEL:guard:header", "has a variable of the type 12",
      [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); }},
+    {"NameOf300Letters", SIGSEGV, "TESSEL:guard:header", "has a name of 300 characters",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("inq_dim",
+                open(netcdf, folder,
+                     "CDF\1" + words({0, 10, 1, 300}) + std::string(300, 'n') +
+                         words({1, 0, 0, 0, 0})),
+                0);
+     }},
+    {"VariableOf1025Dimensions", SIGSEGV, "TESSEL:guard:header", "a variable of 1025 dimensions",
+     [](const Module &netcdf, const Folder &folder) {
+         std::string ids;
+         for (int i = 0; i < 1025; ++i) {
+             ids += words({0});
+         }
+         netcdf("inq_var",
+                open(netcdf, folder,
+                     "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({1, 0, 0, 11, 1, 1}) +
+                         "v\0\0\0"s + words({1025}) + ids + words({0, 0, 4, 4, 9000}) +
+                         std::string(16, '\0')),
+                0);
+     }},
     {"NameWhoseLengthTheFileEndsIn", SIGSEGV, "TESSEL:guard:header", "characters in a name",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),

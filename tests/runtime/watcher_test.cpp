@@ -71,8 +71,8 @@ TEST_F(Watching, IsToldOfEveryWayOut) {
         {"int", foreign},        {"runtime_error", foreign},
         {"local", foreign},      {"bad_alloc", "TESSEL:host:outOfMemory"},
     };
-    for (const auto &[action, identifier] : ends) {
-        EXPECT_EQ(identifierOf([&] { watched(action); }), identifier);
+    for (const auto &end : ends) {
+        EXPECT_EQ(identifierOf([&] { watched(end.first); }), end.second);
     }
     EXPECT_EQ(notes->ended, ends);
 }
