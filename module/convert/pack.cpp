@@ -40,7 +40,7 @@ tsArray *packIntVector(const int *values, std::size_t count) {
     return packRow(1, values, count);
 }
 
-tsArray *packDimidVector(const std::vector<int> &values) {
+tsArray *packDimidVector(std::span<const int> values) {
     return packRow(values.empty() ? 0 : 1, values.data(), values.size());
 }
 

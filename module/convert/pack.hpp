@@ -4,7 +4,7 @@
 #include "tessel/create.h"
 
 #include <cstddef>
-#include <vector>
+#include <span>
 
 namespace tessel::netcdf {
 
@@ -19,6 +19,6 @@ tsArray *packUpSizetScalar(std::size_t value);
 tsArray *packIntVector(const int *values, std::size_t count);
 
 /// Dimension ids as a double row, in the order given; 0-by-0 for none.
-tsArray *packDimidVector(const std::vector<int> &values);
+tsArray *packDimidVector(std::span<const int> values);
 
 } // namespace tessel::netcdf

@@ -13,25 +13,49 @@
 #include <cstdint>
 #include <cstring>
 #include <string_view>
+#include <type_traits>
 
 namespace tessel::netcdf {
 namespace {
 
-/// The hash of a name, a character at a time. What comes later waits for what came before, so each
-/// step is short, and the one multiplication stands at the end.
-class Hash {
-  public:
-    constexpr void add(char c) { value = std::rotl(value, 5) ^ static_cast<unsigned char>(c); }
-    [[nodiscard]] constexpr std::size_t slotIn(std::size_t slots) const {
-        return ((value * 0x9E3779B97F4A7C15U) >> 32U) % slots;
+/// As many characters as the word has bytes.
+template <class Word>
+constexpr std::uint64_t wordAt(const char *at) {
+    Word word = 0;
+    if (std::is_constant_evaluated()) {
+        for (unsigned i = 0; i < sizeof(Word); ++i) {
+            word |= static_cast<Word>(Word{static_cast<unsigned char>(at[i])} << (8 * i));
+        }
+    } else {
+        std::memcpy(&word, at, sizeof(Word));
     }
+    return word;
+}
+static_assert(std::endian::native == std::endian::little, "both ways have to give the same word");
 
-  private:
-    std::uint64_t value = 0;
-};
+/// What a name begins and ends with, mixed into a number.
+template <class Word>
+constexpr std::uint64_t ends(std::string_view name) {
+    return wordAt<Word>(name.data()) ^
+           std::rotl(wordAt<Word>(name.data() + name.size() - sizeof(Word)), 29);
+}
+
+/// The slot that a name belongs into, by its length and what it begins and ends with. What names
+/// have in common stands in their middle.
+constexpr std::size_t slotOf(std::string_view name, std::size_t slots) {
+    std::uint64_t value = name.size();
+    if (name.size() >= 8) {
+        value ^= ends<std::uint64_t>(name);
+    } else if (name.size() >= 4) {
+        value ^= ends<std::uint32_t>(name);
+    } else if (!name.empty()) {
+        value ^= ends<std::uint8_t>(name);
+    }
+    return ((value * 0x9E3779B97F4A7C15U) >> 32U) % slots;
+}
 
 struct Slot {
-    const char *name = nullptr;
+    std::string_view name;
     const OperationEntry *entry = nullptr;
 };
 
@@ -44,15 +68,11 @@ constexpr std::size_t next(std::size_t slot) {
     return (slot + 1) % slotCount;
 }
 
-constexpr void insert(std::array<Slot, slotCount> &slots, const char *name,
+constexpr void insert(std::array<Slot, slotCount> &slots, std::string_view name,
                       const OperationEntry &entry) {
-    Hash hash;
-    for (const char c : std::string_view(name)) {
-        hash.add(c);
-    }
-    std::size_t at = hash.slotIn(slotCount);
-    while (slots[at].name != nullptr) {
-        if (std::string_view(slots[at].name) == name) {
+    std::size_t at = slotOf(name, slotCount);
+    while (slots[at].entry != nullptr) {
+        if (slots[at].name == name) {
             return; // the first row of a name is the one that counts
         }
         at = next(at);
@@ -69,20 +89,20 @@ constexpr std::array<Slot, slotCount> slots = [] {
     return filled;
 }();
 
-/// As names are compared. The letters that they are made of need no function and no locale.
+/// As names are compared. The letters that they are made of do not depend on the locale, and what
+/// else there is in ASCII has no case.
 char lowerCase(char c) {
-    const bool capital = c >= 'A' && c <= 'Z';
-    return static_cast<char>(capital ? c - 'A' + 'a' : std::tolower(static_cast<unsigned char>(c)));
+    const auto code = static_cast<unsigned char>(c);
+    if (code >= 0x80) {
+        return static_cast<char>(std::tolower(code));
+    }
+    return static_cast<char>(code + (code >= 'A' && code <= 'Z' ? 'a' - 'A' : 0));
 }
 
 /// The row of a name in lower case; nullptr for any other name.
-const OperationEntry *rowOf(const char *name) {
-    Hash hash;
-    for (const char *at = name; *at != '\0'; ++at) {
-        hash.add(*at);
-    }
-    for (std::size_t at = hash.slotIn(slotCount); slots[at].name != nullptr; at = next(at)) {
-        if (std::strcmp(slots[at].name, name) == 0) {
+const OperationEntry *rowOf(std::string_view name) {
+    for (std::size_t at = slotOf(name, slotCount); slots[at].entry != nullptr; at = next(at)) {
+        if (slots[at].name == name) {
             return slots[at].entry;
         }
     }
@@ -92,15 +112,16 @@ const OperationEntry *rowOf(const char *name) {
 } // namespace
 
 const OperationEntry *findOperation(char *name) {
+    const std::string_view text = name;
     // As a rule the name is in lower case already; the rows' names are, so that what is found
     // before it was made so is what would be found after.
-    if (const OperationEntry *const entry = rowOf(name)) {
+    if (const OperationEntry *const entry = rowOf(text)) {
         return entry;
     }
     for (char *at = name; *at != '\0'; ++at) {
         *at = lowerCase(*at);
     }
-    if (const OperationEntry *const entry = rowOf(name)) {
+    if (const OperationEntry *const entry = rowOf(text)) {
         return entry;
     }
     raise(catalogue::invalidOperation, name);

@@ -312,7 +312,7 @@ _HOST = {
     "badIndex": ("A position is beyond the end.", "Positions begin with 0."),
     "badOutputCount": (
         "More outputs are asked for than a call can have, or fewer than none.",
-        "Ask for 0 to 16."),
+        "Ask for 0 to 8."),
     "badOwner": (
         "Memory was handed over that is not the call's own.",
         "In a module: free and hand over only what this call has allocated."),

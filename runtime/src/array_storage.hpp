@@ -44,6 +44,10 @@ struct tsArray : tessel::Link {
     ~tsArray();
     tsArray(const tsArray &) = delete;
     tsArray &operator=(const tsArray &) = delete;
+
+    /// A call makes arrays and sees others go, so each thread keeps the room of some that went.
+    static void *operator new(std::size_t size);
+    static void operator delete(void *room) noexcept;
 };
 
 namespace tessel {

@@ -28,7 +28,7 @@ inline constexpr HostError
     badOwner           = {"TESSEL:host:badOwner",           "The array is not the call's own: it is an input, or has been given away before."},
     noCall             = {"TESSEL:host:noCall",             "The function is for a module that is being called."},
     nestedCall         = {"TESSEL:host:nestedCall",         "A module cannot be called from within a call."},
-    badOutputCount     = {"TESSEL:host:badOutputCount",     "A call has 0 to 16 outputs."},
+    badOutputCount     = {"TESSEL:host:badOutputCount",     "A call has 0 to 8 outputs."},
     tooManyInputs      = {"TESSEL:host:tooManyInputs",      "The call has too many inputs."},
     missingInput       = {"TESSEL:host:missingInput",       "An input of the call is not there."},
     foreignException   = {"TESSEL:host:foreignException",   "An exception that is not the host's left the module"},

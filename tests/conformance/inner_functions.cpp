@@ -295,8 +295,11 @@ TEST(Packers, OfLists) {
     EXPECT_EQ(made([] { return netcdf::packIntVector(values.data(), 3); }), "1x3 double [3 -1 2]");
     EXPECT_EQ(made([] { return netcdf::packIntVector(values.data(), 1); }), "1x1 double [3]");
     EXPECT_EQ(made([] { return netcdf::packIntVector(values.data(), 0); }), "1x0 double []");
-    EXPECT_EQ(made([] { return netcdf::packDimidVector({3, -1, 2}); }), "1x3 double [3 -1 2]");
-    EXPECT_EQ(made([] { return netcdf::packDimidVector({3}); }), "1x1 double [3]");
+    EXPECT_EQ(made([] {
+                  return netcdf::packDimidVector(std::vector{3, -1, 2});
+              }),
+              "1x3 double [3 -1 2]");
+    EXPECT_EQ(made([] { return netcdf::packDimidVector(std::vector{3}); }), "1x1 double [3]");
     EXPECT_EQ(made([] { return netcdf::packDimidVector({}); }), "0x0 double []");
 }
 

@@ -21,26 +21,26 @@ INSTANTIATE_TEST_SUITE_P(Mode, Calls, testing::Bool(),
                          [](const auto &mode) { return mode.param ? "checked" : "unchecked"; });
 
 TEST_P(Calls, SlotsAreNullAtEntry) {
-    for (const int outputs : {0, 1, 8, 16}) {
-        EXPECT_EQ(callWith(good, {.outputs = outputs}, "empty_slots")[0].number(), 16);
+    for (const int outputs : {0, 1, 8}) {
+        EXPECT_EQ(callWith(good, {.outputs = outputs}, "empty_slots")[0].number(), 8);
     }
 }
 
 TEST_P(Calls, OutputCounts) {
     for (const int outputs :
-         {-1, 17, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()}) {
+         {-1, 9, std::numeric_limits<int>::min(), std::numeric_limits<int>::max()}) {
         const std::optional<Error> error =
             raisedBy([&] { callWith(good, {.outputs = outputs}, "nothing"); });
         EXPECT_EQ(error->identifier(), "TESSEL:host:badOutputCount");
-        EXPECT_EQ(error->message(), "A call has 0 to 16 outputs.");
+        EXPECT_EQ(error->message(), "A call has 0 to 8 outputs.");
     }
 }
 
 TEST_P(Calls, OutputsAreWhatTheModuleFilled) {
     EXPECT_EQ(good("nothing").size(), 0U);
-    const Results sixteen = callWith(good, {.outputs = 0}, "sixteen");
-    EXPECT_EQ(sixteen.size(), 16U);
-    EXPECT_EQ(sixteen[15].number(), 15);
+    const Results all = callWith(good, {.outputs = 0}, "every_slot");
+    EXPECT_EQ(all.size(), 8U);
+    EXPECT_EQ(all[7].number(), 7);
 
     const Results gaps = good("gaps");
     ASSERT_EQ(gaps.size(), 8U);

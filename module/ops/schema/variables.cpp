@@ -7,7 +7,9 @@
 
 #include <netcdf.h>
 
+#include <algorithm>
 #include <array>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -45,7 +47,8 @@ void inqVarHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[
     int natts = 0;
     check(nc_inq_var(ncid, varid, name.data(), &type, &ndims, dimids.data(), &natts),
           catalogue::inqVar.failure);
-    const std::vector<int> hostOrder(dimids.rend() - ndims, dimids.rend());
+    const std::span hostOrder(dimids.data(), static_cast<std::size_t>(ndims));
+    std::reverse(hostOrder.begin(), hostOrder.end());
     plhs[0] = tsCreateString(name.data());
     plhs[1] = packIntScalar(type);
     plhs[2] = packDimidVector(hostOrder);

@@ -9,10 +9,10 @@ namespace {
 
 void nothing(const Call &) {}
 
-/// How many of the first 16 output slots are NULL at entry.
+/// How many of the 8 output slots are NULL at entry.
 void emptySlots(const Call &call) {
     int empty = 0;
-    for (int i = 0; i < 16; ++i) {
+    for (int i = 0; i < 8; ++i) {
         empty += call.plhs[i] == nullptr ? 1 : 0;
     }
     call.plhs[0] = tsCreateDoubleScalar(empty);
@@ -34,8 +34,8 @@ void gaps(const Call &call) {
 }
 
 /// All slots that there are.
-void sixteen(const Call &call) {
-    for (int slot = 0; slot < 16; ++slot) {
+void everySlot(const Call &call) {
+    for (int slot = 0; slot < 8; ++slot) {
         call.plhs[slot] = tsCreateDoubleScalar(slot);
     }
 }
@@ -158,7 +158,7 @@ constexpr Action actions[] = {
     {"count_inputs", countInputs},
     {"add", add},
     {"gaps", gaps},
-    {"sixteen", sixteen},
+    {"every_slot", everySlot},
     {"text", text},
     {"one_of_each", oneOfEach},
     {"scalars", scalars},

@@ -15,8 +15,8 @@ namespace tessel {
 /// The outputs of one call: the slots that the module filled. Moves, does not copy.
 class Results {
   public:
-    /// How many slots a module is given, whatever the caller asked for.
-    static constexpr std::size_t slots = 16;
+    /// How many slots a module is given, whatever the caller asked for: as many as it may count on.
+    static constexpr std::size_t slots = 8;
 
     /// The number of outputs: one more than the last slot that was filled.
     [[nodiscard]] std::size_t size() const noexcept { return count; }
