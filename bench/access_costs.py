@@ -1,7 +1,7 @@
 # bench/access_costs.py: what reading costs, for the plans of the engine for xarray.
 """Measures the costs that `tessel.xarray.planning` computes with.
 
-usage: access_costs.py [--write DOCUMENT]
+usage: access_costs.py [--write DOCUMENT] [--json FILE] [--quick]
 
 A file of 256 MB, in the system's cache, is read in ways that one of the costs decides alone: one
 value (a call), a column of single values (a run), a block of a megabyte (a byte), every second and
@@ -14,7 +14,6 @@ and by NumPy from a mapping of the file, which is the memory alone.
 
 from __future__ import annotations
 
-import argparse
 import ctypes
 import ctypes.util
 import itertools
@@ -24,13 +23,12 @@ from pathlib import Path
 
 import netCDF4
 import numpy as np
-from measuring import put_between_marks, seconds
+from measuring import give_out, options_of, seconds
 from tessel.xarray.array import DTYPES, LazyArray
 from tessel.xarray.opening import MAPPED, OpenFile
 from tessel.xarray.planning import COSTS, Costs
 from xarray.backends import CachingFileManager
 
-SHAPE = (512, 256, 512)
 MEMBERS = {False: "float", True: "text"}
 
 
@@ -38,17 +36,17 @@ def shortest(work: Callable[[], object]) -> float:
     return min(seconds(work) for _ in range(10))
 
 
-def write(path: str) -> None:
+def write(path: str, shape: tuple[int, ...]) -> None:
     """A file with a variable of numbers and one of characters."""
     with netCDF4.Dataset(path, "w", format="NETCDF3_64BIT_OFFSET") as file:
-        for name, length in zip("tyx", SHAPE):
+        for name, length in zip("tyx", shape):
             file.createDimension(name, length)
         for member in MEMBERS.values():
             variable = file.createVariable(member, DTYPES[member], tuple("tyx"))
             variable.set_auto_maskandscale(False)
-            for number in range(SHAPE[0]):
-                variable[number] = np.full(SHAPE[1:], 65, "u1").astype("f4") \
-                    if member == "float" else np.full(SHAPE[1:], b"A", "S1")
+            for number in range(shape[0]):
+                variable[number] = np.full(shape[1:], 65, "u1").astype("f4") \
+                    if member == "float" else np.full(shape[1:], b"A", "S1")
 
 
 def measured(path: str, mapped: bool, text: bool) -> Costs:
@@ -56,38 +54,39 @@ def measured(path: str, mapped: bool, text: bool) -> Costs:
     manager = CachingFileManager(OpenFile, path, kwargs={"mapped": mapped})
     array = LazyArray(manager, manager.acquire().variables[MEMBERS[text]], mapped)
     size = array.dtype.itemsize
+    shape = array.shape
     call = shortest(lambda: array.block([0, 0, 0], [1, 1, 1]))
-    column = shortest(lambda: array.block([0, 0, 7], [*SHAPE[:2], 1]))
-    rows = 2**20 // size // SHAPE[2]
-    count = [rows // SHAPE[1] or 1, min(rows, SHAPE[1]), SHAPE[2]]
+    column = shortest(lambda: array.block([0, 0, 7], [*shape[:2], 1]))
+    rows = 2**20 // size // shape[2]
+    count = [rows // shape[1] or 1, min(rows, shape[1]), shape[2]]
     # Each block is another one, which is not in the processor's caches.
-    starts = itertools.cycle(range(0, SHAPE[0] - count[0], 2 * count[0]))
+    starts = itertools.cycle(range(0, shape[0] - count[0], 2 * count[0]))
     block = shortest(lambda: [array.block([next(starts), 0, 0], count) for _ in range(6)]) / 6
-    strided = min(shortest(lambda: array.strided([5, 0, 0], [1, 128, SHAPE[2] // step],
-                                                 [1, 2, step])) / (128 * (SHAPE[2] // step))
+    strided = min(shortest(lambda: array.strided([5, 0, 0], [1, 128, shape[2] // step],
+                                                 [1, 2, step])) / (128 * (shape[2] // step))
                   for step in (2, 5))
-    values = array.block([0, 0, 0], [4, *SHAPE[1:]])[:, :, ::2]
+    values = array.block([0, 0, 0], [4, *shape[1:]])[:, :, ::2]
     room = np.empty(values.shape, values.dtype)
 
     def pick() -> None:
         room[...] = values
 
-    return Costs(call, (column - call) / (SHAPE[0] * SHAPE[1]), (block - call) / 2**20,
+    return Costs(call, (column - call) / (shape[0] * shape[1]), (block - call) / 2**20,
                  shortest(pick) / room.nbytes, strided)
 
 
-def column(path: str) -> str:
+def column(path: str, shape: tuple[int, ...]) -> str:
     """What a column costs in three ways, in one line."""
     manager = CachingFileManager(OpenFile, path)
     file = manager.acquire()
     variable = file.variables[MEMBERS[False]]
     array = LazyArray(manager, variable, mapped=True)
-    ours = shortest(lambda: array.block([0, 0, 7], [*SHAPE[:2], 1]))
+    ours = shortest(lambda: array.block([0, 0, 7], [*shape[:2], 1]))
 
     library = ctypes.CDLL(ctypes.util.find_library("netcdf"))
     ncid = ctypes.c_int()
-    places = [(ctypes.c_size_t * 3)(*each) for each in ((0, 0, 7), (*SHAPE[:2], 1))]
-    room = np.empty(SHAPE[:2], "f4")
+    places = [(ctypes.c_size_t * 3)(*each) for each in ((0, 0, 7), (*shape[:2], 1))]
+    room = np.empty(shape[:2], "f4")
 
     def call() -> None:
         if library.nc_get_vara_float(ncid, variable.varid, *places, ctypes.c_void_p(
@@ -100,9 +99,9 @@ def column(path: str) -> str:
     library.nc_close(ncid)
 
     begin = file.begin_of(variable.varid)
-    values = np.memmap(path, ">f4", "r", begin, SHAPE)
+    values = np.memmap(path, ">f4", "r", begin, shape)
     by_numpy = shortest(lambda: values[:, :, 7].astype("f4"))
-    np.testing.assert_array_equal(array.block([0, 0, 7], [*SHAPE[:2], 1])[:, :, 0], room)
+    np.testing.assert_array_equal(array.block([0, 0, 7], [*shape[:2], 1])[:, :, 0], room)
     np.testing.assert_array_equal(values[:, :, 7], room)
     return (f"A column of {room.size} numbers, mapped: {ours * 1e3:.1f} ms by the engine, "
             f"{by_library * 1e3:.1f} ms by one call of the library without the module, "
@@ -110,25 +109,23 @@ def column(path: str) -> str:
 
 
 def main() -> None:
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--write", type=Path, metavar="DOCUMENT",
-                        help="put the table between the marks in this document")
-    options = parser.parse_args()
+    options = options_of(__doc__)
     lines = ["| file, values | | call | run | byte | picked byte | strided value |",
              "|---|---|---:|---:|---:|---:|---:|"]
+    rows = {}
     with tempfile.TemporaryDirectory() as folder:
         path = str(Path(folder, "costs.nc"))
-        write(path)
+        shape = (32, 256, 512) if options.quick else (512, 256, 512)
+        write(path, shape)
         for (mapped, text), used in COSTS.items():
             kind = f"{'mapped' if mapped else 'buffered'}, {'text' if text else 'numbers'}"
-            for title, costs in (("measured", measured(path, mapped, text)), ("used", used)):
+            rows[kind] = {"measured": measured(path, mapped, text), "used": used}
+            for title, costs in rows[kind].items():
                 lines.append(f"| {kind} | {title} | {costs.call * 1e6:.1f} µs | "
                              f"{costs.run * 1e9:.0f} ns | {costs.byte * 1e9:.2f} ns | "
                              f"{costs.picked * 1e9:.2f} ns | {costs.strided * 1e9:.0f} ns |")
-        lines += ["", column(path)]
-    print(text := "\n".join(lines))
-    if options.write:
-        put_between_marks(options.write, "bench/access_costs.py", text)
+        lines += ["", column(path, shape)]
+    give_out(options, "bench/access_costs.py", "\n".join(lines), rows)
 
 
 if __name__ == "__main__":

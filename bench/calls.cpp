@@ -21,6 +21,7 @@ constexpr std::size_t largeElements = largeBytes / sizeof(double);
 constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / 1024 / 512};
 constexpr const char *dimension = "time";
 constexpr const char *variable = "large";
+constexpr const char *attribute = "units";
 
 /// The dataset, open for reading.
 class Dataset {
@@ -34,6 +35,7 @@ class Dataset {
         check(nc_def_dim(writing, "lat", hostDims[1], &dims[1]));
         check(nc_def_dim(writing, dimension, hostDims[2], dims.data()));
         check(nc_def_var(writing, variable, NC_DOUBLE, 3, dims.data(), &varid));
+        check(nc_put_att_text(writing, varid, attribute, 1, "K"));
         check(nc_enddef(writing));
         std::vector<double> values(largeElements);
         for (std::size_t i = 0; i < values.size(); ++i) {
@@ -111,6 +113,35 @@ void addInquiries(std::vector<Pair> &pairs, const Module &netcdf, const Dataset 
                             Array::scalar(data.varid))});
 }
 
+/// The same for those of attributes.
+void addAttributeInquiries(std::vector<Pair> &pairs, const Module &netcdf, const Dataset &data) {
+    pairs.push_back({"inq_att",
+                     [&data] {
+                         nc_type type = NC_NAT;
+                         std::size_t length = 0;
+                         check(nc_inq_att(data.ncid, data.varid, attribute, &type, &length));
+                         benchmark::DoNotOptimize(length);
+                     },
+                     called(netcdf, Array::text("inq_att"), Array::scalar(data.ncid),
+                            Array::scalar(data.varid), Array::text(attribute))});
+    pairs.push_back({"inq_attid",
+                     [&data] {
+                         int id = 0;
+                         check(nc_inq_attid(data.ncid, data.varid, attribute, &id));
+                         benchmark::DoNotOptimize(id);
+                     },
+                     called(netcdf, Array::text("inq_attid"), Array::scalar(data.ncid),
+                            Array::scalar(data.varid), Array::text(attribute))});
+    pairs.push_back({"inq_attname",
+                     [&data] {
+                         std::array<char, NC_MAX_NAME + 1> name;
+                         check(nc_inq_attname(data.ncid, data.varid, 0, name.data()));
+                         benchmark::DoNotOptimize(name);
+                     },
+                     called(netcdf, Array::text("inq_attname"), Array::scalar(data.ncid),
+                            Array::scalar(data.varid), Array::scalar(0))});
+}
+
 std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
     const auto direct = [&data] {
         int dimid = 0;
@@ -145,6 +176,7 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
         {"inq_dimid, inputs made", direct, values},
     };
     addInquiries(pairs, netcdf, data);
+    addAttributeInquiries(pairs, netcdf, data);
     pairs.push_back({"get_var_double of 256 MiB", readDirect, read, true});
     return pairs;
 }

@@ -13,6 +13,7 @@
 #include <array>
 #include <cstdio>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace {
@@ -337,6 +338,9 @@ class Type {
         };
     }
 
+    /// The library takes strided blocks an element at a time.
+    static bool isSlow(std::string_view family) { return family.ends_with("_vars"); }
+
     /// A block read by `fill`; where it is text, the second reference has a buffer of so many bytes
     /// a character.
     template <class Fill>
@@ -346,6 +350,7 @@ class Type {
         if constexpr (std::is_same_v<T, char>) {
             pair.steps = widening(unit, fill);
         }
+        pair.slow = isSlow(family);
         pairs.push_back(std::move(pair));
     }
 
@@ -359,6 +364,7 @@ class Type {
         if constexpr (std::is_same_v<T, char>) {
             pair.steps = narrowing(write);
         }
+        pair.slow = isSlow(family);
         pairs.push_back(std::move(pair));
     }
 

@@ -1,12 +1,15 @@
 # bench/measuring.py: what the measuring programs in Python share.
-"""Taking turns, medians, and tables between marks in a document."""
+"""The command line, taking turns, medians, tables between marks in a document, and files of
+numbers."""
 
 from __future__ import annotations
 
+import argparse
+import json
 import random
 import statistics
 import time
-from collections.abc import Callable, Sequence
+from collections.abc import Callable, Mapping, Sequence
 from pathlib import Path
 from typing import NamedTuple
 
@@ -25,6 +28,36 @@ class Measured(NamedTuple):
 
     shortest: float
     """The shortest time, which other work on the machine disturbs least."""
+
+
+def options_of(doc: str) -> argparse.Namespace:
+    """The command line of a measuring program: what to write, and whether to measure at all."""
+    parser = argparse.ArgumentParser(description=doc.splitlines()[0])
+    parser.add_argument("--write", type=Path, metavar="DOCUMENT",
+                        help="put the table between the marks in this document")
+    parser.add_argument("--json", type=Path, metavar="FILE",
+                        help="write the rows to this file, in seconds")
+    parser.add_argument("--quick", action="store_true",
+                        help="do everything once, on small data; the numbers say nothing")
+    options = parser.parse_args()
+    if options.quick and options.write:
+        parser.error("numbers that say nothing belong into no document")
+    return options
+
+
+def give_out(options: argparse.Namespace, program: str, text: str,
+             rows: Mapping[str, Mapping[str, NamedTuple]]) -> None:
+    """The results, to wherever they are wanted: the table of a program, and the numbers of each
+    side of each row."""
+    print(text)
+    if options.quick:
+        print("\nOnce, on small data: these numbers are no measurement.")
+    if options.write:
+        put_between_marks(options.write, program, text)
+    if options.json:
+        options.json.write_text(json.dumps(
+            {name: {side: measured._asdict() for side, measured in sides.items()}
+             for name, sides in rows.items()}, indent=1))
 
 
 def seconds(work: Work) -> float:

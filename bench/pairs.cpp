@@ -16,7 +16,7 @@ namespace tessel::bench {
 namespace {
 
 constexpr int repetitions = 25;
-constexpr int blockRepetitions = 9;
+constexpr int slowRepetitions = 9;
 constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
 
 double shortest(const std::vector<double> &all) {
@@ -75,21 +75,22 @@ class Statistics : public benchmark::ConsoleReporter {
     std::map<std::string, double> seconds;
 };
 
-void add(const std::string &name, const std::function<void()> &work, bool block) {
+/// Registers a side of a pair. Google Benchmark writes all repetitions into its file, for whoever
+/// wants more than the table has.
+void add(const std::string &name, const std::function<void()> &work, const Pair &pair, bool quick) {
     auto *const registered =
         benchmark::RegisterBenchmark(name.c_str(), [&work](benchmark::State &state) {
             for ([[maybe_unused]] auto _ : state) {
                 work();
             }
         });
-    registered->Repetitions(block ? blockRepetitions : repetitions)
-        ->ReportAggregatesOnly()
-        ->UseRealTime();
+    const int all = pair.slow ? slowRepetitions : repetitions;
+    registered->Repetitions(quick ? 2 : all)->DisplayAggregatesOnly()->UseRealTime();
     registered->ComputeStatistics("shortest", shortest);
-    if (block) {
+    if (pair.block) {
         registered->Iterations(1)->Unit(benchmark::kMillisecond);
     } else {
-        registered->MinTime(shortestTime);
+        registered->MinTime(quick ? shortestTime / 10 : shortestTime);
     }
 }
 
@@ -138,6 +139,13 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         document = *(option + 1);
         arguments.erase(option, option + 2);
     }
+    const auto last = std::remove(arguments.begin(), arguments.end(), std::string("--quick"));
+    const bool quick = last != arguments.end();
+    arguments.erase(last, arguments.end());
+    if (quick && !document.empty()) {
+        std::fprintf(stderr, "Numbers that say nothing belong into no document.\n");
+        return 1;
+    }
     std::string interleaving = "--benchmark_enable_random_interleaving=true";
     arguments.insert(arguments.begin() + 1, interleaving.data()); // the user's own come later
     int count = static_cast<int>(arguments.size());
@@ -146,10 +154,10 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         return 1;
     }
     for (const Pair &pair : pairs) {
-        add(pair.name + "/reference", pair.reference, pair.block);
-        add(pair.name + "/module", pair.module, pair.block);
+        add(pair.name + "/reference", pair.reference, pair, quick);
+        add(pair.name + "/module", pair.module, pair, quick);
         if (pair.steps) {
-            add(pair.name + "/steps", pair.steps, pair.block);
+            add(pair.name + "/steps", pair.steps, pair, quick);
         }
     }
     Statistics statistics;
@@ -157,6 +165,9 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
     benchmark::Shutdown();
     const std::string text = table(pairs, statistics);
     std::printf("\n%s", text.c_str());
+    if (quick) {
+        std::printf("\nTwice only: these numbers are no measurement.\n");
+    }
     if (!document.empty()) {
         write(document, title, text);
     }

@@ -20,14 +20,17 @@ struct Pair {
     /// A second reference, where the operation is more than its one function: all library calls
     /// that it has to make, and all memory that it has to fill, without the module.
     std::function<void()> steps = nullptr;
+
+    bool slow = false; ///< takes so long that it is worth fewer repetitions
 };
 
 /// Measures the pairs, their repetitions in random order, and prints a table in Markdown of how
 /// they compare. The median is what one run usually sees; the shortest repetition is what a machine
 /// that does other work besides disturbs least; it is also compared with the second references,
-/// where there are any. `--write FILE` puts the table into a document as
-/// well, between the marks "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; the rest of the
-/// command line goes to Google Benchmark. Gives back main's status.
+/// where there are any. `--write FILE` puts the table into a document as well, between the marks
+/// "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; `--quick` does everything twice only, to show
+/// that it works; the rest of the command line goes to Google Benchmark, which keeps all
+/// repetitions in the file that `--benchmark_out` names. Gives back main's status.
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
 
 /// Throws the library's text for a status that is not zero.

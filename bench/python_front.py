@@ -1,7 +1,7 @@
 # bench/python_front.py: what a call from Python costs, beside netCDF4-python.
 """Measures tessel and netCDF4-python (Debian's python3-netcdf4) in one run, on the same files.
 
-usage: python_front.py [--write DOCUMENT] [--quick]
+usage: python_front.py [--write DOCUMENT] [--json FILE] [--quick]
 
 Each row is one piece of work done by each side. The sides take turns, in another order in each
 repetition. A time is the median of all repetitions; how many times faster one side is, is the
@@ -16,10 +16,8 @@ a machine that does nothing else.
 
 from __future__ import annotations
 
-import argparse
 import platform
 import random
-import sys
 import tempfile
 from collections.abc import Callable
 from functools import partial
@@ -30,11 +28,12 @@ import netCDF4
 import numpy as np
 
 import tessel
-from measuring import NOISE, Work, measure, put_between_marks
+from measuring import Measured, Work, give_out, measure, options_of
 
 FORMAT = "NETCDF3_64BIT_OFFSET"
 MAPPED = 16  # the library's mode flag for mapping a file, which is none of its named constants
 TEN = 10
+EXPECTED = {"call": 30, "method": 20}  # times faster, where the call itself is what costs
 
 Places = list[tuple[int, int, int]]
 
@@ -182,18 +181,26 @@ class Bench:
         return chosen
 
     def rows(self) -> list[Row]:
-        large = f"{self.data.nbytes >> 20} MiB"
         small = [
+<<<<<<< HEAD
             Row(f"{what}, {how}, {form}", "µs", expected.get(form), partial(ours, places),
+=======
+            Row(f"{what}, {how}, {form}", "µs", EXPECTED[form] if near else None, partial(ours, places),
+>>>>>>> dccb615 (One command measures everything and writes the tables, the expectations beside what was measured, and a chart)
                 self.masked(partial(theirs, places)), self.times)
             for what, theirs, forms in (
                 ("one element", self.element_netcdf4,
                  {"call": self.element_tessel, "method": self.element_method}),
                 ("ten elements", self.block_netcdf4,
                  {"call": self.block_tessel, "method": self.block_method}))
+<<<<<<< HEAD
             for how, places, expected in (
                 ("one after the other", self.near, {"call": 30, "method": 20}),
                 ("anywhere in the file", self.anywhere, {}))
+=======
+            for how, places, near in (("one after the other", self.near, True),
+                                      ("anywhere in the file", self.anywhere, False))
+>>>>>>> dccb615 (One command measures everything and writes the tables, the expectations beside what was measured, and a chart)
             for form, ours in forms.items()
         ]
         return [
@@ -206,9 +213,9 @@ class Bench:
               for name, expected, nc in (
                   ("open and close", 1, self.nc),
                   ("open and close, without the guard", None, self.unguarded))),
-            Row(f"read {large}", "ms", 1, self.read_tessel,
+            Row("whole read", "ms", 1, self.read_tessel,
                 self.masked(self.read_netcdf4), 1),
-            Row(f"write {large} to a new file", "ms", 1, self.write_tessel,
+            Row("whole write, to a new file", "ms", 1, self.write_tessel,
                 lambda mask: lambda: self.write_netcdf4(mask), 1),
         ]
 
@@ -226,21 +233,21 @@ class Bench:
         assert written == self.new.read_bytes(), "the files differ"
 
 
-def table(bench: Bench, repetitions: int) -> tuple[list[str], bool]:
-    """The rows as Markdown, and whether each is as fast as expected."""
+def table(bench: Bench, repetitions: int) -> tuple[list[str], dict[str, dict[str, Measured]]]:
+    """The rows as Markdown, and as numbers."""
     scale = {"µs": 1e6, "ms": 1e3}
     lines = ["| | tessel | netCDF4, no masking | times faster | netCDF4, as it comes "
              "| times faster | expected |", "|---|---:|---:|---:|---:|---:|---:|"]
-    good = True
+    rows = {}
     for row in bench.rows():
         count = repetitions if row.unit == "µs" else max(repetitions // 3, 1)
         sides = [row.tessel, row.netcdf4(False), row.netcdf4(True)]
         ours, bare, masked = measure(sides, count, row.times, bench.remove_new)
-        good = good and bare.ratio >= (row.expected or 0) * (1 - NOISE)
+        rows[row.name] = {"tessel": ours, "netcdf4": bare, "netcdf4, masked": masked}
         show = [f"{side.time * scale[row.unit]:.3g} {row.unit}" for side in (ours, bare, masked)]
         lines.append(f"| {row.name} | {show[0]} | {show[1]} | {bare.ratio:.3g} | {show[2]} | "
                      f"{masked.ratio:.3g} | {row.expected or '–'} |")
-    return lines, good
+    return lines, rows
 
 
 def circumstances() -> str:
@@ -249,32 +256,18 @@ def circumstances() -> str:
             f"{netCDF4.__version__}, netCDF library {netCDF4.getlibversion().split()[0]}.")
 
 
-def main() -> int:
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--write", type=Path, metavar="DOCUMENT",
-                        help="put the table between the marks in this document")
-    parser.add_argument("--quick", action="store_true",
-                        help="do everything once, on small data; the numbers say nothing")
-    options = parser.parse_args()
-    if options.quick and options.write:
-        parser.error("numbers that say nothing belong into no document")
+def main() -> None:
+    options = options_of(__doc__)
     length, times, repetitions = (2, 10, 1) if options.quick else (256, 1000, 45)
     with tempfile.TemporaryDirectory() as folder:
         bench = Bench(Path(folder), length, times)
         try:
             bench.check()
-            lines, good = table(bench, repetitions)
+            lines, rows = table(bench, repetitions)
         finally:
             bench.close()
-    text = "\n".join([*lines, "", circumstances()])
-    print(text)
-    if options.quick:
-        print("\nOnce, on small data: these numbers are no measurement.")
-        return 0
-    if options.write:
-        put_between_marks(options.write, "bench/python_front.py", text)
-    return 0 if good else 1
+    give_out(options, "bench/python_front.py", "\n".join([*lines, "", circumstances()]), rows)
 
 
 if __name__ == "__main__":
-    sys.exit(main())
+    main()

@@ -1,7 +1,7 @@
 # bench/xarray_engine.py: the engine "tessel" of xarray beside the engines "netcdf4" and "scipy".
 """Measures three engines of xarray in one run, on the same file.
 
-usage: xarray_engine.py [--write DOCUMENT] [--quick]
+usage: xarray_engine.py [--write DOCUMENT] [--json FILE] [--quick]
 
 The file has 1000 records of 256 by 512 floats, 524 MB, and a series of 8 million floats, in the
 64-bit offset format, and is in the system's cache. Each row is one piece of work done through each
@@ -16,7 +16,6 @@ else.
 
 from __future__ import annotations
 
-import argparse
 import itertools
 import platform
 import sys
@@ -31,7 +30,7 @@ import netCDF4
 import numpy as np
 import scipy
 import xarray
-from measuring import NOISE, measure, put_between_marks
+from measuring import NOISE, Measured, give_out, measure, options_of
 from xarray.core import indexing
 
 ENGINES = ("tessel", "netcdf4", "scipy")
@@ -196,16 +195,19 @@ def check(bench: Bench, rows: list[Row]) -> None:
                                        err_msg=row.name)
 
 
-def table(bench: Bench, rows: list[Row], repetitions: int) -> tuple[list[str], list[str]]:
-    """The rows as Markdown, and the names of those that are slower than expected."""
+def table(bench: Bench, rows: list[Row],
+          repetitions: int) -> tuple[list[str], list[str], dict[str, dict[str, Measured]]]:
+    """The rows as Markdown, the names of those that are slower than expected, and the numbers."""
     lines = ["| | tessel | netcdf4 | times faster | expected | scipy | times faster | expected |",
              "|---|---:|---:|---:|---:|---:|---:|---:|"]
     missed = []
-    opening = Row("open and close", lambda dataset: None, times=bench.times // 10, quick=True)
+    numbers = {}
+    opening = Row("open and close", lambda dataset: None, times=bench.times // 10 or 1, quick=True)
     for row in (opening, *rows):
         sides = bench.opening() if row is opening else bench.sides(row)
-        ours, *theirs = (each.shortest for each in
-                         measure(sides, repetitions * (5 if row.quick else 1), row.times))
+        measured = measure(sides, repetitions * (5 if row.quick else 1), row.times)
+        numbers[row.name] = dict(zip(ENGINES, measured))
+        ours, *theirs = (each.shortest for each in measured)
         line = f"| {row.name} | {shown(ours)} |"
         for time, expected in zip(theirs, (row.netcdf4, row.scipy)):
             line += f" {shown(time)} | {time / ours:.3g} | {expected:.2g} |"
@@ -213,7 +215,7 @@ def table(bench: Bench, rows: list[Row], repetitions: int) -> tuple[list[str], l
                 missed.append(row.name)
         lines.append(line)
         print(lines[-1], file=sys.stderr)
-    return lines, missed
+    return lines, missed, numbers
 
 
 def shown(time: float) -> str:
@@ -229,13 +231,8 @@ def circumstances() -> str:
             f"{netCDF4.__version__}, netCDF library {version}.")
 
 
-def main() -> int:
-    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--write", type=Path, metavar="DOCUMENT",
-                        help="put the table between the marks in this document")
-    parser.add_argument("--quick", action="store_true",
-                        help="do everything once, on small data, and measure nothing")
-    options = parser.parse_args()
+def main() -> None:
+    options = options_of(__doc__)
     shape, times, repetitions = (1000, 256, 512), 200, 5
     if options.quick:
         shape, times, repetitions = (40, 16, 32), 1, 1
@@ -247,19 +244,13 @@ def main() -> int:
         try:
             rows = bench.rows(client)
             check(bench, rows)
-            if options.quick:
-                return 0
-            lines, missed = table(bench, rows, repetitions)
+            lines, missed, numbers = table(bench, rows, repetitions)
         finally:
             bench.close()
-    text = "\n".join([*lines, "", circumstances()])
-    print(text)
-    if options.write:
-        put_between_marks(options.write, "bench/xarray_engine.py", text)
-    if missed:
+    give_out(options, "bench/xarray_engine.py", "\n".join([*lines, "", circumstances()]), numbers)
+    if missed and not options.quick:
         print("Slower than expected:", *missed, sep="\n  ", file=sys.stderr)
-    return 1 if missed else 0
 
 
 if __name__ == "__main__":
-    sys.exit(main())
+    main()

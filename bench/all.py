@@ -1,0 +1,111 @@
+# bench/all.py: every measurement, one after the other, and the tables and the chart made of them.
+"""Runs the measuring programs and rewrites what the documents show of them.
+
+usage: bench/all [--quick | --tables] [PROGRAM...]
+
+bench/all is this program with the interpreter and the package of the build. Each measuring program
+puts its table into its document, and its numbers into build/release/bench/results. From those come
+docs/performance.md's tables and docs/performance.svg. It takes most of an hour; run it on a machine
+that does nothing else. PROGRAM runs only those named, --tables none at all, and the rest of the
+numbers are those of the last time. --quick tries everything out and writes no document.
+"""
+
+from __future__ import annotations
+
+import argparse
+import subprocess
+import sys
+import time
+from pathlib import Path
+from typing import NamedTuple
+
+from chart import draw
+from expectations import missed_without_reason, table
+from measuring import put_between_marks
+from results import Results
+
+PROJECT = Path(__file__).resolve().parent.parent
+BUILD = PROJECT / "build/release/bench"
+DOCS = PROJECT / "docs"
+
+
+class Program(NamedTuple):
+    """A measuring program, and the document that has its table."""
+
+    name: str
+    document: str = "measurements.md"
+
+    @property
+    def in_python(self) -> bool:
+        return self.name.endswith(".py")
+
+    def numbers(self, folder: Path) -> Path:
+        """The file of its numbers."""
+        return folder / f"{Path(self.name).stem}.json"
+
+    def command(self, folder: Path, quick: bool) -> list[str]:
+        """How it is run, from the project's folder."""
+        numbers = self.numbers(folder)
+        start = [sys.executable, "-B", str(PROJECT / "bench" / self.name), f"--json={numbers}"] \
+            if self.in_python else \
+            [str(BUILD / self.name), f"--benchmark_out={numbers}", "--benchmark_out_format=json"]
+        return [*start, *(["--quick"] if quick else ["--write", str(DOCS / self.document)])]
+
+
+PROGRAMS = [
+    Program("bench_lookup"),
+    Program("bench_calls"),
+    Program("bench_families"),
+    Program("python_front.py"),
+    Program("xarray_engine.py"),
+    Program("access_costs.py", "xarray.md"),
+]
+
+
+def run(programs: list[Program], folder: Path, quick: bool) -> None:
+    """Runs them, with what they say in the folder as well."""
+    folder.mkdir(parents=True, exist_ok=True)
+    for program in programs:
+        print(f"{program.name:20}", end="", flush=True)
+        start = time.monotonic()
+        with open(program.numbers(folder).with_suffix(".log"), "w+") as log:
+            status = subprocess.run(program.command(folder, quick), cwd=PROJECT, check=False,
+                                    stdout=log, stderr=subprocess.STDOUT).returncode
+            if status != 0:
+                log.seek(0)
+                sys.exit(f"failed\n{log.read()}")
+        print(f"{time.monotonic() - start:8.0f} s", flush=True)
+
+
+def main() -> int:
+    parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
+    names = {each.name: each for each in PROGRAMS}
+    parser.add_argument("program", nargs="*", help=", ".join(names))
+    only = parser.add_mutually_exclusive_group()
+    only.add_argument("--quick", action="store_true",
+                      help="try everything out; the numbers say nothing and go to no document")
+    only.add_argument("--tables", action="store_true",
+                      help="measure nothing, and write docs/performance.* from the last numbers")
+    options = parser.parse_args()
+    for unknown in set(options.program) - set(names):
+        parser.error(f"there is no {unknown}")
+    chosen = [names[each] for each in options.program] or PROGRAMS
+    folder = BUILD / ("quick" if options.quick else "results")
+    run([] if options.tables else chosen, folder, options.quick)
+    results = Results({each.name: each.numbers(folder) for each in PROGRAMS})
+    text = table(results)
+    print(text)
+    if options.quick:
+        draw(results, folder / "performance.svg")
+        print("\nTried out only: these numbers are no measurement.")
+        return 0
+    put_between_marks(DOCS / "performance.md", "bench/all", text)
+    draw(results, DOCS / "performance.svg")
+    unexplained = missed_without_reason(results)
+    for row in unexplained:
+        print(f"missed, and bench/expectations.py has no reason: {row}", file=sys.stderr)
+    return 1 if unexplained else 0
+
+
+if __name__ == "__main__":
+    sys.exit(main())

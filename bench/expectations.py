@@ -1,0 +1,157 @@
+# bench/expectations.py: what calls and transfers are expected to cost at most, and what they do.
+"""The rows of the table in docs/performance.md."""
+
+from __future__ import annotations
+
+from collections.abc import Callable
+from typing import NamedTuple
+
+from results import Results
+
+NUMBERS = ("double", "float", "short")
+TYPES = (*NUMBERS, "text")
+FAMILIES = ("get_var", "get_var1", "get_vara", "get_vars", "get_att",
+            "put_var", "put_var1", "put_vara", "put_vars", "put_att")
+BLOCKS = tuple(each for each in FAMILIES if not each.endswith("var1"))
+INQUIRIES = ("inq", "inq_dim", "inq_dimid, inputs at hand", "inq_varid", "inq_var", "inq_att",
+             "inq_attid", "inq_attname")
+
+
+class Limit(NamedTuple):
+    """How a time is compared with that of its reference, and what may come out at most."""
+
+    text: str
+    value: float
+    of: Callable[[float, float], float]
+    shown: Callable[[float], str]
+
+
+def nanoseconds(most: int) -> Limit:
+    return Limit(f"{most} ns", most * 1e-9, lambda ours, reference: ours,
+                 lambda value: f"{value * 1e9:.0f} ns")
+
+
+def added(most: int) -> Limit:
+    return Limit(f"+ {most} ns", most * 1e-9, lambda ours, reference: ours - reference,
+                 lambda value: f"{value * 1e9:+.0f} ns")
+
+
+def times(most: float) -> Limit:
+    return Limit(f"{most:g} times", most, lambda ours, reference: ours / reference,
+                 lambda value: f"{value:.3f} times")
+
+
+def one_of(most: int) -> Limit:
+    return Limit(f"1/{most}", 1 / most, lambda ours, reference: ours / reference,
+                 lambda value: f"1/{1 / value:.1f}")
+
+
+class Row(NamedTuple):
+    """Something measured, in all of its forms, of which the table shows the one that is furthest
+    from its expectation or nearest to it."""
+
+    what: str
+    reference: str
+    limit: Limit
+    program: str
+    forms: tuple[str, ...]
+    reason: str = ""
+    """Why it costs more, where it does."""
+
+    ours: str = "module"
+    theirs: str = "reference"
+
+
+DIRECT = "direct call"
+LIKE_MEMORY = "direct call into like memory"
+
+REASONS: dict[str, str] = {}
+
+
+def of_family(family: str, size: str, types: tuple[str, ...], limit: Limit,
+              reference: str = DIRECT) -> Row:
+    kind = "one element" if size == "one" else \
+        "text of 64 MiB" if types == ("text",) else "numbers of 64 MiB"
+    what = f"{family}, {kind}"
+    return Row(what, reference, limit, "bench_families",
+               tuple(f"{family}_{each}/{size}" for each in types), REASONS.get(what, ""))
+
+
+def from_python(what: str, limit: Limit) -> Row:
+    return Row(f"Python: {what}", "netCDF4-python", limit, "python_front.py", (what,),
+               REASONS.get(f"Python: {what}", ""), "tessel", "netcdf4")
+
+
+ROWS = (
+    Row("lookup of any name", "", nanoseconds(30), "bench_lookup",
+        ("lookup, in lower case", "lookup, in capitals")),
+    *(of_family(each, "one", TYPES, added(120)) for each in FAMILIES),
+    *(Row(each.split(",")[0], DIRECT, added(150), "bench_calls", (each,),
+          REASONS.get(each.split(",")[0], ""))
+      for each in INQUIRIES),
+    Row("get_var_double of 256 MiB", LIKE_MEMORY, times(1.01), "bench_calls",
+        ("get_var_double of 256 MiB",)),
+    *(of_family(each, "64MiB", NUMBERS, times(1.01), LIKE_MEMORY) for each in BLOCKS),
+    *(of_family(each, "64MiB", ("text",), times(1.25)) for each in BLOCKS),
+    from_python("one element, one after the other, call", one_of(30)),
+    from_python("one element, one after the other, method", one_of(20)),
+    from_python("whole read", times(1)),
+    from_python("whole write, to a new file", times(1)),
+)
+
+
+class Outcome(NamedTuple):
+    """What was measured of a row, in the form that counts."""
+
+    row: Row
+    form: str
+    reference: float
+    ours: float
+
+    @property
+    def value(self) -> float:
+        return self.row.limit.of(self.ours, self.reference)
+
+    @property
+    def met(self) -> bool:
+        return self.value <= self.row.limit.value
+
+
+def outcome(row: Row, results: Results) -> Outcome:
+    def of_form(form: str) -> Outcome:
+        sides = results.of(row.program, form)
+        return Outcome(row, form, sides[row.theirs], sides[row.ours])
+    return max(map(of_form, row.forms), key=lambda each: each.value)
+
+
+def outcomes(results: Results) -> list[Outcome]:
+    return [outcome(row, results) for row in ROWS]
+
+
+def missed_without_reason(results: Results) -> list[str]:
+    return [each.row.what for each in outcomes(results) if not each.met and not each.row.reason]
+
+
+def shown(seconds: float) -> str:
+    """A time with its unit."""
+    scale, unit = next((scale, unit) for scale, unit, least in
+                       ((1e3, "ms", 1e-3), (1e6, "µs", 1e-6), (1e9, "ns", 0)) if seconds >= least)
+    return f"{seconds * scale:.3g} {unit}"
+
+
+def table(results: Results) -> str:
+    """The table, and the reasons for what is missed."""
+    lines = ["| what | reference | at most | its time | ours | measured | |",
+             "|---|---|---:|---:|---:|---:|---|"]
+    reasons = []
+    for each in outcomes(results):
+        row = each.row
+        form = f" ({each.form.split('/')[0]})" if len(row.forms) > 1 else ""
+        lines.append(f"| {row.what}{form} | {row.reference or '–'} | {row.limit.text} | "
+                     f"{shown(each.reference) if row.reference else '–'} | {shown(each.ours)} | "
+                     f"{row.limit.shown(each.value)} | {'met' if each.met else '**missed**'} |")
+        if not each.met:
+            reasons.append(f"- **{row.what}**: {row.reason or 'not explained yet'}")
+    if reasons:
+        lines += ["", "Missed:", "", *reasons]
+    return "\n".join(lines)
