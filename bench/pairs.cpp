@@ -16,7 +16,7 @@ namespace tessel::bench {
 namespace {
 
 constexpr int repetitions = 25;
-constexpr int slowRepetitions = 9;
+constexpr int slowRepetitions = 5;
 constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
 
 double shortest(const std::vector<double> &all) {

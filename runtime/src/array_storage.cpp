@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <optional>
-#include <utility>
 
 namespace tessel {
 namespace {
@@ -57,36 +56,6 @@ std::optional<std::size_t> countElements(Dims dims, std::size_t elementSize) noe
     std::ptrdiff_t bytes = 0;
     tooMany |= __builtin_mul_overflow(elements, std::max<std::size_t>(elementSize, 1), &bytes);
     return tooMany ? std::nullopt : std::optional(elements);
-}
-
-/// The rooms that a thread keeps, each with the next one's address in it. Plain data, because
-/// arrays may go after everything else of the thread has gone.
-struct SpareRooms {
-    void *first;
-    std::size_t count;
-    bool endKnown; ///< the thread gives them back when it ends
-};
-[[gnu::tls_model("initial-exec")]] constinit thread_local SpareRooms spareRooms = {};
-
-/// None where a sanitizer is to find out who uses an array that is no more.
-constexpr std::size_t mostSpareRooms = TESSEL_SPARE_ARRAYS;
-
-/// Gives a thread's rooms back when it ends; from then on it keeps none.
-struct RoomsAtThreadEnd {
-    ~RoomsAtThreadEnd() {
-        while (spareRooms.first != nullptr) {
-            void *const room = spareRooms.first;
-            spareRooms.first = *static_cast<void **>(room);
-            ::operator delete(room);
-        }
-        spareRooms.count = mostSpareRooms;
-    }
-};
-
-/// Has the thread do so.
-void giveBackAtThreadEnd() noexcept {
-    thread_local const RoomsAtThreadEnd atEnd;
-    spareRooms.endKnown = true;
 }
 
 } // namespace
@@ -198,28 +167,6 @@ void putIntoCell(tsArray &cell, Array &place, Array &&value) noexcept {
 }
 
 } // namespace tessel
-
-void *tsArray::operator new(std::size_t size) {
-    using tessel::spareRooms;
-    if (spareRooms.first == nullptr) {
-        return ::operator new(size);
-    }
-    --spareRooms.count;
-    return std::exchange(spareRooms.first, *static_cast<void **>(spareRooms.first));
-}
-
-void tsArray::operator delete(void *room) noexcept {
-    using tessel::spareRooms;
-    if (spareRooms.count >= tessel::mostSpareRooms || tessel::isChecked()) {
-        ::operator delete(room);
-        return;
-    }
-    if (!spareRooms.endKnown) {
-        tessel::giveBackAtThreadEnd();
-    }
-    ++spareRooms.count;
-    *static_cast<void **>(room) = std::exchange(spareRooms.first, room);
-}
 
 /// Cells may be nested deeper than the stack is, so what is in them is not destroyed from within
 /// them but taken out, one after the other.

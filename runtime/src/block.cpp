@@ -1,13 +1,11 @@
 // runtime/src/block.cpp: the memory that array data and a module's buffers are made of.
 #include "block.hpp"
 
+#include "large_room.hpp"
 #include "tessel/runtime/module.hpp"
-
-#include <sys/mman.h>
 
 #include <algorithm>
 #include <atomic>
-#include <cstdint>
 #include <cstdlib>
 #include <cstring>
 #include <limits>
@@ -22,15 +20,10 @@ constexpr std::size_t guardSize = 64;
 constexpr unsigned char guardByte = 0xA7;
 constexpr unsigned char undefinedByte = 0xC5;
 
-/// The size of the kernel's huge pages on the systems we know, and the size from which on a block
-/// is mapped for them by itself.
-constexpr std::size_t hugePage = std::size_t{2} << 20U;
-
 /// What stands before the data of each block. The front guard is next to the data.
 struct Header : Link {
     std::size_t bytes;
-    void *mapping;           ///< the start of the block's own mapping; nullptr for the heap's
-    std::size_t mappingSize; ///< its size
+    std::size_t roomSize; ///< the size of its large room; 0 for the heap's
     bool guarded;
     alignas(std::max_align_t) unsigned char frontGuard[guardSize];
 };
@@ -45,21 +38,13 @@ const Header *headerOf(const void *block) noexcept {
     return static_cast<const Header *>(block) - 1;
 }
 
-/// Mapped memory in which the huge pages can be used from the start on; zero-filled by the kernel.
-Header *mapBlock(std::size_t total) noexcept {
-    const std::size_t size = total + hugePage;
-    void *const mapping =
-        mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    if (mapping == MAP_FAILED) {
+Header *largeBlock(std::size_t total, Fill fill) noexcept {
+    const LargeRoom room = takeLargeRoom(total, fill);
+    if (room.start == nullptr) {
         return nullptr;
     }
-    const auto start = reinterpret_cast<std::uintptr_t>(mapping);
-    const std::size_t skip = (hugePage - start % hugePage) % hugePage;
-    unsigned char *const aligned = static_cast<unsigned char *>(mapping) + skip;
-    madvise(aligned, total, MADV_HUGEPAGE); // advice: without it the block is as good, and slower
-    auto *const header = new (aligned) Header;
-    header->mapping = mapping;
-    header->mappingSize = size;
+    auto *const header = new (room.start) Header;
+    header->roomSize = room.size;
     return header;
 }
 
@@ -69,7 +54,7 @@ Header *heapBlock(std::size_t total, Fill fill) noexcept {
         return nullptr;
     }
     auto *const header = new (memory) Header;
-    header->mapping = nullptr;
+    header->roomSize = 0;
     if (fill == Fill::zero) {
         std::memset(static_cast<void *>(header + 1), 0, total - sizeof(Header));
     }
@@ -109,7 +94,7 @@ void *allocateBlock(std::size_t bytes, Fill fill) noexcept {
         return nullptr;
     }
     const std::size_t total = bytes + overhead;
-    Header *const header = total >= hugePage ? mapBlock(total) : heapBlock(total, fill);
+    Header *const header = total >= hugePage ? largeBlock(total, fill) : heapBlock(total, fill);
     if (header == nullptr) {
         return nullptr;
     }
@@ -131,8 +116,8 @@ void freeBlock(void *block) noexcept {
         return;
     }
     Header *const header = headerOf(block);
-    if (header->mapping != nullptr) {
-        munmap(header->mapping, header->mappingSize);
+    if (header->roomSize != 0) {
+        giveBack({header, header->roomSize});
     } else {
         std::free(header);
     }

@@ -9,8 +9,11 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
+#include <cstring>
 #include <fstream>
 #include <sstream>
+#include <thread>
 
 namespace tessel::test {
 namespace {
@@ -29,8 +32,8 @@ int inChild(const Run &run) {
     return WIFEXITED(status) ? WEXITSTATUS(status) : -WTERMSIG(status);
 }
 
-/// The line of flags of the mapping that an address is in.
-std::string mappingFlags(const void *address) {
+/// A line about the mapping that an address is in, "VmFlags:" for example; "" where there is none.
+std::string mappingLine(const void *address, const char *which) {
     std::ifstream smaps("/proc/self/smaps");
     const auto wanted = reinterpret_cast<std::uintptr_t>(address);
     bool found = false;
@@ -41,11 +44,15 @@ std::string mappingFlags(const void *address) {
         char dash = 0;
         if (fields >> std::hex >> start >> dash >> end && dash == '-') {
             found = start <= wanted && wanted < end;
-        } else if (found && line.starts_with("VmFlags:")) {
-            return line + " ";
+        } else if (found && line.starts_with(which)) {
+            return line.substr(std::string_view(which).size()) + " ";
         }
     }
     return "";
+}
+
+std::string mappingFlags(const void *address) {
+    return mappingLine(address, "VmFlags:");
 }
 
 TEST(Memory, LargeArraysAreForHugePages) {
@@ -65,15 +72,70 @@ TEST(Memory, LargeArraysAreForHugePages) {
     }
 }
 
+/// An array of so many huge pages without their overhead, all of it written to.
+Array writtenArray(std::size_t pages) {
+    const std::array<std::size_t, 1> dims = {pages * hugePage - 4096};
+    Array array = Array::numeric(tsUINT8, dims);
+    std::memset(array.data(), 'x', array.size());
+    return array;
+}
+
 TEST(Memory, LargeBlocksAreGivenBack) {
-    const std::array<std::size_t, 1> dims = {64 * hugePage / sizeof(double)};
-    const void *where = nullptr;
-    {
-        const Array array = Array::numeric(tsDOUBLE, dims);
-        where = array.data();
-        ASSERT_NE(mappingFlags(where), "");
+    const auto afterwards = [](std::size_t pages) {
+        const void *const where = writtenArray(pages).data();
+        return mappingFlags(where);
+    };
+    EXPECT_EQ(afterwards(129), "") << "more than what may wait";
+    setChecked(true);
+    EXPECT_EQ(afterwards(8), "") << "in checked mode";
+    setChecked(false);
+    if (!sanitized) {
+        EXPECT_NE(afterwards(8), "") << "it waits for the next one";
     }
-    EXPECT_EQ(mappingFlags(where), "");
+}
+
+TEST(Memory, NoMoreThanTwoLargeBlocksWait) {
+    if (sanitized) {
+        GTEST_SKIP() << "none waits";
+    }
+    std::vector<const void *> where;
+    {
+        std::array arrays = {writtenArray(8), writtenArray(12), writtenArray(16)};
+        for (Array &array : arrays) {
+            where.push_back(array.data());
+        }
+        for (Array &array : arrays) {
+            array = Array();
+        }
+    }
+    EXPECT_EQ(mappingFlags(where[0]), "");
+    EXPECT_NE(mappingFlags(where[1]), "");
+    EXPECT_NE(mappingFlags(where[2]), "");
+    EXPECT_EQ(writtenArray(10).data(), where[1]) << "the other one is much too large";
+}
+
+TEST(Memory, WhatWaitsIsTheKernelsToTake) {
+    if (sanitized) {
+        GTEST_SKIP() << "none waits";
+    }
+    const void *const where = writtenArray(8).data();
+    EXPECT_GE(std::stoul(mappingLine(where, "LazyFree:")), 7 * hugePage / 1024);
+}
+
+TEST(Memory, WhatWaitedIsZeroWhereItHasToBe) {
+    for (const std::size_t pages :
+         std::array<std::size_t, 2>{7, 8}) { // smaller than the one that waits, and as large
+        const void *const where = writtenArray(8).data();
+        const Array zeros = Array::logical(std::array{pages * hugePage - 4096});
+        EXPECT_EQ(zeros.data() == where, !sanitized);
+        const auto all = zeros.elements<std::uint8_t>();
+        EXPECT_EQ(std::count(all.begin(), all.end(), 0), static_cast<std::ptrdiff_t>(all.size()));
+    }
+}
+
+TEST(Memory, NothingWaitsForLittle) {
+    const void *const where = writtenArray(16).data();
+    EXPECT_NE(writtenArray(8).data(), where) << "half of it would be of no use";
 }
 
 TEST(Memory, SizesAroundTheThresholdAreWhole) {
@@ -203,9 +265,42 @@ TEST(Memory, ThatRunsOutIsAnError) {
     }
 }
 
+TEST(Memory, WhatWaitsGoesWhenAddressesRunOut) {
+    if (sanitized) {
+        GTEST_SKIP() << "none waits";
+    }
+    EXPECT_EQ(inChild([] {
+                  writtenArray(64);
+                  limitAddresses();
+                  try {
+                      writtenArray(80);
+                  } catch (const Error &) {
+                      return 1;
+                  }
+                  return 0;
+              }),
+              0);
+}
+
 /// Nothing under the sanitizers, which look for what is left by themselves.
 std::size_t heapInUse() {
     return mallinfo2().uordblks + mallinfo2().hblkhd;
+}
+
+TEST(Memory, ThreadsGiveBackTheRoomsOfTheirArrays) {
+    const auto arrays = [] {
+        std::array<Array, 20> held;
+        std::generate(held.begin(), held.end(), [] { return Array::scalar(1); });
+    };
+    const auto threads = [&](int count) {
+        for (int i = 0; i < count; ++i) {
+            std::thread(arrays).join();
+        }
+    };
+    threads(50);
+    const std::size_t before = heapInUse();
+    threads(500);
+    EXPECT_LE(heapInUse(), before + 1024);
 }
 
 TEST(Memory, IsFlatOverManyCallsWithErrors) {
