@@ -182,25 +182,16 @@ class Bench:
 
     def rows(self) -> list[Row]:
         small = [
-<<<<<<< HEAD
             Row(f"{what}, {how}, {form}", "µs", expected.get(form), partial(ours, places),
-=======
-            Row(f"{what}, {how}, {form}", "µs", EXPECTED[form] if near else None, partial(ours, places),
->>>>>>> dccb615 (One command measures everything and writes the tables, the expectations beside what was measured, and a chart)
                 self.masked(partial(theirs, places)), self.times)
             for what, theirs, forms in (
                 ("one element", self.element_netcdf4,
                  {"call": self.element_tessel, "method": self.element_method}),
                 ("ten elements", self.block_netcdf4,
                  {"call": self.block_tessel, "method": self.block_method}))
-<<<<<<< HEAD
             for how, places, expected in (
-                ("one after the other", self.near, {"call": 30, "method": 20}),
+                ("one after the other", self.near, EXPECTED),
                 ("anywhere in the file", self.anywhere, {}))
-=======
-            for how, places, near in (("one after the other", self.near, True),
-                                      ("anywhere in the file", self.anywhere, False))
->>>>>>> dccb615 (One command measures everything and writes the tables, the expectations beside what was measured, and a chart)
             for form, ours in forms.items()
         ]
         return [
