@@ -56,6 +56,7 @@ PROGRAMS = [
     Program("bench_lookup"),
     Program("bench_calls"),
     Program("bench_families"),
+    Program("bench_scaling"),
     Program("python_front.py"),
     Program("xarray_engine.py"),
     Program("access_costs.py", "xarray.md"),

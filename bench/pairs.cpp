@@ -79,7 +79,10 @@ class Statistics : public benchmark::ConsoleReporter {
 /// wants more than the table has.
 void add(const std::string &name, const std::function<void()> &work, const Pair &pair, bool quick) {
     auto *const registered =
-        benchmark::RegisterBenchmark(name.c_str(), [&work](benchmark::State &state) {
+        benchmark::RegisterBenchmark(name.c_str(), [&work, &pair](benchmark::State &state) {
+            if (pair.before) {
+                pair.before();
+            }
             for ([[maybe_unused]] auto _ : state) {
                 work();
             }
