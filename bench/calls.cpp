@@ -13,6 +13,7 @@
 namespace {
 
 using namespace tessel;
+using bench::called;
 using bench::check;
 using bench::Pair;
 
@@ -53,21 +54,6 @@ class Dataset {
   private:
     bench::TemporaryFolder folder;
 };
-
-/// A call with inputs that are made once.
-template <class... Inputs>
-std::function<void()> called(const Module &netcdf, Inputs &&...made) {
-    auto held = std::make_shared<std::vector<Array>>();
-    (held->push_back(std::move(made)), ...);
-    auto inputs = std::make_shared<std::vector<const tsArray *>>();
-    for (const Array &array : *held) {
-        inputs->push_back(array.get());
-    }
-    return [&netcdf, held, inputs] {
-        const Results results = netcdf.call(*inputs);
-        benchmark::DoNotOptimize(&results);
-    };
-}
 
 /// The other inquiries, inputs at hand. Each result is a host array of its own, and "inq" and
 /// "inq_var" have four.

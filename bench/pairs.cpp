@@ -75,18 +75,21 @@ class Statistics : public benchmark::ConsoleReporter {
     std::map<std::string, double> seconds;
 };
 
-void add(const std::string &name, const std::function<void()> &work, bool block) {
+void add(const std::string &name, const std::function<void()> &work, const Pair &pair) {
     auto *const registered =
-        benchmark::RegisterBenchmark(name.c_str(), [&work](benchmark::State &state) {
+        benchmark::RegisterBenchmark(name.c_str(), [&work, &pair](benchmark::State &state) {
+            if (pair.before) {
+                pair.before();
+            }
             for ([[maybe_unused]] auto _ : state) {
                 work();
             }
         });
-    registered->Repetitions(block ? blockRepetitions : repetitions)
+    registered->Repetitions(pair.block ? blockRepetitions : repetitions)
         ->ReportAggregatesOnly()
         ->UseRealTime();
     registered->ComputeStatistics("shortest", shortest);
-    if (block) {
+    if (pair.block) {
         registered->Iterations(1)->Unit(benchmark::kMillisecond);
     } else {
         registered->MinTime(shortestTime);
@@ -146,10 +149,10 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         return 1;
     }
     for (const Pair &pair : pairs) {
-        add(pair.name + "/reference", pair.reference, pair.block);
-        add(pair.name + "/module", pair.module, pair.block);
+        add(pair.name + "/reference", pair.reference, pair);
+        add(pair.name + "/module", pair.module, pair);
         if (pair.steps) {
-            add(pair.name + "/steps", pair.steps, pair.block);
+            add(pair.name + "/steps", pair.steps, pair);
         }
     }
     Statistics statistics;

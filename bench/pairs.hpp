@@ -1,11 +1,17 @@
 // bench/pairs.hpp: measuring something beside its reference, in one run.
 #pragma once
 
+#include "tessel/runtime.hpp"
+
 #include <benchmark/benchmark.h>
 
+#include <algorithm>
+#include <array>
 #include <filesystem>
 #include <functional>
+#include <memory>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace tessel::bench {
@@ -20,6 +26,8 @@ struct Pair {
     /// A second reference, where the operation is more than its one function: all library calls
     /// that it has to make, and all memory that it has to fill, without the module.
     std::function<void()> steps = nullptr;
+
+    std::function<void()> before = nullptr; ///< comes before each repetition, unmeasured
 };
 
 /// Measures the pairs, their repetitions in random order, and prints a table in Markdown of how
@@ -29,6 +37,20 @@ struct Pair {
 /// well, between the marks "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; the rest of the
 /// command line goes to Google Benchmark. Gives back main's status.
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
+
+/// A call with inputs that are made once, as a program's loop would have them.
+template <class... Inputs>
+std::function<void()> called(const Module &module, Inputs... made) {
+    auto held =
+        std::make_shared<std::array<Array, sizeof...(Inputs)>>(std::array{std::move(made)...});
+    return [&module, held] {
+        std::array<const tsArray *, sizeof...(Inputs)> inputs{};
+        std::transform(held->begin(), held->end(), inputs.begin(),
+                       [](const Array &array) { return array.get(); });
+        const Results results = module.call(inputs);
+        benchmark::DoNotOptimize(&results);
+    };
+}
 
 /// Throws the library's text for a status that is not zero.
 void check(int status);
