@@ -27,6 +27,7 @@ from results import Results
 PROJECT = Path(__file__).resolve().parent.parent
 BUILD = PROJECT / "build/release/bench"
 DOCS = PROJECT / "docs"
+PICTURE = "![What calls and transfers cost, beside what is expected](performance.svg)"
 
 
 class Program(NamedTuple):
@@ -94,7 +95,7 @@ def main() -> int:
     folder = BUILD / ("quick" if options.quick else "results")
     run([] if options.tables else chosen, folder, options.quick)
     results = Results({each.name: each.numbers(folder) for each in PROGRAMS})
-    text = table(results)
+    text = f"{PICTURE}\n\n{table(results)}"
     print(text)
     if options.quick:
         draw(results, folder / "performance.svg")

@@ -65,7 +65,21 @@ class Row(NamedTuple):
 DIRECT = "direct call"
 LIKE_MEMORY = "direct call into like memory"
 
-REASONS: dict[str, str] = {}
+TWO_FUNCTIONS = "the operation is two functions of the library, and the reference is one"
+ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters are zeros "
+         "before they are anything else; see [Blocks of text](#blocks-of-text)")
+UNCOPIED = ("nothing is copied or added on this way, and the same row lies on either side of one in "
+            "other runs; see [Blocks of numbers](#blocks-of-numbers)")
+
+REASONS = {
+    **{f"{each}, one element": TWO_FUNCTIONS + "; see [One element](#one-element)"
+       for each in ("get_var", "get_var1", "get_vara", "get_vars", "get_att",
+                    "put_var1", "put_vara", "put_vars")},
+    **{f"{each}, text of 64 MiB": ZEROS
+       for each in ("get_var", "get_vara", "get_att", "put_var", "put_vara", "put_att")},
+    **{f"{each}, numbers of 64 MiB": UNCOPIED for each in BLOCKS},
+    "get_var_double of 256 MiB": UNCOPIED,
+}
 
 
 def of_family(family: str, size: str, types: tuple[str, ...], limit: Limit,

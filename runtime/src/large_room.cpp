@@ -85,12 +85,13 @@ void keep(LargeRoom room) noexcept {
     unmap({waits, waits->size});
 }
 
-/// A room that waits and is large enough, and not much too large.
+/// A room that waits and is large enough, and at most twice as large: what is not used of it stays
+/// the kernel's to take.
 LargeRoom takeSpare(std::size_t bytes) noexcept {
     for (std::atomic<Spare *> &place : spares) {
         if (Spare *const spare = place.exchange(nullptr)) {
             const LargeRoom room = {spare, spare->size};
-            if (room.size >= bytes && room.size - inWholePages(bytes) <= room.size / 4) {
+            if (room.size >= bytes && room.size <= 2 * inWholePages(bytes)) {
                 return room;
             }
             keep(room);

@@ -100,7 +100,7 @@ TEST(Memory, NoMoreThanTwoLargeBlocksWait) {
     }
     std::vector<const void *> where;
     {
-        std::array arrays = {writtenArray(8), writtenArray(12), writtenArray(16)};
+        std::array arrays = {writtenArray(8), writtenArray(12), writtenArray(24)};
         for (Array &array : arrays) {
             where.push_back(array.data());
         }
@@ -135,7 +135,7 @@ TEST(Memory, WhatWaitedIsZeroWhereItHasToBe) {
 
 TEST(Memory, NothingWaitsForLittle) {
     const void *const where = writtenArray(16).data();
-    EXPECT_NE(writtenArray(8).data(), where) << "half of it would be of no use";
+    EXPECT_NE(writtenArray(7).data(), where) << "most of it would be of no use";
 }
 
 TEST(Memory, SizesAroundTheThresholdAreWhole) {
