@@ -66,10 +66,10 @@ DIRECT = "direct call"
 LIKE_MEMORY = "direct call into like memory"
 
 TWO_FUNCTIONS = "the operation is two functions of the library, and the reference is one"
-ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters are zeros "
-         "before they are anything else; see [Blocks of text](#blocks-of-text)")
-UNCOPIED = ("nothing is copied or added on this way, and the same row lies on either side of one in "
-            "other runs; see [Blocks of numbers](#blocks-of-numbers)")
+ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters are "
+         "zeros before they are anything else; see [Blocks of text](#blocks-of-text)")
+UNCOPIED = ("nothing is copied or added on this way, and the same row lies on either side of one "
+            "in other runs; see [Blocks of numbers](#blocks-of-numbers)")
 
 REASONS = {
     **{f"{each}, one element": TWO_FUNCTIONS + "; see [One element](#one-element)"
