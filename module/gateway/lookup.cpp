@@ -71,7 +71,7 @@ constexpr std::size_t next(std::size_t slot) {
 constexpr void insert(std::array<Slot, slotCount> &slots, std::string_view name,
                       const OperationEntry &entry) {
     std::size_t at = slotOf(name, slotCount);
-    while (slots[at].entry != nullptr) {
+    while (!slots[at].name.empty()) {
         if (slots[at].name == name) {
             return; // the first row of a name is the one that counts
         }
@@ -101,7 +101,7 @@ char lowerCase(char c) {
 
 /// The row of a name in lower case; nullptr for any other name.
 const OperationEntry *rowOf(std::string_view name) {
-    for (std::size_t at = slotOf(name, slotCount); slots[at].entry != nullptr; at = next(at)) {
+    for (std::size_t at = slotOf(name, slotCount); !slots[at].name.empty(); at = next(at)) {
         if (slots[at].name == name) {
             return slots[at].entry;
         }

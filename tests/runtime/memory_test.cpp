@@ -127,13 +127,18 @@ TEST(Memory, WhatWaitedIsZeroWhereItHasToBe) {
          std::array<std::size_t, 2>{7, 8}) { // smaller than the one that waits, and as large
         const void *const where = writtenArray(8).data();
         const Array zeros = Array::logical(std::array{pages * hugePage - 4096});
-        EXPECT_EQ(zeros.data() == where, !sanitized);
+        if (!sanitized) { // where nothing waits, the same place is chance
+            EXPECT_EQ(zeros.data(), where);
+        }
         const auto all = zeros.elements<std::uint8_t>();
         EXPECT_EQ(std::count(all.begin(), all.end(), 0), static_cast<std::ptrdiff_t>(all.size()));
     }
 }
 
 TEST(Memory, NothingWaitsForLittle) {
+    if (sanitized) {
+        GTEST_SKIP() << "none waits";
+    }
     const void *const where = writtenArray(16).data();
     EXPECT_NE(writtenArray(7).data(), where) << "most of it would be of no use";
 }
