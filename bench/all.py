@@ -20,7 +20,7 @@ from pathlib import Path
 from typing import NamedTuple
 
 from chart import draw
-from expectations import missed_without_reason, table
+from expectations import ROWS, missed_without_reason, table
 from measuring import put_between_marks
 from results import Results
 
@@ -94,7 +94,8 @@ def main() -> int:
     chosen = [names[each] for each in options.program] or PROGRAMS
     folder = BUILD / ("quick" if options.quick else "results")
     run([] if options.tables else chosen, folder, options.quick)
-    results = Results({each.name: each.numbers(folder) for each in PROGRAMS})
+    results = Results({each.name: each.numbers(folder) for each in PROGRAMS
+                       if each.name in {row.program for row in ROWS}})
     text = f"{PICTURE}\n\n{table(results)}"
     print(text)
     if options.quick:
