@@ -1,6 +1,7 @@
 // guard/src/datasets.hpp: what the guard knows of open datasets.
 #pragma once
 
+#include "header.hpp"
 #include "tessel/runtime/watcher.hpp"
 
 #include <cstdint>
@@ -14,6 +15,7 @@ namespace tessel::guard {
 /// A dataset between the call that opened it and the one that ends it.
 struct Dataset {
     std::string path;
+    FileIdentity file;   // of those that exist when they are opened
     bool classic = true; // not based on HDF5
     bool writable = true;
     bool defining = false;

@@ -86,16 +86,16 @@ void lookAtName(std::string_view path, const GuardOptions &options) {
     }
 }
 
-/// Whether the file is of a classic format.
-bool lookAtOpening(const std::string &path, int flags) {
+/// What the file is like.
+Header lookAtOpening(const std::string &path, int flags) {
     if ((flags & inMemory) != 0 && (flags & answeredBefore) == 0) {
         refuse(mode, "the flag 32768 (NC_INMEMORY) is set");
     }
-    const Header found = headerOf(path);
+    Header found = headerOf(path);
     if (found.claim) {
         refuse(header, "the header of " + inQuotes(path) + " " + *found.claim);
     }
-    return found.classic;
+    return found;
 }
 
 /// Whether a file that is opened with this mode may be written to.
@@ -110,10 +110,10 @@ bool opensForWriting(const tsArray *mode) {
     return name == "WRITE" || name == "NC_WRITE";
 }
 
-/// Synchronising a dataset that is open for reading makes the library read its header again. Which
-/// of the open files is the dataset's is not known, when its name leads to another one by now.
-void lookAtOpenHeaders() {
-    for (const std::string &file : filesOpenForReading()) {
+/// Synchronising a dataset that is open for reading makes the library read its header again, from
+/// the file that it opened; its name may lead to another one by now.
+void lookAtOpenHeader(const FileIdentity &opened) {
+    for (const std::string &file : namesOfOpen(opened)) {
         if (const Header found = headerOf(file); found.claim) {
             std::error_code ignored;
             refuse(header, "the header of " +
@@ -331,10 +331,13 @@ class Guard : public Watcher {
             writable = kind == Kind::create || opensForWriting(inputs[2]);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
-            classic =
-                kind == Kind::open
-                    ? lookAtOpening(path, flags)
-                    : lookAtCreation(flags, inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0);
+            opened = {};
+            if (kind == Kind::open) {
+                opened = lookAtOpening(path, flags);
+            } else {
+                opened.classic =
+                    lookAtCreation(flags, inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0);
+            }
             return;
         }
         const auto ncid = integer(inputs[1]);
@@ -343,7 +346,7 @@ class Guard : public Watcher {
         }
         Dataset *const dataset = datasets().find(*ncid);
         if (kind == Kind::sync && dataset != nullptr && dataset->classic && !dataset->writable) {
-            lookAtOpenHeaders();
+            lookAtOpenHeader(dataset->file);
         }
         if (kind == Kind::close && dataset != nullptr && dataset->writable &&
             survivesItsEnd(*dataset)) {
@@ -395,7 +398,8 @@ class Guard : public Watcher {
         Dataset dataset;
         dataset.path = std::move(path);
         dataset.defining = kind == Kind::create;
-        dataset.classic = classic;
+        dataset.file = opened.file;
+        dataset.classic = opened.classic;
         dataset.writable = writable;
         datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
     }
@@ -438,7 +442,7 @@ class Guard : public Watcher {
     GuardOptions options;
     Kind kind = Kind::other; // of the call in progress
     std::string path;        // of what it opens
-    bool classic = false;    // whether that is of a classic format
+    Header opened;           // what that is like
     bool writable = true;
     std::uint64_t recordsEnd = 0; // where it ends, if it writes records
 };

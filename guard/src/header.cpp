@@ -13,6 +13,7 @@
 #include <charconv>
 #include <cstddef>
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <string_view>
 
@@ -54,6 +55,12 @@ class Reader {
     }
     Reader(const Reader &) = delete;
     Reader &operator=(const Reader &) = delete;
+
+    [[nodiscard]] FileIdentity identity() const noexcept {
+        struct stat status {};
+        return fstat(file, &status) == 0 ? FileIdentity{status.st_dev, status.st_ino}
+                                         : FileIdentity{};
+    }
 
     [[nodiscard]] bool has(std::uint64_t bytes) { return bytes <= ahead() || bytes <= left(); }
 
@@ -120,6 +127,7 @@ class Walk {
     explicit Walk(const std::string &path) : reader(path) {}
 
     void go(Header &found) {
+        found.file = reader.identity();
         if (reader.number(3) != 0x434446) { // "CDF"
             throw Ended{};
         }
@@ -206,6 +214,10 @@ class Walk {
     std::size_t offsetSize = 4;
 };
 
+struct CloseFolder {
+    void operator()(DIR *folder) const noexcept { closedir(folder); }
+};
+
 } // namespace
 
 Header headerOf(const std::string &path) {
@@ -220,24 +232,22 @@ Header headerOf(const std::string &path) {
     return found;
 }
 
-std::vector<std::string> filesOpenForReading() {
+std::vector<std::string> namesOfOpen(const FileIdentity &file) {
     const std::string folder = "/proc/self/fd/";
-    std::vector<std::string> files;
-    DIR *const entries = opendir(folder.c_str());
-    while (const dirent *entry = entries == nullptr ? nullptr : readdir(entries)) {
+    std::vector<std::string> names;
+    const std::unique_ptr<DIR, CloseFolder> entries(opendir(folder.c_str()));
+    while (const dirent *entry = entries == nullptr ? nullptr : readdir(entries.get())) {
         const std::string_view name = entry->d_name;
-        int file = -1;
-        std::from_chars(name.data(), name.data() + name.size(), file);
+        int descriptor = -1;
+        std::from_chars(name.data(), name.data() + name.size(), descriptor);
         struct stat status {};
-        if (file >= 0 && fstat(file, &status) == 0 && S_ISREG(status.st_mode) &&
-            (fcntl(file, F_GETFL) & O_ACCMODE) == O_RDONLY) {
-            files.push_back(std::string(folder).append(name));
+        if (descriptor >= 0 && fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode) &&
+            file == FileIdentity{status.st_dev, status.st_ino} &&
+            (fcntl(descriptor, F_GETFL) & O_ACCMODE) == O_RDONLY) {
+            names.push_back(std::string(folder).append(name));
         }
     }
-    if (entries != nullptr) {
-        closedir(entries);
-    }
-    return files;
+    return names;
 }
 
 } // namespace tessel::guard

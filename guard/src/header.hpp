@@ -1,14 +1,25 @@
 // guard/src/header.hpp: what a file of the classic formats claims about itself.
 #pragma once
 
+#include <sys/types.h>
+
 #include <optional>
 #include <string>
 #include <vector>
 
 namespace tessel::guard {
 
+/// Which file it is, whatever its name is or becomes.
+struct FileIdentity {
+    dev_t device = 0;
+    ino_t number = 0;
+
+    bool operator==(const FileIdentity &) const = default;
+};
+
 /// What the header of a file is like.
 struct Header {
+    FileIdentity file;                ///< of nothing, if it could not be opened
     bool classic = false;             ///< whether it is one of the classic formats'
     std::optional<std::string> claim; ///< what is not to be trusted in it, as part of a sentence
 };
@@ -21,8 +32,8 @@ struct Header {
 /// that the library's documentation tells programs to use).
 Header headerOf(const std::string &path);
 
-/// The files that the process has open for reading only, by names that lead to them whatever became
-/// of their own.
-std::vector<std::string> filesOpenForReading();
+/// The descriptors that the process has of this file for reading only, by names that lead to the
+/// file whatever became of its own. Other files of the process are none of a dataset's business.
+std::vector<std::string> namesOfOpen(const FileIdentity &file);
 
 } // namespace tessel::guard
