@@ -33,6 +33,12 @@ endforeach()
 set(line "COADSY: 90 values from -89 to 89, mean 0\n")
 set(arguments ${PREFIX}/second_module/series.tsx ${FILE} COADSY)
 expect("${line}" ${PREFIX}/embedding/means ${arguments})
+expect("opened\n" ${PREFIX}/embedding/guarded ${FILE})
+execute_process(COMMAND ${PREFIX}/embedding/guarded https://localhost/file.nc
+    OUTPUT_VARIABLE found RESULT_VARIABLE status)
+if(NOT status EQUAL 1 OR NOT found STREQUAL "refused: TESSEL:guard:remote\n")
+    message(FATAL_ERROR "The guard let an address through: ${found}")
+endif()
 set(ENV{TESSEL_MODULE_PATH} ${lib}/tessel) # beside a program in one piece there are no modules
 expect("${line}" ${PREFIX}/embedding/means_static ${arguments})
 
