@@ -26,6 +26,7 @@ import tessel
 MIB = 1 << 20
 SHAPE = (64, 32, 1024)  # 16 MiB of double
 NBYTES = 8 * 64 * 32 * 1024
+HUGE_PAGE = 2 << 20
 
 
 def status(field: str) -> int:
@@ -184,12 +185,13 @@ def test_nothing_but_numpy_copies_an_input(observed: Observed, layout: str) -> N
 def test_the_memory_of_a_result_goes_with_its_last_view(observed: Observed) -> None:
     observed.written_from(numbered())
     large = NBYTES * 16  # 256 MiB
+    most = (NBYTES + HUGE_PAGE) * 16  # where the kernel backs each to its end with a huge page
     before = resident()
     results = [observed.read() for _ in range(16)]
-    assert resident() - before == pytest.approx(large, rel=0.1)
+    assert 0.9 * large < resident() - before < 1.1 * most
     views = [result[::2, 1:, 0].T for result in results]
     del results
-    assert resident() - before == pytest.approx(large, rel=0.1)
+    assert 0.9 * large < resident() - before < 1.1 * most
     del views[1:]
     assert resident() - before == pytest.approx(NBYTES, abs=0.1 * large)
     np.testing.assert_array_equal(views[0], numbered()[::2, 1:, 0].T)
