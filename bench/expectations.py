@@ -74,6 +74,7 @@ UNCOPIED = ("nothing is copied or added on this way, and the same row lies on ei
             "in other runs; see [Blocks of numbers](#blocks-of-numbers)")
 
 REASONS = {
+    "lookup of any name": "a name in capitals is looked for twice, as it is and in lower case",
     **{f"{each}, one element": STRIDED if each.endswith("vars") else MORE_FUNCTIONS
        for each in FAMILIES},
     "put_att, one element": "what remains is the call itself; see [One element](#one-element)",
@@ -104,7 +105,7 @@ def from_python(what: str, limit: Limit) -> Row:
 
 ROWS = (
     Row("lookup of any name", "", nanoseconds(30), "bench_lookup",
-        ("lookup, in lower case", "lookup, in capitals")),
+        ("lookup, in lower case", "lookup, in capitals"), REASONS["lookup of any name"]),
     *(of_family(each, "one", TYPES, added(120)) for each in FAMILIES),
     *(Row(each.split(",")[0], DIRECT, added(150), "bench_calls", (each,),
           REASONS.get(each.split(",")[0], ""))
