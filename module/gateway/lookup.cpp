@@ -11,48 +11,23 @@
 #include <bit>
 #include <cctype>
 #include <cstdint>
-#include <cstring>
 #include <string_view>
-#include <type_traits>
 
 namespace tessel::netcdf {
 namespace {
 
-/// As many characters as the word has bytes.
-template <class Word>
-constexpr std::uint64_t wordAt(const char *at) {
-    Word word = 0;
-    if (std::is_constant_evaluated()) {
-        for (unsigned i = 0; i < sizeof(Word); ++i) {
-            word |= static_cast<Word>(Word{static_cast<unsigned char>(at[i])} << (8 * i));
-        }
-    } else {
-        std::memcpy(&word, at, sizeof(Word));
+/// The hash of a name, a character at a time. What comes later waits for what came before, so each
+/// step is short, and the one multiplication stands at the end.
+class Hash {
+  public:
+    constexpr void add(char c) { value = std::rotl(value, 5) ^ static_cast<unsigned char>(c); }
+    [[nodiscard]] constexpr std::size_t slotIn(std::size_t slots) const {
+        return ((value * 0x9E3779B97F4A7C15U) >> 32U) % slots;
     }
-    return word;
-}
-static_assert(std::endian::native == std::endian::little, "both ways have to give the same word");
 
-/// What a name begins and ends with, mixed into a number.
-template <class Word>
-constexpr std::uint64_t ends(std::string_view name) {
-    return wordAt<Word>(name.data()) ^
-           std::rotl(wordAt<Word>(name.data() + name.size() - sizeof(Word)), 29);
-}
-
-/// The slot that a name belongs into, by its length and what it begins and ends with. What names
-/// have in common stands in their middle.
-constexpr std::size_t slotOf(std::string_view name, std::size_t slots) {
-    std::uint64_t value = name.size();
-    if (name.size() >= 8) {
-        value ^= ends<std::uint64_t>(name);
-    } else if (name.size() >= 4) {
-        value ^= ends<std::uint32_t>(name);
-    } else if (!name.empty()) {
-        value ^= ends<std::uint8_t>(name);
-    }
-    return ((value * 0x9E3779B97F4A7C15U) >> 32U) % slots;
-}
+  private:
+    std::uint64_t value = 0;
+};
 
 struct Slot {
     std::string_view name;
@@ -70,7 +45,11 @@ constexpr std::size_t next(std::size_t slot) {
 
 constexpr void insert(std::array<Slot, slotCount> &slots, std::string_view name,
                       const OperationEntry &entry) {
-    std::size_t at = slotOf(name, slotCount);
+    Hash hash;
+    for (const char c : name) {
+        hash.add(c);
+    }
+    std::size_t at = hash.slotIn(slotCount);
     while (!slots[at].name.empty()) {
         if (slots[at].name == name) {
             return; // the first row of a name is the one that counts
@@ -100,9 +79,15 @@ char lowerCase(char c) {
 }
 
 /// The row of a name in lower case; nullptr for any other name.
-const OperationEntry *rowOf(std::string_view name) {
-    for (std::size_t at = slotOf(name, slotCount); !slots[at].name.empty(); at = next(at)) {
-        if (slots[at].name == name) {
+const OperationEntry *rowOf(const char *name) {
+    Hash hash;
+    const char *end = name;
+    for (; *end != '\0'; ++end) {
+        hash.add(*end);
+    }
+    const std::string_view wanted(name, end);
+    for (std::size_t at = hash.slotIn(slotCount); !slots[at].name.empty(); at = next(at)) {
+        if (slots[at].name == wanted) {
             return slots[at].entry;
         }
     }
@@ -112,16 +97,16 @@ const OperationEntry *rowOf(std::string_view name) {
 } // namespace
 
 const OperationEntry *findOperation(char *name) {
-    const std::string_view text = name;
     // As a rule the name is in lower case already; the rows' names are, so that what is found
-    // before it was made so is what would be found after.
-    if (const OperationEntry *const entry = rowOf(text)) {
+    // before it was made so is what would be found after. To make and compare it in one go takes
+    // half as long again: the comparison waits for the letters that were just written.
+    if (const OperationEntry *const entry = rowOf(name)) {
         return entry;
     }
     for (char *at = name; *at != '\0'; ++at) {
         *at = lowerCase(*at);
     }
-    if (const OperationEntry *const entry = rowOf(text)) {
+    if (const OperationEntry *const entry = rowOf(name)) {
         return entry;
     }
     raise(catalogue::invalidOperation, name);
