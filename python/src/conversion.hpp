@@ -44,6 +44,7 @@ struct PythonClasses {
     py::object unknown;
     py::object numpyScalar;
     py::object maskedArray;
+    py::object path; ///< Python's own, of a file
 
     /// Known once load has been called, by the extension's initialisation.
     static const PythonClasses &get();

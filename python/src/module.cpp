@@ -1,6 +1,7 @@
 // python/src/module.cpp: the extension `tessel._runtime`: loading modules and calling them.
 #include "conversion.hpp"
 #include "module_object.hpp"
+#include "others_run.hpp"
 #include "tessel/netcdf_guard.hpp"
 
 #include <filesystem>
@@ -20,7 +21,7 @@ void translate(std::exception_ptr exception) {
 template <class Load>
 py::object loaded(const Load &load) {
     return newModuleObject([&] {
-        const py::gil_scoped_release others;
+        const OthersRun others;
         return load();
     }());
 }

@@ -4,7 +4,7 @@
 // find out, as pybind11 does for any class and function, which of them is meant by what.
 #include "module_object.hpp"
 
-#include <pybind11/stl/filesystem.h>
+#include "others_run.hpp"
 
 #include <array>
 #include <cstddef>
@@ -100,18 +100,6 @@ PyObject *orException(const Work &work) {
     return nullptr;
 }
 
-/// Lets other threads of Python's run.
-class OthersRun {
-  public:
-    OthersRun() noexcept : state(PyEval_SaveThread()) {}
-    ~OthersRun() { PyEval_RestoreThread(state); }
-    OthersRun(const OthersRun &) = delete;
-    OthersRun &operator=(const OthersRun &) = delete;
-
-  private:
-    PyThreadState *state;
-};
-
 /// The arguments of a call as the host's arrays. Nearly all calls have so few that none of this
 /// needs memory of its own.
 class Inputs {
@@ -171,10 +159,15 @@ py::object valueOf(Results results, ToPython convert) {
     }
 }
 
-py::tuple tupleOf(Arguments arguments) {
-    py::tuple tuple(arguments.size());
+/// The arguments, behind what is given first, if anything is.
+py::tuple tupleOf(Arguments arguments, py::handle first = {}) {
+    const std::size_t before = first ? 1 : 0;
+    py::tuple tuple(before + arguments.size());
+    if (first) {
+        tuple[0] = first;
+    }
     for (std::size_t i = 0; i < arguments.size(); ++i) {
-        tuple[i] = py::reinterpret_borrow<py::object>(arguments[i]);
+        tuple[before + i] = py::handle(arguments[i]);
     }
     return tuple;
 }
@@ -229,9 +222,9 @@ py::object call(ModuleObject &self, const Name *name, Arguments arguments, bool 
         failure = error;
     }
     // Outside of the handler, because Python asks the module, which raises in its turn.
-    raiseInPython(PythonClasses::get().raised(py::handle(&self.ob_base), tupleOf(arguments),
-                                              toStr(failure->identifier()),
-                                              toStr(failure->message())));
+    raiseInPython(called(PythonClasses::get().raised,
+                         py::make_tuple(py::handle(&self.ob_base), tupleOf(arguments),
+                                        toStr(failure->identifier()), toStr(failure->message()))));
     throw py::error_already_set();
 }
 
@@ -244,7 +237,7 @@ PyObject *callObject(PyObject *self, PyObject *const *given, std::size_t flags, 
         const py::object instead = name != nullptr ? name->instead : insteadOf(module, arguments);
         const bool named = names != nullptr && PyTuple_GET_SIZE(names) != 0;
         if (instead && !named) {
-            return instead(py::handle(self), *tupleOf(arguments));
+            return called(instead, tupleOf(arguments, self));
         }
         return call(module, name, arguments, named, toPython);
     });
@@ -301,14 +294,24 @@ void destroy(PyObject *self) {
     Py_DECREF(type);
 }
 
+py::object nameOfFile(PyObject *self) {
+    const std::string &file = of(self).module.file().native();
+    PyObject *const name =
+        PyUnicode_DecodeFSDefaultAndSize(file.data(), static_cast<py::ssize_t>(file.size()));
+    if (name == nullptr) {
+        throw py::error_already_set();
+    }
+    return py::reinterpret_steal<py::object>(name);
+}
+
 PyObject *fileOf(PyObject *self, void * /*closure*/) {
-    return orException([&] { return py::cast(of(self).module.file()); });
+    return orException(
+        [&] { return called(PythonClasses::get().path, py::make_tuple(nameOfFile(self))); });
 }
 
 PyObject *represent(PyObject *self) {
-    return orException([&]() -> py::object {
-        return py::str("<tessel.Module {}>").format(of(self).module.file());
-    });
+    return orException(
+        [&]() -> py::object { return py::str("<tessel.Module {}>").format(nameOfFile(self)); });
 }
 
 constexpr const char *classDoc = R"(Module(module, instead={})

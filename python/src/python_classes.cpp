@@ -18,9 +18,13 @@ void PythonClasses::load() {
     const py::module_ values = py::module_::import("tessel.values");
     const py::module_ numpy = py::module_::import("numpy");
     const py::module_ errors = py::module_::import("tessel.errors");
-    classes = new PythonClasses{errors.attr("Error"),    errors.attr("raised"),
-                                values.attr("Function"), values.attr("Unknown"),
-                                numpy.attr("generic"),   numpy.attr("ma").attr("MaskedArray")};
+    classes = new PythonClasses{errors.attr("Error"),
+                                errors.attr("raised"),
+                                values.attr("Function"),
+                                values.attr("Unknown"),
+                                numpy.attr("generic"),
+                                numpy.attr("ma").attr("MaskedArray"),
+                                py::module_::import("pathlib").attr("Path")};
 }
 
 void refuse(std::string_view word, const std::string &message) {

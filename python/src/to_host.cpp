@@ -1,5 +1,6 @@
 // python/src/to_host.cpp: Python values as host arrays.
 #include "conversion.hpp"
+#include "others_run.hpp"
 #include "plain_class.hpp"
 
 #include <algorithm>
@@ -339,7 +340,7 @@ Array Nest::convert(py::handle value) {
         return fromUnknown(value);
     }
     if (py::hasattr(value, "__fspath__")) {
-        return convert(steal(PyOS_FSPath(object)));
+        return convert(steal(orStop([&] { return PyOS_FSPath(object); })));
     }
     refuse("unsupportedType",
            "A value of type \"" + typeName(value) + "\" has no counterpart in the host.");
