@@ -5,9 +5,11 @@
 #include "tessel/runtime/watcher.hpp"
 
 #include <cstdint>
+#include <map>
 #include <optional>
 #include <string>
 #include <unordered_map>
+#include <utility>
 #include <vector>
 
 namespace tessel::guard {
@@ -15,6 +17,7 @@ namespace tessel::guard {
 /// A dataset between the call that opened it and the one that ends it.
 struct Dataset {
     std::string path;
+    bool known = false;  // it was seen to be opened
     FileIdentity file;   // of those that exist when they are opened
     bool classic = true; // not based on HDF5
     bool writable = true;
@@ -37,9 +40,24 @@ struct Records {
 
 /// The process's datasets by id. Every function is called while no call of a module runs.
 class Datasets {
+    using ById = std::map<int, Dataset>;
+
   public:
-    void add(int ncid, Dataset dataset) { byId[fileOf(ncid)] = std::move(dataset); }
-    void remove(int ncid) { byId.erase(fileOf(ncid)); }
+    /// A dataset without an id yet. When it has one, there is nothing left to allocate.
+    using New = ById::node_type;
+
+    static New make(Dataset dataset) {
+        ById one;
+        one.emplace(0, std::move(dataset));
+        return one.extract(one.begin());
+    }
+
+    void add(int ncid, New dataset) noexcept {
+        remove(ncid);
+        dataset.key() = fileOf(ncid);
+        byId.insert(std::move(dataset));
+    }
+    void remove(int ncid) noexcept { byId.erase(fileOf(ncid)); }
 
     /// nullptr for a dataset that nobody was seen to open.
     Dataset *find(int ncid) {
@@ -59,7 +77,7 @@ class Datasets {
         return static_cast<int>(static_cast<unsigned>(ncid) >> 16U);
     }
 
-    std::unordered_map<int, Dataset> byId;
+    ById byId;
 };
 
 /// The records of the dataset, if the variable has any.

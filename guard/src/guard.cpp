@@ -16,6 +16,7 @@
 #include <cstddef>
 #include <filesystem>
 #include <iterator>
+#include <optional>
 #include <string_view>
 #include <system_error>
 
@@ -113,38 +114,46 @@ bool opensForWriting(const tsArray *mode) {
 /// Synchronising a dataset that is open for reading makes the library read its header again, from
 /// the file that it opened; its name may lead to another one by now.
 void lookAtOpenHeader(const FileIdentity &opened) {
-    for (const std::string &file : namesOfOpen(opened)) {
-        if (const Header found = headerOf(file); found.claim) {
+    for (const int descriptor : descriptorsOf(opened)) {
+        if (const Header found = headerOf(descriptor); found.claim) {
+            const std::string link = "/proc/self/fd/" + std::to_string(descriptor);
             std::error_code ignored;
             refuse(header, "the header of " +
-                               inQuotes(std::filesystem::read_symlink(file, ignored).string()) +
+                               inQuotes(std::filesystem::read_symlink(link, ignored).string()) +
                                " " + *found.claim);
         }
     }
 }
 
-/// Closing in data mode synchronises first. When that fails the library has freed the dataset's
-/// memory, and not its id; and what it writes then may fail unnoticed. A synchronisation by itself
-/// that fails leaves all as it is, so that closing can be repeated; its error is that of closing.
-void synchronise(int ncid, const Ask &ask) {
-    try {
-        ask("sync", ncid);
-    } catch (const Error &error) {
-        std::string identifier = error.identifier();
-        std::string message = error.message();
-        const auto replace = [](std::string &text, std::string_view what, std::string_view by) {
-            const std::size_t at = text.find(what);
-            if (at != std::string::npos) {
-                text.replace(at, what.size(), by);
+/// Closing leaves define mode and synchronises first. When the library does so by itself, as a part
+/// of closing, and cannot, it has freed the dataset's memory and not its id, or has lost what was
+/// in its buffer and says nothing. By itself either leaves all as it is when it fails, so that
+/// closing can be repeated. Its error becomes that of closing.
+void settle(int ncid, Dataset &dataset, const Ask &ask) {
+    const auto step = [&](const char *operation) {
+        try {
+            ask(operation, ncid);
+        } catch (const Error &error) {
+            const std::string_view identifier = error.identifier();
+            const std::string_view message = error.message();
+            const std::string_view word = identifier.substr(identifier.rfind(':') + 1);
+            if (!identifier.starts_with("TESSEL:netcdf:")) {
+                throw;
             }
-        };
-        if (identifier.ends_with(":operationNotAllowedInDefineMode")) {
-            return; // the module was called without its guard meanwhile
+            // Nothing to do: the module was called without its guard meanwhile.
+            if (word.starts_with("operationNotAllowedIn") || word == "notNetcdfID") {
+                return;
+            }
+            const std::size_t detail = std::min(message.find(", "), message.size());
+            throw Error(std::string("TESSEL:netcdf:close:").append(word),
+                        std::string("Unable to close netCDF file").append(message.substr(detail)));
         }
-        replace(identifier, ":sync:", ":close:");
-        replace(message, "sync", "close");
-        throw Error(identifier, message);
+    };
+    if (dataset.defining) {
+        step("enddef");
+        dataset.defining = false;
     }
+    step("sync");
 }
 
 /// Whether so much memory can be mapped.
@@ -286,6 +295,7 @@ class Guard : public Watcher {
     void before(Inputs inputs, const Ask &ask) override {
         kind = kindOf(inputs);
         recordsEnd = 0;
+        opening = {};
         if (datasets().anyDead) {
             lookForDead(inputs);
         }
@@ -296,12 +306,7 @@ class Guard : public Watcher {
 
     void after(Inputs inputs, const Results &results, const Error *error) noexcept override {
         if (kind != Kind::other) {
-            try {
-                remember(inputs, results, error);
-            } catch (const std::exception &) {
-                // There is no memory. A dataset that is not known is guarded with more inquiries,
-                // and is taken for dead when its end fails.
-            }
+            remember(inputs, results, error);
         }
     }
 
@@ -327,17 +332,23 @@ class Guard : public Watcher {
                 return;
             }
             lookAtName(*name, options);
-            path = withoutBlanks(*std::move(name));
-            writable = kind == Kind::create || opensForWriting(inputs[2]);
+            const bool creates = kind == Kind::create;
+            Dataset dataset;
+            dataset.path = withoutBlanks(*std::move(name));
+            dataset.known = true;
+            dataset.defining = creates;
+            dataset.writable = creates || opensForWriting(inputs[2]);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
-            opened = {};
-            if (kind == Kind::open) {
-                opened = lookAtOpening(path, flags);
-            } else {
-                opened.classic =
+            if (creates) {
+                dataset.classic =
                     lookAtCreation(flags, inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0);
+            } else {
+                const Header found = lookAtOpening(dataset.path, flags);
+                dataset.file = found.file;
+                dataset.classic = found.classic;
             }
+            opening = Datasets::make(std::move(dataset));
             return;
         }
         const auto ncid = integer(inputs[1]);
@@ -348,9 +359,12 @@ class Guard : public Watcher {
         if (kind == Kind::sync && dataset != nullptr && dataset->classic && !dataset->writable) {
             lookAtOpenHeader(dataset->file);
         }
-        if (kind == Kind::close && dataset != nullptr && dataset->writable &&
-            survivesItsEnd(*dataset)) {
-            synchronise(*ncid, ask);
+        if (kind == Kind::close && dataset != nullptr && dataset->classic && dataset->writable) {
+            settle(*ncid, *dataset, ask);
+        }
+        if (isEnd() && dataset == nullptr) {
+            datasets().add(
+                *ncid, Datasets::make({})); // so that there is memory to note that its end failed
         }
         try {
             if (kind == Kind::tunedEndDefinition) {
@@ -362,17 +376,19 @@ class Guard : public Watcher {
                 }
             }
         } catch (const Error &error) {
-            if (std::string_view(error.identifier()).starts_with("TESSEL:guard:")) {
+            if (!std::string_view(error.identifier()).starts_with("TESSEL:netcdf:")) {
                 throw;
             }
             // There is no such dataset or variable, which the module says itself.
         }
     }
 
-    void remember(Inputs inputs, const Results &results, const Error *error) {
+    /// Allocates nothing: what it notes must not be lost.
+    void remember(Inputs inputs, const Results &results, const Error *error) noexcept {
         if (kind == Kind::open || kind == Kind::create) {
-            if (error == nullptr) {
-                rememberOpened(results);
+            if (error == nullptr && !opening.empty()) {
+                const auto ncid = static_cast<int>(results[results.size() - 1].number());
+                datasets().add(ncid, std::move(opening));
             }
             return;
         }
@@ -387,38 +403,21 @@ class Guard : public Watcher {
             return;
         }
         Dataset *const dataset = datasets().find(*first);
-        if (kind == Kind::close || kind == Kind::abort) {
-            rememberEnd(*first, dataset, error);
+        if (isEnd() && dataset != nullptr) {
+            rememberEnd(*first, *dataset, error);
         } else if (error == nullptr && dataset != nullptr) {
             rememberChange(inputs, *dataset);
         }
     }
 
-    void rememberOpened(const Results &results) {
-        Dataset dataset;
-        dataset.path = std::move(path);
-        dataset.defining = kind == Kind::create;
-        dataset.file = opened.file;
-        dataset.classic = opened.classic;
-        dataset.writable = writable;
-        datasets().add(static_cast<int>(results[results.size() - 1].number()), std::move(dataset));
-    }
-
-    /// In data mode, a classic dataset whose end failed (the disk is full) is as it was, and can be
-    /// ended again.
-    static bool survivesItsEnd(const Dataset &dataset) noexcept {
-        return dataset.classic && !dataset.defining;
-    }
-
-    static void rememberEnd(int ncid, const Dataset *dataset, const Error *error) {
+    /// A dataset whose end failed may be used when it is as it was: a classic one that was settled
+    /// before it was closed. An abort ends one in any case.
+    static void rememberEnd(int ncid, Dataset &dataset, const Error *error) noexcept {
         if (error == nullptr || error->identifier().ends_with(":notNetcdfID")) {
             datasets().remove(ncid);
-        } else if (error->identifier().starts_with("TESSEL:netcdf:") &&
-                   (dataset == nullptr || !survivesItsEnd(*dataset))) {
-            Dataset dead = dataset == nullptr ? Dataset{} : *dataset;
-            dead.dead = true;
+        } else if (!dataset.known || !dataset.classic || dataset.defining) {
+            dataset.dead = true;
             datasets().anyDead = true;
-            datasets().add(ncid, std::move(dead));
         }
     }
 
@@ -435,15 +434,15 @@ class Guard : public Watcher {
         }
     }
 
+    [[nodiscard]] bool isEnd() const noexcept { return kind == Kind::close || kind == Kind::abort; }
+
     [[nodiscard]] bool isWrite() const noexcept {
         return kind == Kind::writeElement || kind == Kind::writeBlock || kind == Kind::writeStrided;
     }
 
     GuardOptions options;
-    Kind kind = Kind::other; // of the call in progress
-    std::string path;        // of what it opens
-    Header opened;           // what that is like
-    bool writable = true;
+    Kind kind = Kind::other;      // of the call in progress
+    Datasets::New opening;        // what it opens
     std::uint64_t recordsEnd = 0; // where it ends, if it writes records
 };
 

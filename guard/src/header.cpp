@@ -43,18 +43,11 @@ struct Distrusted {
 /// closing are all that it costs, because the size of the file is only asked for behind that.
 class Reader {
   public:
-    explicit Reader(const std::string &path) : file(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+    explicit Reader(int descriptor) : file(descriptor) {
         if (file >= 0) {
             fill();
         }
     }
-    ~Reader() {
-        if (file >= 0) {
-            ::close(file);
-        }
-    }
-    Reader(const Reader &) = delete;
-    Reader &operator=(const Reader &) = delete;
 
     [[nodiscard]] FileIdentity identity() const noexcept {
         struct stat status {};
@@ -124,7 +117,7 @@ class Reader {
 /// Walks through a header and looks at its claims.
 class Walk {
   public:
-    explicit Walk(const std::string &path) : reader(path) {}
+    explicit Walk(int file) : reader(file) {}
 
     void go(Header &found) {
         found.file = reader.identity();
@@ -221,9 +214,22 @@ struct CloseFolder {
 } // namespace
 
 Header headerOf(const std::string &path) {
+    struct File {
+        int descriptor;
+        ~File() {
+            if (descriptor >= 0) {
+                ::close(descriptor);
+            }
+        }
+    };
+    const File file{::open(path.c_str(), O_RDONLY | O_CLOEXEC)};
+    return headerOf(file.descriptor);
+}
+
+Header headerOf(int file) {
     Header found;
     try {
-        Walk(path).go(found);
+        Walk(file).go(found);
     } catch (const Ended &) {
         return found;
     } catch (const Distrusted &distrusted) {
@@ -232,22 +238,32 @@ Header headerOf(const std::string &path) {
     return found;
 }
 
-std::vector<std::string> namesOfOpen(const FileIdentity &file) {
-    const std::string folder = "/proc/self/fd/";
-    std::vector<std::string> names;
-    const std::unique_ptr<DIR, CloseFolder> entries(opendir(folder.c_str()));
-    while (const dirent *entry = entries == nullptr ? nullptr : readdir(entries.get())) {
+std::vector<int> descriptorsOf(const FileIdentity &file) {
+    std::vector<int> found;
+    const auto look = [&](int descriptor) {
+        struct stat status {};
+        if (fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode) &&
+            file == FileIdentity{status.st_dev, status.st_ino} &&
+            (fcntl(descriptor, F_GETFL) & O_ACCMODE) == O_RDONLY) {
+            found.push_back(descriptor);
+        }
+    };
+    const std::unique_ptr<DIR, CloseFolder> entries(opendir("/proc/self/fd"));
+    if (!entries) { // as when no descriptor is left for it: any may be open
+        for (int descriptor = 0; descriptor < getdtablesize(); ++descriptor) {
+            look(descriptor);
+        }
+        return found;
+    }
+    while (const dirent *entry = readdir(entries.get())) {
         const std::string_view name = entry->d_name;
         int descriptor = -1;
         std::from_chars(name.data(), name.data() + name.size(), descriptor);
-        struct stat status {};
-        if (descriptor >= 0 && fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode) &&
-            file == FileIdentity{status.st_dev, status.st_ino} &&
-            (fcntl(descriptor, F_GETFL) & O_ACCMODE) == O_RDONLY) {
-            names.push_back(std::string(folder).append(name));
+        if (descriptor >= 0) {
+            look(descriptor);
         }
     }
-    return names;
+    return found;
 }
 
 } // namespace tessel::guard

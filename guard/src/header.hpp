@@ -32,8 +32,11 @@ struct Header {
 /// that the library's documentation tells programs to use).
 Header headerOf(const std::string &path);
 
-/// The descriptors that the process has of this file for reading only, by names that lead to the
-/// file whatever became of its own. Other files of the process are none of a dataset's business.
-std::vector<std::string> namesOfOpen(const FileIdentity &file);
+/// The header of a file that is open.
+Header headerOf(int descriptor);
+
+/// The descriptors that the process has of this file for reading only, whatever became of its name.
+/// Other files of the process are none of a dataset's business.
+std::vector<int> descriptorsOf(const FileIdentity &file);
 
 } // namespace tessel::guard

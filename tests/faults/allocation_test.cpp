@@ -1,9 +1,10 @@
 // tests/faults/allocation_test.cpp: every row of the conformance tests with each `operator new` of
 // its call failing in turn: the ones of the module, of the host and of the guard.
 //
-// The operators are replaced in this program, and count and fail within calls only. (That the
+// The operators are those of failing_new.cpp, and count and fail within calls only. (That the
 // host's blocks and arrays fail in turn is part of the conformance tests themselves.)
 #include "support/conformance.hpp"
+#include "support/failing_new.hpp"
 #include "support/operations.hpp"
 #include "support/text.hpp"
 #include "tessel/netcdf_guard.hpp"
@@ -14,60 +15,10 @@
 #include <cctype>
 #include <cstdlib>
 #include <map>
-#include <new>
 #include <set>
-
-namespace {
-
-/// What `operator new` does on this thread.
-struct Allocations {
-    bool counting = false;
-    std::size_t made = 0;    ///< since counting began
-    std::size_t failing = 0; ///< the one that fails; 0: none
-    long alive = 0;          ///< made, and not given back, counting or not
-};
-constinit thread_local Allocations allocations;
-
-} // namespace
-
-void *operator new(std::size_t bytes) {
-    if (allocations.counting && ++allocations.made == allocations.failing) {
-        throw std::bad_alloc();
-    }
-    void *const memory = std::malloc(std::max<std::size_t>(bytes, 1));
-    if (memory == nullptr) {
-        throw std::bad_alloc();
-    }
-    ++allocations.alive;
-    return memory;
-}
-
-void operator delete(void *memory) noexcept {
-    if (memory != nullptr) {
-        --allocations.alive;
-        std::free(memory);
-    }
-}
-
-void operator delete(void *memory, std::size_t /*bytes*/) noexcept {
-    operator delete(memory);
-}
 
 namespace tessel::test {
 namespace {
-
-/// Counts the allocations within its life, and fails the n-th.
-class Failing {
-  public:
-    explicit Failing(std::size_t n) {
-        allocations.made = 0;
-        allocations.failing = n;
-        allocations.counting = true;
-    }
-    ~Failing() { allocations.counting = false; }
-    Failing(const Failing &) = delete;
-    Failing &operator=(const Failing &) = delete;
-};
 
 /// The datasets that are open: the library numbers them from 1 on, in the upper half of an int.
 std::vector<int> openDatasets() {
@@ -108,15 +59,15 @@ Seen run(const Module &module, const Row &row, std::size_t n) {
     Seen seen;
     std::string identifier = "results";
     identifier.reserve(200);
-    const long alive = allocations.alive;
+    const long alive = allocationsAlive();
     try {
         const Failing failing(n);
         const Results results = module.call(inputs);
     } catch (const Error &error) {
         identifier = error.identifier();
     }
-    seen.left = allocations.alive - alive;
-    seen.failed = n > 0 && allocations.made >= n;
+    seen.left = allocationsAlive() - alive;
+    seen.failed = Failing::met();
     seen.outcome = identifier;
     EXPECT_EQ(module("inq_libvers").size(), 1U) << "the next call does not work";
     std::vector<int> opened;

@@ -145,7 +145,8 @@ bool opensFile(std::string_view operation) {
 }
 
 /// Whether a step keeps a file in memory. There is no full disk, and the library fills variables
-/// there a block at a time, each of which moves all that is there: minutes for some MiB.
+/// there a block at a time, each of which moves all that is there: minutes for some MiB. Where it
+/// maps the memory, it does not look whether there is more.
 bool keepsInMemory(const Step &step) {
     constexpr unsigned flags = 0x8 | 0x10 | 0x8000;
     return opensFile(lowered(step.operation)) && step.inputs.size() > 1 &&
@@ -153,15 +154,24 @@ bool keepsInMemory(const Step &step) {
            (static_cast<unsigned>(nearest<std::int32_t>(step.inputs[1].elements[0])) & flags) != 0;
 }
 
-/// Whether a call may define what has more than some thousand values.
-bool definesMuch(std::string_view operation, const std::vector<Array> &inputs) {
+bool isAbove(const Array &size, double most) {
+    return size.size() > 0 && (size.classID() != tsDOUBLE || size.number() > most);
+}
+
+/// Whether a call may make a file longer than some thousand values.
+bool needsMuch(std::string_view operation, const std::vector<Array> &inputs) {
     constexpr std::size_t mostDimensions = 4;
     constexpr double mostLength = 8;
+    constexpr double mostRoom = 4096;
     if (operation.ends_with("def_var")) {
         return inputs.size() > 4 && inputs[4].size() > mostDimensions;
     }
-    return operation.ends_with("def_dim") && inputs.size() > 3 && inputs[3].size() > 0 &&
-           (inputs[3].classID() != tsDOUBLE || inputs[3].number() > mostLength);
+    if (operation.ends_with("_enddef")) {
+        return inputs.size() > 2 && // behind the dataset
+               std::any_of(inputs.begin() + 2, inputs.end(),
+                           [](const Array &size) { return isAbove(size, mostRoom); });
+    }
+    return operation.ends_with("def_dim") && inputs.size() > 3 && isAbove(inputs[3], mostLength);
 }
 
 /// One run: what it opened, so that calls can name it, and that all of it is ended.
@@ -183,7 +193,7 @@ class Session {
         if (opens && held.size() > 1) {
             keepInFolder(held[1]);
         }
-        if (asksForHdf5(name, held) || (inMemory && definesMuch(name, held))) {
+        if (asksForHdf5(name, held) || (inMemory && needsMuch(name, held))) {
             return "left out";
         }
         std::vector<const tsArray *> inputs(held.size());
@@ -203,12 +213,11 @@ class Session {
     }
 
     /// Ends all datasets, the ones that the disk is too full for once there is room again. What is
-    /// left are the files of those that a failed end has ended half, which the library forgets.
+    /// left are the files of those that a failed abort has ended half, which the library forgets.
     Scratch::Left end() {
         for (const int ncid : opened) {
             std::string identifier = called(netcdf, "abort", ncid).identifier;
             if (isGone(identifier)) {
-                left = identifier == ended ? Scratch::Left::files : left;
                 continue;
             }
             note("end" + identifier);
@@ -229,10 +238,8 @@ class Session {
     }
 
   private:
-    static constexpr std::string_view ended = "TESSEL:guard:closed";
-
     static bool isGone(std::string_view identifier) {
-        return identifier.empty() || identifier.ends_with(":notNetcdfID") || identifier == ended;
+        return identifier.empty() || identifier.ends_with(":notNetcdfID");
     }
 
     /// An abort in data mode forgets the dataset and not its file, when there is no room for the

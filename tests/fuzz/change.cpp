@@ -335,7 +335,8 @@ void change(Sequence &sequence, Chance &chance) {
     const auto anywhere = [&](std::size_t more = 0) {
         return sequence.begin() + placeIn(sequence, chance, more);
     };
-    const bool full = sequence.size() >= mostSteps;
+    constexpr std::size_t mostMade = 10; // several short ones find more than a long one
+    const bool full = sequence.size() >= mostMade;
     if (sequence.empty() || (chance.percent(30) && !full)) {
         Step made = author.step();
         sequence.insert(anywhere(1), std::move(made));

@@ -42,7 +42,7 @@ struct Step {
 using Sequence = std::vector<Step>;
 
 // How large a sequence and its parts may be, so that an execution stays short.
-constexpr std::size_t mostSteps = 16;
+constexpr std::size_t mostSteps = 24;
 constexpr std::size_t mostInputs = 10;
 constexpr std::size_t mostDims = 5;
 constexpr std::size_t mostElements = 300; // more than a name may have

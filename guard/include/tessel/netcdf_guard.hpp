@@ -7,13 +7,16 @@
 //
 //   TESSEL:guard:alignment   a tuned enddef with an alignment of 0, which divides by zero
 //   TESSEL:guard:mode        a mode flag that makes create or open follow an invalid pointer
-//   TESSEL:guard:closed      anything with a dataset whose closing failed in define mode, or that
-//                            is based on HDF5: its memory is freed
+//   TESSEL:guard:closed      anything with a dataset that is based on HDF5, or was opened without
+//                            the guard, and whose closing failed: its memory may be freed
 //   TESSEL:guard:counts      a write of counts that multiply to more than 64 bits hold
 //   TESSEL:guard:records     a write that would first fill more than GuardOptions::fillLimit
 //   TESSEL:guard:header      a file whose header claims what it cannot hold, or what would overflow
 //                            the buffers of programs that follow the library's limits
 //   TESSEL:guard:remote      a file name that is an address, unless GuardOptions::remote
+//
+// It closes in steps: definitions are ended and the dataset is synchronised before the library
+// closes it. When one of them fails, "close" raises why, and the dataset is open and whole.
 //
 // What it knows of open datasets it has from the calls that it saw. Dataset ids belong to the
 // process, and so does this knowledge: all guards share it.

@@ -1,0 +1,195 @@
+// tests/guard/fatal_calls.cpp: calls that the library does not survive, a row each.
+#include "fatal_calls.hpp"
+
+#include <csignal>
+
+namespace tessel::test {
+namespace {
+
+using namespace std::string_literals;
+
+constexpr double wraps = -1; // as a count: 2^64-1
+
+/// A call that must raise this error. Another one goes on.
+template <class Call>
+void wantError(std::string_view identifier, const Call &call) {
+    try {
+        call();
+        ADD_FAILURE() << "the call succeeds, and should raise " << identifier;
+    } catch (const Error &error) {
+        if (error.identifier() != identifier) {
+            throw;
+        }
+    }
+}
+
+/// A variable of another variable's length whose fill value has two values instead of one: the
+/// dataset cannot leave define mode, and not be closed.
+int unclosable(const Module &netcdf, const Folder &folder) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int x = intOf(netcdf("def_dim", ncid, "x", 3));
+    netcdf("def_var", ncid, "v", ncInt, x);
+    netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
+    wantError("TESSEL:netcdf:close:invalidDataType", [&] { netcdf("close", ncid); });
+    return ncid;
+}
+
+void writeStrided(const Module &netcdf, const Folder &folder, const char *operation, int varid,
+                  const Array &start, const Array &count, const Array &stride) {
+    const int ncid = newDataset(netcdf, folder.file("a.nc"));
+    netcdf("set_fill", ncid, noFill);
+    const Array one = Array::scalar(1);
+    if (stride) {
+        netcdf(operation, ncid, varid, start, count, stride, one);
+    } else {
+        netcdf(operation, ncid, varid, start, count, one);
+    }
+}
+
+int open(const Module &netcdf, const Folder &folder, const std::string &bytes) {
+    return intOf(netcdf("open", written(folder, "a.nc", bytes), "NOWRITE"));
+}
+
+std::string variableOfType(std::uint32_t type) {
+    return "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) + "v\0\0\0"s +
+           words({1, 0, 0, 0, type, 4, 100}) + std::string(16, '\0');
+}
+
+/// In define mode, with a variable.
+int definingDataset(const Module &netcdf, const Folder &folder) {
+    const int ncid = newDataset(netcdf, folder.file("a.nc"));
+    netcdf("redef", ncid);
+    return ncid;
+}
+
+const Fatal rows[] = {
+    {"AlignmentOfTheData", SIGFPE, "TESSEL:guard:alignment",
+     "an alignment is 0, and the library divides",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_enddef", definingDataset(netcdf, folder), 0, 0, 0, 4);
+     }},
+    {"AlignmentOfTheRecords", SIGFPE, "TESSEL:guard:alignment", "an alignment is 0",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("nc__enddef", definingDataset(netcdf, folder), 0, 4, 0, 0.5);
+     }},
+    {"CreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode",
+     "the flag 64 (a user-defined format) is set",
+     [](const Module &netcdf, const Folder &folder) { netcdf("create", folder.file("a.nc"), 64); }},
+    {"CreateWithTheOtherUserFormat", SIGSEGV, "TESSEL:guard:mode", "the flag 128",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("NC_CREATE", folder.file("a.nc"), 128 + 1);
+     }},
+    {"TunedCreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode", "the flag 64",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_create", folder.file("a.nc"), 64, 1024, 1024);
+     }},
+    {"OpenInMemory", SIGSEGV, "TESSEL:guard:mode", "the flag 32768 (NC_INMEMORY) is set",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("open", folder.file("a.nc"), 32768);
+     }},
+    {"TunedOpenInMemory", SIGSEGV, "TESSEL:guard:mode", "the flag 32768",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("nc__open", folder.file("a.nc"), 32768 + 1, 1024);
+     }},
+    {"CreateInMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mode",
+     "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
+     }},
+    {"OpenOfATypeWithoutSize", SIGFPE, "TESSEL:guard:header", "has a variable of the type 12",
+     [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); }},
+    {"NameOf300Letters", SIGSEGV, "TESSEL:guard:header", "has a name of 300 characters",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("inq_dim",
+                open(netcdf, folder,
+                     "CDF\1" + words({0, 10, 1, 300}) + std::string(300, 'n') +
+                         words({1, 0, 0, 0, 0})),
+                0);
+     }},
+    {"VariableOfTooManyDimensions", SIGSEGV, "TESSEL:guard:header", "a variable of 3000 dimensions",
+     [](const Module &netcdf, const Folder &folder) {
+         // A few too many may go unnoticed.
+         std::string ids;
+         for (int i = 0; i < 3000; ++i) {
+             ids += words({0});
+         }
+         netcdf("inq_var",
+                open(netcdf, folder,
+                     "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({1, 0, 0, 11, 1, 1}) +
+                         "v\0\0\0"s + words({3000}) + ids + words({0, 0, 4, 4, 20000}) +
+                         std::string(16, '\0')),
+                0);
+     }},
+    {"NameWhoseLengthTheFileEndsIn", SIGSEGV, "TESSEL:guard:header", "characters in a name",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),
+                0);
+     }},
+    {"CloseAfterACloseThatFailed", SIGSEGV, "TESSEL:netcdf:close:invalidDataType",
+     "Unable to close netCDF file, library error message \"NetCDF: Not a valid data type",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", unclosable(netcdf, folder));
+     }},
+    {"AbortAfterACloseThatFailed", SIGSEGV, "", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("abort", unclosable(netcdf, folder));
+     }},
+    {"CloseAgainAfterAChangeOnAFullDisk", SIGSEGV, "TESSEL:netcdf:close:fileTooLarge",
+     "Unable to close netCDF file, library error message \"File too large\"",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+         const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
+         netcdf("def_var", ncid, "v", ncDouble, x);
+         netcdf("set_fill", ncid, noFill);
+         netcdf("enddef", ncid);
+         netcdf("rename_var", ncid, 0, "w");
+         netcdf("put_var1_double", ncid, 0, 19999, 1);
+         const FullDisk full;
+         wantError("TESSEL:netcdf:close:fileTooLarge", [&] { netcdf("close", ncid); });
+         netcdf("close", ncid);
+     }},
+    {"SynchronisingAHeaderThatWasOverwritten", SIGFPE, "TESSEL:guard:header",
+     "has a variable of the type 12",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = open(netcdf, folder, variableOfType(4));
+         written(folder, "a.nc", variableOfType(12));
+         netcdf("sync", ncid);
+     }},
+    {"CountsThatWrapInRecords", SIGALRM, "TESSEL:guard:counts",
+     "multiply to more than 64 bits hold",
+     [](const Module &netcdf, const Folder &folder) {
+         writeStrided(netcdf, folder, "put_vars_double", 1, Array::row({1, 0}),
+                      Array::row({wraps, wraps}), Array::row({2, 1}));
+     }},
+    {"CountsThatWrapInABlock", SIGXFSZ, "TESSEL:guard:counts", "or for ever",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vara_double", ncid, 1, Array::row({0, 0}), Array::row({2, 0x1p63 + 2048}),
+                Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{2, 2048}));
+     }},
+    {"AnElementFarBeyondTheRecords", SIGXFSZ, "TESSEL:guard:records",
+     "ends at record 4000000000, and 4000000000 records of 80 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
+     }},
+    {"ABlockFarBeyondTheRecords", SIGXFSZ, "TESSEL:guard:records", "NC_NOFILL",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vara_double", ncid, 1, Array::row({0, 4e9}), Array::row({1, 1}), 1);
+     }},
+    {"AStepFarBeyondTheRecords", SIGXFSZ, "TESSEL:guard:records", "ends at record 2000000000",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("put_vars_double", ncid, 1, Array::row({0, 0}), Array::row({1, 2}),
+                Array::row({1, 2e9}), Array::row({1, 2}));
+     }},
+};
+
+} // namespace
+
+std::span<const Fatal> fatalCalls() {
+    return rows;
+}
+
+} // namespace tessel::test
