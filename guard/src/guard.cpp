@@ -146,7 +146,7 @@ void settle(int ncid, Dataset &dataset, const Ask &ask) {
             }
             const std::size_t detail = std::min(message.find(", "), message.size());
             throw Error(std::string("TESSEL:netcdf:close:").append(word),
-                        std::string("Unable to close netCDF file").append(message.substr(detail)));
+                        std::string("Close operation failed").append(message.substr(detail)));
         }
     };
     if (dataset.defining) {
@@ -413,11 +413,13 @@ class Guard : public Watcher {
     /// A dataset whose end failed may be used when it is as it was: a classic one that was settled
     /// before it was closed. An abort ends one in any case.
     static void rememberEnd(int ncid, Dataset &dataset, const Error *error) noexcept {
-        if (error == nullptr || error->identifier().ends_with(":notNetcdfID")) {
-            datasets().remove(ncid);
-        } else if (!dataset.known || !dataset.classic || dataset.defining) {
+        const bool gone = error == nullptr || error->identifier().ends_with(":notNetcdfID");
+        const bool reached = !gone && error->identifier().starts_with("TESSEL:netcdf:");
+        if (reached && (!dataset.known || !dataset.classic || dataset.defining)) {
             dataset.dead = true;
             datasets().anyDead = true;
+        } else if (gone || !dataset.known) {
+            datasets().remove(ncid);
         }
     }
 

@@ -126,7 +126,7 @@ const Fatal rows[] = {
                 0);
      }},
     {"CloseAfterACloseThatFailed", SIGSEGV, "TESSEL:netcdf:close:invalidDataType",
-     "Unable to close netCDF file, library error message \"NetCDF: Not a valid data type",
+     "Close operation failed, library error message \"NetCDF: Not a valid data type",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", unclosable(netcdf, folder));
      }},
@@ -135,7 +135,7 @@ const Fatal rows[] = {
          netcdf("abort", unclosable(netcdf, folder));
      }},
     {"CloseAgainAfterAChangeOnAFullDisk", SIGSEGV, "TESSEL:netcdf:close:fileTooLarge",
-     "Unable to close netCDF file, library error message \"File too large\"",
+     "Close operation failed, library error message \"File too large\"",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
          const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
