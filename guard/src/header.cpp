@@ -207,6 +207,21 @@ class Walk {
     std::size_t offsetSize = 4;
 };
 
+/// A file that is open for reading, if it can be.
+struct File {
+    explicit File(const std::string &path)
+        : descriptor(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {}
+    ~File() {
+        if (descriptor >= 0) {
+            ::close(descriptor);
+        }
+    }
+    File(const File &) = delete;
+    File &operator=(const File &) = delete;
+
+    int descriptor;
+};
+
 struct CloseFolder {
     void operator()(DIR *folder) const noexcept { closedir(folder); }
 };
@@ -214,22 +229,14 @@ struct CloseFolder {
 } // namespace
 
 Header headerOf(const std::string &path) {
-    struct File {
-        int descriptor;
-        ~File() {
-            if (descriptor >= 0) {
-                ::close(descriptor);
-            }
-        }
-    };
-    const File file{::open(path.c_str(), O_RDONLY | O_CLOEXEC)};
+    const File file(path);
     return headerOf(file.descriptor);
 }
 
-Header headerOf(int file) {
+Header headerOf(int descriptor) {
     Header found;
     try {
-        Walk(file).go(found);
+        Walk(descriptor).go(found);
     } catch (const Ended &) {
         return found;
     } catch (const Distrusted &distrusted) {

@@ -343,7 +343,7 @@ _GUARD = {
         "The mode has a flag that makes the library follow an invalid pointer.",
         "Leave the flags for files in memory and for user-defined formats out."),
     "closed": (
-        "An earlier closing of the dataset failed; the library has freed it, but not its id.",
+        "An earlier closing of the dataset failed; the library may have freed it, but not its id.",
         "Do not use the id again; open the file anew."),
     "counts": (
         "The counts multiply to more than 64 bits hold.", "Look at where the counts come from."),

@@ -73,6 +73,15 @@ void redefine(const std::string &file) {
     netcdf()("enddef", ncid);
 }
 
+/// Closed while it is being defined: the guard ends the definitions first.
+void redefineAndCloseGuarded(const std::string &file) {
+    const Module guarded = netcdf().watchedBy(netcdfGuard());
+    const int ncid = idOf(guarded("open", file, "WRITE"));
+    guarded("redef", ncid);
+    guarded("put_att_text", ncid, -1, "title", std::string(2000, 't'));
+    guarded("close", ncid);
+}
+
 enum class Silent { none, last, all };
 
 struct Row {
@@ -127,6 +136,7 @@ const Row rows[] = {
     {"RoomySeek",     redefine,       SystemCall::seek,  {"open", "endDef"}, Silent::none, true, 4000},
     {"RoomyRead",     redefine,       SystemCall::read,  {"open"}, Silent::none, true, 4000},
     {"RoomyWrite",    redefine,       SystemCall::write, {"endDef"}, Silent::none, true, 4000},
+    {"RoomyGuarded",  redefineAndCloseGuarded, SystemCall::write, {"close"}, Silent::none, true, 4000},
 };
 // clang-format on
 
