@@ -56,11 +56,16 @@ class Names {
     std::unordered_map<PyObject *, Name> names;
 };
 
-/// What an instance of the class is.
-struct ModuleObject {
-    PyObject ob_base;
+/// What Python itself looks for in an instance, at the offsets that `members` tell it.
+struct Head {
+    PyObject object;
     PyObject *weakReferences;
     vectorcallfunc vectorcall;
+};
+
+/// What an instance of the class is.
+struct ModuleObject {
+    Head head;
     Module module;
     py::object instead; ///< a dict: functions of Python's by the names that they take the calls of
     Names names;
@@ -223,7 +228,7 @@ py::object call(ModuleObject &self, const Name *name, Arguments arguments, bool 
     }
     // Outside of the handler, because Python asks the module, which raises in its turn.
     raiseInPython(called(PythonClasses::get().raised,
-                         py::make_tuple(py::handle(&self.ob_base), tupleOf(arguments),
+                         py::make_tuple(py::handle(&self.head.object), tupleOf(arguments),
                                         toStr(failure->identifier()), toStr(failure->message()))));
     throw py::error_already_set();
 }
@@ -261,7 +266,7 @@ py::object make(PyTypeObject *type, Module module, py::object instead) {
         throw py::error_already_set();
     }
     ModuleObject &made = of(self);
-    made.vectorcall = callObject;
+    made.head.vectorcall = callObject;
     std::construct_at(&made.module, std::move(module));
     std::construct_at(&made.instead, std::move(instead));
     std::construct_at(&made.names);
@@ -284,7 +289,7 @@ PyObject *makeNew(PyTypeObject *type, PyObject *arguments, PyObject *named) {
 void destroy(PyObject *self) {
     PyTypeObject *const type = Py_TYPE(self);
     ModuleObject &module = of(self);
-    if (module.weakReferences != nullptr) {
+    if (module.head.weakReferences != nullptr) {
         PyObject_ClearWeakRefs(self);
     }
     std::destroy_at(&module.names);
@@ -348,8 +353,8 @@ std::array<PyGetSetDef, 2> properties = {
     {{"file", fileOf, nullptr, "The file that it was loaded from.", nullptr}, {}}};
 
 std::array<PyMemberDef, 3> members = {
-    {{"__vectorcalloffset__", T_PYSSIZET, offsetof(ModuleObject, vectorcall), READONLY, nullptr},
-     {"__weaklistoffset__", T_PYSSIZET, offsetof(ModuleObject, weakReferences), READONLY, nullptr},
+    {{"__vectorcalloffset__", T_PYSSIZET, offsetof(Head, vectorcall), READONLY, nullptr},
+     {"__weaklistoffset__", T_PYSSIZET, offsetof(Head, weakReferences), READONLY, nullptr},
      {}}};
 
 std::array<PyMethodDef, 3> functions = {

@@ -6,6 +6,7 @@
 #include "text.hpp"
 
 #include <algorithm>
+#include <cstdint>
 
 namespace tessel {
 namespace {

@@ -4,6 +4,7 @@
 #include "host_errors.hpp"
 
 #include <algorithm>
+#include <cstdint>
 #include <cstring>
 #include <utility>
 

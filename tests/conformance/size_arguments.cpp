@@ -6,6 +6,7 @@
 #include "support/conformance.hpp"
 
 #include <cmath>
+#include <cstdint>
 #include <limits>
 
 namespace tessel::test {

@@ -4,6 +4,7 @@
 #include "text.hpp"
 
 #include <algorithm>
+#include <cstdint>
 #include <numeric>
 #include <tuple>
 #include <type_traits>

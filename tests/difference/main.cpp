@@ -227,13 +227,15 @@ struct Planted {
     Deviation deviation;
     std::size_t mostSteps;
 };
+// What is left of a program depends on where the search began, and that on the compiler, too, which
+// evaluates arguments in an order of its own: these are the most of 25 seeds with each compiler.
 constexpr std::array plantings = {
-    Planted{"two values that change places", Deviation::swappedValues, 5},
-    Planted{"dimensions that are not turned", Deviation::dimensionsAsIs, 4},
-    Planted{"text that is read without its sign", Deviation::unsignedText, 6},
-    Planted{"another word for a status", Deviation::otherWord, 4},
+    Planted{"two values that change places", Deviation::swappedValues, 8},
+    Planted{"dimensions that are not turned", Deviation::dimensionsAsIs, 5},
+    Planted{"text that is read without its sign", Deviation::unsignedText, 10},
+    Planted{"another word for a status", Deviation::otherWord, 8},
     Planted{"checks in another order", Deviation::laterChecks, 1},
-    Planted{"a file without its last byte", Deviation::forgottenPadding, 2},
+    Planted{"a file without its last byte", Deviation::forgottenPadding, 1},
 };
 
 int selfTest(const Options &options) {

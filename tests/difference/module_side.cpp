@@ -4,6 +4,7 @@
 #include "tessel/runtime.hpp"
 
 #include <algorithm>
+#include <cstdint>
 
 namespace difference {
 namespace {

@@ -2,6 +2,7 @@
 #include "text.hpp"
 
 #include <cstddef>
+#include <cstdint>
 
 namespace difference {
 namespace {

@@ -5,6 +5,7 @@
 
 #include "tessel/netcdf_guard.hpp"
 
+#include <cstdint>
 #include <cstdlib>
 #include <span>
 #include <string>

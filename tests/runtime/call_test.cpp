@@ -3,6 +3,7 @@
 #include "tessel/host.h"
 
 #include <algorithm>
+#include <cstdint>
 #include <thread>
 
 namespace tessel::test {

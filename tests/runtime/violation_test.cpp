@@ -1,6 +1,8 @@
 // tests/runtime/violation_test.cpp: modules that break their promises.
 #include "support.hpp"
 
+#include <cstdint>
+
 namespace tessel::test {
 namespace {
 

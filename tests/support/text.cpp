@@ -3,6 +3,7 @@
 #include "support/text.hpp"
 
 #include <array>
+#include <cstdint>
 #include <cstdio>
 
 namespace tessel::test {

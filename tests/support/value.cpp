@@ -6,6 +6,7 @@
 #include <netcdf.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <cstring>
 
 namespace tessel::test {

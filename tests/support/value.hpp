@@ -3,6 +3,7 @@
 
 #include "tessel/runtime.hpp"
 
+#include <cstdint>
 #include <functional>
 #include <initializer_list>
 #include <string>
