@@ -2,11 +2,11 @@
 #include "constants/handlers.hpp"
 
 #include "call/catalogue.hpp"
+#include "call/name_index.hpp"
 #include "constants/constant_table.hpp"
 #include "convert/scalar.hpp"
 #include "tessel/create.h"
 
-#include <algorithm>
 #include <array>
 #include <cctype>
 #include <string>
@@ -14,19 +14,17 @@
 namespace tessel::netcdf {
 namespace {
 
+constexpr NameIndex constants(constantTable);
+
 double constantValue(const tsArray *array) {
     std::string name = unpackName(array, "parameter");
     for (char &c : name) {
         c = static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
     }
-    const auto *const row =
-        std::find_if(constantTable.begin(), constantTable.end(), [&](const ConstantEntry &entry) {
-            return name == entry.longName || name == entry.shortName;
-        });
-    if (row == constantTable.end()) {
-        raise(catalogue::unrecognizedCharParameter, name.c_str());
+    if (const ConstantEntry *const row = constants.find(name.c_str())) {
+        return row->value;
     }
-    return row->value;
+    raise(catalogue::unrecognizedCharParameter, name.c_str());
 }
 
 } // namespace
@@ -39,9 +37,9 @@ void parameterHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *pr
 
 void constantNamesHandler(int /*nlhs*/, tsArray *plhs[], int /*nrhs*/, const tsArray * /*prhs*/[],
                           const OperationEntry * /*entry*/) {
-    constexpr std::array<std::size_t, 2> dims = {constantCount, 1};
+    constexpr std::array<std::size_t, 2> dims = {constantTable.size(), 1};
     plhs[0] = tsCreateCellArray(dims.size(), dims.data());
-    for (std::size_t row = 0; row < constantCount; ++row) {
+    for (std::size_t row = 0; row < constantTable.size(); ++row) {
         tsSetCell(plhs[0], row, tsCreateString(constantTable[row].longName));
     }
 }
