@@ -52,8 +52,9 @@ debian_package(MODULE tessel-module-netcdf libs "netCDF library as a module for 
 debian_package(DEVELOPMENT libtessel-dev libdevel "embeddable host for modules (development files)"
 "This package has what it takes to embed the host and to write modules: the
 headers, the host as a static library, the guard that keeps calls from the
-netCDF library which it does not survive, files for CMake and pkg-config, and
-a manual page for every operation.")
+netCDF library which it does not survive (for the library and for programs in
+one piece), files for CMake and pkg-config, and a manual page for every
+operation.")
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS
     "${library} ${exactly}, tessel-module-netcdf ${exactly}")
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SUGGESTS tessel-doc)

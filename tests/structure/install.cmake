@@ -34,21 +34,26 @@ set(line "COADSY: 90 values from -89 to 89, mean 0\n")
 set(arguments ${PREFIX}/second_module/series.tsx ${FILE} COADSY)
 expect("${line}" ${PREFIX}/embedding/means ${arguments})
 expect("opened\n" ${PREFIX}/embedding/guarded ${FILE})
-execute_process(COMMAND ${PREFIX}/embedding/guarded https://localhost/file.nc
-    OUTPUT_VARIABLE found RESULT_VARIABLE status)
-if(NOT status EQUAL 1 OR NOT found STREQUAL "refused: TESSEL:guard:remote\n")
-    message(FATAL_ERROR "The guard let an address through: ${found}")
-endif()
 set(ENV{TESSEL_MODULE_PATH} ${lib}/tessel) # beside a program in one piece there are no modules
 expect("${line}" ${PREFIX}/embedding/means_static ${arguments})
+expect("opened\n" ${PREFIX}/embedding/guarded_static ${FILE})
+foreach(program guarded guarded_static)
+    execute_process(COMMAND ${PREFIX}/embedding/${program} https://localhost/file.nc
+        OUTPUT_VARIABLE found RESULT_VARIABLE status)
+    if(NOT status EQUAL 1 OR NOT found STREQUAL "refused: TESSEL:guard:remote\n")
+        message(FATAL_ERROR "The guard let an address through: ${found}")
+    endif()
+endforeach()
 
 # What they want of the system at run time has neither the build tree in it nor, where the host is
 # linked into the program, the host's library.
-execute_process(COMMAND objdump -p ${PREFIX}/embedding/means_static OUTPUT_VARIABLE wanted
-    COMMAND_ERROR_IS_FATAL ANY)
-if(wanted MATCHES "libtessel")
-    message(FATAL_ERROR "the static program wants the shared library")
-endif()
+foreach(program means_static guarded_static)
+    execute_process(COMMAND objdump -p ${PREFIX}/embedding/${program} OUTPUT_VARIABLE wanted
+        COMMAND_ERROR_IS_FATAL ANY)
+    if(wanted MATCHES "libtessel")
+        message(FATAL_ERROR "${program} wants the shared library")
+    endif()
+endforeach()
 foreach(file libtessel.so tessel/netcdf.tsx)
     execute_process(COMMAND objdump -p ${lib}/${file} OUTPUT_VARIABLE wanted
         COMMAND_ERROR_IS_FATAL ANY)
