@@ -67,7 +67,10 @@ def written_aside(target: paths.Path, *, overwrite: bool = False,
         raise tessel.Error("TESSEL:python:badPath", "The target has no name.")
     wanted = paths.absolute(given)
     _judge(wanted, overwrite, source)
-    real = paths.given(os.path.realpath(wanted))
+    # Where the folder is not there, `realpath` makes up another; the name that was given then fails
+    # as it should.
+    real = paths.given(os.path.realpath(wanted) if os.path.isdir(os.path.dirname(wanted))
+                       else wanted)
     temporary = os.path.join(os.path.dirname(real), f".tessel-{secrets.token_hex(8)}.part")
     try:
         with paths.called(temporary, wanted):

@@ -9,12 +9,17 @@ from __future__ import annotations
 
 import contextlib
 import os
+import re
+import stat
 from collections.abc import Iterator
 from typing import Any, Union
 
 from tessel.errors import Error
 
 Path = Union[str, bytes, os.PathLike[str], os.PathLike[bytes]]
+
+_UP = re.compile(r"/+\.\.(?:/+|\Z)")
+"""The first of these in a path is where it leads upwards."""
 
 _BLANKS = "".join(map(chr, range(1, 33)))
 """What the library skips at the beginning of a path."""
@@ -53,13 +58,35 @@ def taken(path: Any) -> str:
 
 def absolute(path: str, folder: str | None = None) -> str:
     """Where a path leads from a folder, the current one unless given; what is no path of a file
-    stays as it is."""
+    stays as it is.
+
+    It leads where the system goes: `..` behind a link is above the folder that the link leads to,
+    and behind what is no folder it is nowhere.
+    """
     if not path or "\0" in path or "://" in path:
         return path
     try:
-        return os.path.abspath(path if folder is None else os.path.join(folder, path))
+        whole = os.path.join(os.getcwd() if folder is None else folder, path)
     except OSError:  # the current folder has been removed
         return path
+    while _UP.search(whole):
+        before, after = _UP.split(whole, 1)
+        above = _above(os.path.normpath(before or os.sep))
+        if above is None:  # whoever opens it is told so
+            return whole
+        whole = os.path.join(above, after)
+    return os.path.normpath(whole)
+
+
+def _above(folder: str) -> str | None:
+    """Where `..` leads from a folder; None where there is none."""
+    try:
+        if stat.S_ISDIR(os.lstat(folder).st_mode):
+            return os.path.dirname(folder)
+    except OSError:
+        return None
+    # A link: it is followed to the end.
+    return os.path.dirname(os.path.realpath(folder)) if os.path.isdir(folder) else None
 
 
 @contextlib.contextmanager
