@@ -44,6 +44,14 @@ def integer(value: Any) -> Any:
         return value
 
 
+def code(value: Any) -> Any:
+    """A whole number, which the host wants as a double: the module would read the bytes of an int32
+    as a double's."""
+    if isinstance(value, numpy.ndarray) and value.dtype.kind in "iu":
+        return value.astype(float)
+    return integer(value)
+
+
 def vector(value: Any) -> Any:
     """A list for an iterable that is no array; else the value itself."""
     if isinstance(value, (numpy.ndarray, str, bytes)) or not isinstance(value, Iterable):
@@ -54,7 +62,7 @@ def vector(value: Any) -> Any:
 def identifiers(value: Any) -> Any:
     """A list of ids, which the host wants as doubles."""
     if isinstance(value, numpy.ndarray):
-        return value.astype(float) if value.dtype.kind in "iu" else value
+        return code(value)
     value = vector(value)
     return [integer(value)] if not isinstance(value, list) else value
 

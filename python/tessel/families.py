@@ -8,7 +8,7 @@ from collections.abc import Callable
 from dataclasses import dataclass
 
 from tessel.kinds import (ATTRIBUTE, COUNT, INDEX, NCID, NO_VARIABLE,
-                          NOT_OPEN, START, STRIDE, VARID, XTYPE, data_kind, data_result)
+                          NOT_OPEN, OWNER, START, STRIDE, VARID, XTYPE, data_kind, data_result)
 from tessel.operation import Argument, Errors, Operation, Result
 
 
@@ -87,7 +87,8 @@ def _read(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, s
         lines = text_example if text_example is not None and of.is_text else example
         return Operation(
             short=f"{name}_{of.suffix}", long=f"nc_{name}_{of.suffix}",
-            purpose=of.filled(purpose), notes=notes, arguments=(NCID, VARID, *arguments),
+            purpose=of.filled(purpose), notes=notes,
+            arguments=(NCID, OWNER if name == "get_att" else VARID, *arguments),
             results=(Result("data", data_result(of.dtype, of.host_class, text_row),
                             text_shape if of.is_text else shape),),
             errors=((f"TESSEL:netcdf:{tag}:badInputParameterCount", "the number of arguments"),
@@ -116,7 +117,7 @@ def _write(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, 
         data = Argument("data", data_kind(of.dtype, of.host_class), size)
         return Operation(
             short=short, long=f"nc_{short}", purpose=of.filled(purpose), notes=notes,
-            arguments=(NCID, VARID, *given, data), results=(),
+            arguments=(NCID, OWNER if name == "put_att" else VARID, *given, data), results=(),
             errors=((f"TESSEL:netcdf:{mine}:badInputParameterCount", "the number of arguments"),
                     *empty,
                     (f"TESSEL:netcdf:{short}:badDatatype",

@@ -5,51 +5,58 @@ from __future__ import annotations
 
 from tessel.operation import Argument, Kind, ResultKind
 
-_NUMBER = "double or int32, of which the first element counts"
+_NUMBER = "double or int32; the first element counts, without its fraction"
+_NOT_NUMERIC = "is of no numeric class"
+
+
+def other_class(*classes: str) -> str:
+    """Why an argument is refused that may have these classes."""
+    return f"is of another class than {' and '.join(', '.join(classes).rsplit(', ', 1))}"
+
 
 IDENTIFIER = Kind(
     "SupportsIndex", "int", _NUMBER, "{name} if type({name}) is int else integer({name})",
     (("TESSEL:netcdf:emptySetID", "has no elements"),
-     ("TESSEL:netcdf:badIDDatatype", "is no whole number")))
+     ("TESSEL:netcdf:badIDDatatype", other_class("double", "int32"))))
 NAME = Kind(
     "str", "str", "char", "{name}",
-    (("TESSEL:netcdf:argumentWasNotChar", "is no str"),))
+    (("TESSEL:netcdf:argumentWasNotChar", other_class("char")),))
 PATH_NAME = Kind(
     "paths.Path", "str, bytes or path object", NAME.host, "file_path({name})",
     (*NAME.errors, ("TESSEL:python:badPath", "has a NUL in it, or is not UTF-8")))
 MODE = Kind(
     "str | SupportsIndex", "str or int",
-    "char; or double or int32, of which the first element counts",
-    "{name} if type({name}) is str else integer({name})",
+    f"char, or {_NUMBER}", "{name} if type({name}) is str else integer({name})",
     (("TESSEL:netcdf:emptySetMode", "has no elements"),
-     ("TESSEL:netcdf:badModeDatatype", "is neither a name nor a whole number"),
+     ("TESSEL:netcdf:badModeDatatype", other_class("char", "double", "int32")),
      ("TESSEL:netcdf:unrecognizedFileMode", "is no name of a mode")))
 TYPE = Kind(
-    "SupportsIndex", "int", "double, of which the first element counts", IDENTIFIER.conversion,
+    "SupportsIndex", "int", "double; the first element counts", IDENTIFIER.conversion,
     (("TESSEL:netcdf:unpack_xtype:emptySetDatatype", "has no elements"),
-     ("TESSEL:netcdf:unpack_xtype:badDatatype", "is no number"),
+     ("TESSEL:netcdf:unpack_xtype:badDatatype", other_class("double")),
      ("TESSEL:netcdf:invalidNetcdfDatatype", "is not from 0 to 6")))
 SIZE = Kind(
     "SupportsIndex", "int", "any numeric class; the first element counts", IDENTIFIER.conversion,
     (("TESSEL:netcdf:emptySetSizeParameter", "has no elements"),
-     ("TESSEL:netcdf:badSizeArgumentDatatype", "is no number"),
+     ("TESSEL:netcdf:badSizeArgumentDatatype", _NOT_NUMERIC),
      ("TESSEL:netcdf:sizeArgumentIsInfOrNaN", "is infinite or no number"),
      ("TESSEL:netcdf:negativeSize", "is negative")))
 ANYTHING = Kind(SIZE.annotation, SIZE.wording, "anything", SIZE.conversion, ())
 CODE = Kind(
-    "SupportsIndex", "int", _NUMBER, IDENTIFIER.conversion,
+    "SupportsIndex", "int", "double; the first element counts, without its fraction",
+    "{name} if type({name}) is int else code({name})",
     (("TESSEL:netcdf:unpackIntSingleton:argumentIsEmptySet", "has no elements"),
-     ("TESSEL:netcdf:unpackIntSingleton:badNumericType", "is no number")))
+     ("TESSEL:netcdf:unpackIntSingleton:badNumericType", other_class("double", "int32"))))
 DIMENSIONS = Kind(
     "Indices", "sequence of int", "double, an element a dimension; empty for none",
     "identifiers({name})",
-    (("TESSEL:netcdf:unpackDimids:badDimidsType", "are no numbers"),
+    (("TESSEL:netcdf:unpackDimids:badDimidsType", "are of another class than double"),
      ("TESSEL:netcdf:ndimsLargerThanNetcdfLimits", "are more than 1024")))
 POSITIONS = Kind(
     "Indices", "sequence of int", "any numeric class, an element a dimension",
     "{name} if type({name}) in PLAIN else vector({name})",
     (("TESSEL:netcdf:{label}ArgumentIsEmpty", "has no elements"),
-     ("TESSEL:netcdf:{label}ArgumentHasBadDatatype", "has elements that are no numbers"),
+     ("TESSEL:netcdf:{label}ArgumentHasBadDatatype", _NOT_NUMERIC),
      ("TESSEL:netcdf:indexArgumentHasInf", "has an infinite element"),
      ("TESSEL:netcdf:indexArgumentHasNaN", "has an element that is no number")))
 
@@ -87,7 +94,8 @@ def data_result(dtype: str, host_class: str, row: bool) -> ResultKind:
 
 
 NCID = Argument("ncid", IDENTIFIER, "The dataset.")
-VARID = Argument("varid", IDENTIFIER, "The variable; for attributes, -1 is the dataset itself.")
+VARID = Argument("varid", IDENTIFIER, "The variable.")
+OWNER = Argument("varid", IDENTIFIER, "The variable, or -1 for the dataset itself.")
 DIMID = Argument("dimid", IDENTIFIER, "The dimension.")
 ATTRIBUTE = Argument("name", NAME, "The attribute's name.", "attribute")
 XTYPE = Argument("xtype", TYPE, """The external type: param("NC_BYTE"), "NC_CHAR", "NC_SHORT",

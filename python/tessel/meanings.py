@@ -12,14 +12,17 @@ _COUNT = ("The operation was given too many arguments or too few.",
 _FOREIGN = ("A row of the module's table leads to a family that does not serve it.",
             "Nothing: the table has no such row. If it appears, the module was changed wrongly.")
 _INQUIRY = "Look whether the dataset is still open and the variable's id is right."
-_NO_MEMORY = "As for outOfMemory: it is what a host without memory answers."
+_NO_DIMENSIONS = ("a variable without dimensions is read by get_var_* and written by put_var_*, "
+                  "and by no other family.")
+_GUARD_OF_HOST = ("Nothing: a host gives the characters of every text, and raises outOfMemory "
+                  "where it cannot. If it appears, the host breaks this promise.")
 _LOOK = "Look at the message."
 
 
 def _length(vector: str) -> tuple[str, str]:
     return (f"The {vector} has not one element for each dimension of the variable.",
             "Ask inq_var for the dimensions, and give as many elements, the fastest dimension "
-            "first.")
+            f"first; {_NO_DIMENSIONS}")
 
 
 # The call itself, and what the arguments are.
@@ -40,14 +43,15 @@ _ARGUMENTS = {
         "A name or a path is not text.",
         "Give it as a row of characters; in Python, as a str."),
     "badIDDatatype": (
-        "An id is no whole number that the module takes.",
+        "An id is of another class than double and int32.",
         "Give an id as double or int32; in Python, as any integer."),
     "emptySetID": (
         "An id is an empty array.",
         "Look whether what gave the id found anything."),
     "badModeDatatype": (
-        "A mode is neither a name nor a number that the module takes.",
-        "Give one of the names on the operation's page, or constants joined bit by bit."),
+        "A mode is of another class than char, double and int32.",
+        "Give one of the names on the operation's page, or constants joined bit by bit, as double "
+        "or int32."),
     "emptySetMode": (
         "A mode is empty.", "Give one of the names on the operation's page, or a number."),
     "unrecognizedFileMode": (
@@ -63,7 +67,7 @@ _ARGUMENTS = {
         "A number for an external type is not from 0 to 6.",
         "Give the value of NC_BYTE, NC_CHAR, NC_SHORT, NC_INT, NC_FLOAT or NC_DOUBLE."),
     "badSizeArgumentDatatype": (
-        "A size is not a number.", "Give it as a number of any class."),
+        "A size is of no numeric class.", "Give it as a number of any class."),
     "emptySetSizeParameter": ("A size is an empty array.", "Give one number."),
     "sizeArgumentIsInfOrNaN": (
         "A size is infinite or no number.", "Look at the computation that it comes from."),
@@ -73,7 +77,9 @@ _ARGUMENTS = {
         "Nothing: the host has no such class. If it appears, host and module are not of one kind."),
     "argumentIsEmptySet": ("A code is an empty array.", "Give one number."),
     "badNumericType": (
-        "A code is no number that the module takes.", "Give it as double or int32."),
+        "A code is of another class than double and int32.",
+        "Give it as a double: an int32 is no error, but its bytes are read as those of a double, "
+        "which is another number."),
     "badDimidsType": (
         "A list of dimension ids is not of doubles.",
         "Give the ids as doubles, whatever ids of other kinds may be."),
@@ -85,12 +91,12 @@ _ARGUMENTS = {
         "A list of dimension ids is longer than an int counts.", "Use fewer dimensions."),
     "startArgumentIsEmpty": (
         "The position is an empty array.",
-        "Give a position for each dimension; for a variable without dimensions, one number."),
+        f"Give a position for each dimension; {_NO_DIMENSIONS}"),
     "countArgumentIsEmpty": (
-        "The count is an empty array.", "Give a count for each dimension."),
+        "The count is an empty array.", f"Give a count for each dimension; {_NO_DIMENSIONS}"),
     "strideArgumentIsEmpty": (
         "The stride is an empty array.",
-        "Give a stride for each dimension; 1 takes every element."),
+        f"Give a stride for each dimension, 1 for every element; {_NO_DIMENSIONS}"),
     "startArgumentHasBadDatatype": (
         "The position is no array of numbers.", "Give whole numbers from 0."),
     "countArgumentHasBadDatatype": (
@@ -138,11 +144,11 @@ _ARGUMENTS = {
         "A size cannot be given back as a double.",
         "Nothing: every size of 64 bits has a double near it. It is a guard."),
     "tsArrayToStringFailureForUnpackingName": (
-        "The host could not give the characters of a name or path.",
-        _NO_MEMORY),
+        "The host gave no characters for a name or path.",
+        _GUARD_OF_HOST),
     "tsArrayToStringFailureForMode": (
-        "The host could not give the characters of a mode.",
-        _NO_MEMORY),
+        "The host gave no characters for a mode.",
+        _GUARD_OF_HOST),
 }
 
 # The library's own statuses.

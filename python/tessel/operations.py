@@ -9,7 +9,7 @@ from __future__ import annotations
 from tessel.families import family
 from tessel.kinds import (ANYTHING, ATTRIBUTE, CODE, CONSTANT, DIMENSION_LIST, DIMENSIONS, DIMID,
                           IDENTIFIER, MODE, NAME, NAMES, NCID, NO_VARIABLE, NOT_OPEN, NUMBER,
-                          PATH_NAME, SIZE, TEXT, VARID, XTYPE)
+                          OWNER, PATH_NAME, SIZE, TEXT, VARID, XTYPE)
 from tessel.operation import Argument, Errors, Operation, Result
 
 EXAMPLE_BEGINNING = """\
@@ -50,6 +50,13 @@ def _errors(tag: str, *failures: tuple[str, str], count: str = "badInputParamete
     """The error for a wrong number of arguments, then the library's failures."""
     return ((f"TESSEL:netcdf:{count_tag or tag}:{count}", "the number of arguments"),
             *((f"TESSEL:netcdf:{tag}:{word}", cause) for word, cause in failures))
+
+
+def _code(name: str, meaning: str, label: str) -> Argument:
+    """A code, with what is easily done wrong in the host."""
+    return Argument(name, CODE, f"""{meaning} In the host, and in a call by name, give a double: an
+        int32 is no error, but its bytes are read as those of a double, which is another number.""",
+                    label)
 
 
 def _enddef(short: str) -> Operation:
@@ -125,7 +132,7 @@ OPERATIONS: tuple[Operation, ...] = (
                 '>>> nc.def_var(ncid, "depth", nc.param("NC_FLOAT"), [0, 1])\n7'),
     Operation(
         "del_att", "nc_del_att", "Delete an attribute.",
-        arguments=(NCID, VARID, ATTRIBUTE), results=(),
+        arguments=(NCID, OWNER, ATTRIBUTE), results=(),
         errors=_errors("delAtt", NOT_OPEN, NO_VARIABLE, _NO_ATTRIBUTE, _NOT_DEFINING, _READ_ONLY),
         example='>>> nc.redef(ncid)\n>>> nc.del_att(ncid, nc.param("GLOBAL"), "title")'),
     Operation(
@@ -162,7 +169,7 @@ OPERATIONS: tuple[Operation, ...] = (
         example=">>> nc.inq(ncid)\nInq(ndims=3, nvars=7, natts=1, unlimdimid=2)"),
     Operation(
         "inq_att", "nc_inq_att", "The type and length of an attribute.",
-        arguments=(NCID, VARID, ATTRIBUTE),
+        arguments=(NCID, OWNER, ATTRIBUTE),
         results=(Result("xtype", NUMBER, "The external type: 1 byte, 2 char, 3 short, 4 int, 5 "
                                          "float, 6 double."),
                  Result("len", NUMBER, "The number of values or characters.")),
@@ -171,13 +178,13 @@ OPERATIONS: tuple[Operation, ...] = (
         example='>>> nc.inq_att(ncid, nc.param("GLOBAL"), "title")\nInqAtt(xtype=2, len=8)'),
     Operation(
         "inq_attid", "nc_inq_attid", "The number of an attribute.",
-        arguments=(NCID, VARID, ATTRIBUTE),
+        arguments=(NCID, OWNER, ATTRIBUTE),
         results=(Result("attnum", NUMBER, "Its number, from 0."),),
         errors=_errors("inqAttID", NOT_OPEN, NO_VARIABLE, _NO_ATTRIBUTE),
         example='>>> nc.inq_attid(ncid, nc.param("GLOBAL"), "title")\n0'),
     Operation(
         "inq_attname", "nc_inq_attname", "The name of an attribute.",
-        arguments=(NCID, VARID, Argument("attnum", IDENTIFIER, "Its number, from 0.", "attid")),
+        arguments=(NCID, OWNER, Argument("attnum", IDENTIFIER, "Its number, from 0.", "attid")),
         results=(Result("name", TEXT, "Its name."),),
         errors=_errors("inqAttName", NOT_OPEN, NO_VARIABLE, _NO_ATTRIBUTE),
         example=">>> nc.inq_attname(ncid, nc.param(\"GLOBAL\"), 0)\n'title'"),
@@ -251,7 +258,7 @@ OPERATIONS: tuple[Operation, ...] = (
         example=">>> nc.redef(ncid)"),
     Operation(
         "rename_att", "nc_rename_att", "Rename an attribute.",
-        arguments=(NCID, VARID, ATTRIBUTE, Argument("newname", NAME, "Its new name.", "attribute")),
+        arguments=(NCID, OWNER, ATTRIBUTE, Argument("newname", NAME, "Its new name.", "attribute")),
         results=(),
         errors=_errors("renameAtt", NOT_OPEN, NO_VARIABLE, _NO_ATTRIBUTE, _IN_USE, _BAD_NAME,
                        _LONGER, _READ_ONLY),
@@ -271,24 +278,23 @@ OPERATIONS: tuple[Operation, ...] = (
         "set_default_format", "nc_set_default_format",
         "Set the format of the datasets to be created from now on.",
         notes="It holds for everything in this process that uses the library.",
-        arguments=(Argument("format", CODE,
-                            'Either param("FORMAT_CLASSIC") or param("FORMAT_64BIT").',
-                            "new_default_format"),),
+        arguments=(_code("format", 'Either param("FORMAT_CLASSIC") or param("FORMAT_64BIT").',
+                         "new_default_format"),),
         results=(Result("old_format", NUMBER, "The format until now."),),
         errors=_errors("setDefaultFormat", ("invalidArgument", "there is no such format")),
         example=">>> old = nc.set_default_format(nc.param(\"FORMAT_64BIT\"))\n"
                 ">>> nc.set_default_format(old)\n2"),
     Operation(
         "set_fill", "nc_set_fill", "Set whether data that nobody writes are filled.",
-        arguments=(NCID, Argument("fillmode", CODE, 'Either param("FILL") or param("NOFILL").',
-                                  "new_fill_mode")),
+        arguments=(NCID, _code("fillmode", 'Either param("FILL") or param("NOFILL").',
+                               "new_fill_mode")),
         results=(Result("old_mode", NUMBER, "The fill mode until now."),),
         errors=_errors("setFill", NOT_OPEN, ("invalidArgument", "there is no such fill mode"),
                        _READ_ONLY),
         example=">>> nc.set_fill(ncid, nc.param(\"NOFILL\"))\n0"),
     Operation(
         "strerror", "nc_strerror", "What a status of the library means.",
-        arguments=(Argument("ncerr", CODE, "The status.", "status"),),
+        arguments=(_code("ncerr", "The status.", "status"),),
         results=(Result("text", TEXT, "The library's or the system's text."),),
         errors=_errors("strerror", count="badInputArgumentCount"),
         example=">>> nc.strerror(nc.param(\"NC_EBADID\"))\n'NetCDF: Not a valid ID'"),
