@@ -13,7 +13,7 @@ void unpackVector(const tsArray *array, const char *argName, DimensionVector<Wid
         raiseNamed(argName, catalogue::argumentIsEmpty, argName);
     }
     const std::size_t n = tsGetNumberOfElements(array);
-    out.resize(n);
+    out.resize(n, unfilled);
     const bool numeric = visitNumeric(array, [&]<class T>(const T *from) {
         for (std::size_t i = 0; i < n; ++i) {
             if constexpr (std::is_same_v<T, double>) {

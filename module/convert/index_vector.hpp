@@ -18,6 +18,9 @@ namespace tessel::netcdf {
 template <class T>
 using DimensionVector = boost::container::small_vector<T, 8>;
 
+/// For one whose elements are all written next.
+inline constexpr boost::container::default_init_t unfilled{};
+
 using IndexVector = DimensionVector<std::size_t>;
 using StrideVector = DimensionVector<std::ptrdiff_t>;
 

@@ -179,19 +179,6 @@ const std::filesystem::path &Module::file() const noexcept {
     return loaded->file;
 }
 
-/// How a call ended: with results, or with an error, which is raised once all is tidy.
-struct Module::Ending {
-    Results results;
-    std::optional<Error> error;
-
-    Results given() {
-        if (error) {
-            throw *error;
-        }
-        return std::move(results);
-    }
-};
-
 /// Tells a watcher how a call ended, also when it ends by the end of its thread, which is
 /// cancelled.
 class Module::Told {
@@ -207,9 +194,9 @@ class Module::Told {
     Told(const Told &) = delete;
     Told &operator=(const Told &) = delete;
 
-    void tell(const Ending &ending) noexcept {
+    void tell(const Results &results, const std::optional<Error> &error) noexcept {
         told = true;
-        watcher.after(inputs, ending.results, ending.error ? &*ending.error : nullptr);
+        watcher.after(inputs, results, error ? &*error : nullptr);
     }
 
   private:
@@ -232,14 +219,20 @@ Results Module::call(std::span<const tsArray *> inputs, const CallOptions &optio
         raise(host_errors::missingInput);
     }
     const std::lock_guard lock(callLock);
+    Results results;
+    std::optional<Error> error;
     if (!watcher) {
-        return run(inputs, options).given();
+        error = run(inputs, options, results);
+    } else {
+        orOutOfMemory([&] { watcher->before(inputs, Ask(*this)); });
+        Told told(*watcher, inputs);
+        error = run(inputs, options, results);
+        told.tell(results, error);
     }
-    orOutOfMemory([&] { watcher->before(inputs, Ask(*this)); });
-    Told told(*watcher, inputs);
-    Ending ending = run(inputs, options);
-    told.tell(ending);
-    return ending.given();
+    if (error) {
+        throw *error;
+    }
+    return results;
 }
 
 Module Module::watchedBy(std::shared_ptr<Watcher> next) const {
@@ -249,12 +242,18 @@ Module Module::watchedBy(std::shared_ptr<Watcher> next) const {
 }
 
 Results Ask::call(std::span<const tsArray *> inputs) const {
-    return module.run(inputs, {}).given();
+    Results results;
+    if (const std::optional<Error> error = module.run(inputs, {}, results)) {
+        throw *error;
+    }
+    return results;
 }
 
-/// One call, by a thread that has the lock.
-Module::Ending Module::run(std::span<const tsArray *> inputs, const CallOptions &options) const {
-    Ending ending;
+/// One call, by a thread that has the lock: its results, or the error that it ended with, which is
+/// to be raised once all is tidy.
+std::optional<Error> Module::run(std::span<const tsArray *> inputs, const CallOptions &options,
+                                 Results &results) const {
+    std::optional<Error> failure;
     CallFrame frame(options);
     std::array<tsArray *, Results::slots> slots{};
     const auto enter = [&] {
@@ -263,25 +262,25 @@ Module::Ending Module::run(std::span<const tsArray *> inputs, const CallOptions 
                            inputs.data());
         for (std::size_t i = 0; i < slots.size(); ++i) {
             if (slots[i] != nullptr) {
-                ending.results.arrays[i] = frame.give(slots[i]);
-                ending.results.count = i + 1;
+                results.arrays[i] = frame.give(slots[i]);
+                results.count = i + 1;
             }
         }
     };
     try {
         enter();
     } catch (const Error &error) {
-        ending.error = error;
+        failure = error;
     } catch (...) {
-        ending.error = translated();
+        failure = translated();
     }
     if (const char *fault = frame.inspect()) {
-        ending.error = completed(host_errors::violation, {": ", fault});
+        failure = completed(host_errors::violation, {": ", fault});
     }
-    if (ending.error) {
-        ending.results = Results();
+    if (failure) {
+        results = Results();
     }
-    return ending;
+    return failure;
 }
 
 } // namespace tessel

@@ -25,7 +25,7 @@ constexpr TextBlock text = {1, countedIn32Bits};
 IndexVector currentLengths(int ncid, int varid) {
     const std::size_t ndims = numberOfDimensions(ncid, varid, catalogue::getVarNumDims);
     const DimensionVector<int> dimids = dimensionIDs(ncid, varid, ndims, catalogue::getVarDimids);
-    IndexVector lengths(ndims);
+    IndexVector lengths(ndims, unfilled);
     for (std::size_t i = 0; i < ndims; ++i) {
         check(nc_inq_dimlen(ncid, dimids[i], &lengths[i]), catalogue::getVarDimLen);
     }

@@ -22,7 +22,7 @@ std::size_t numberOfDimensions(int ncid, int varid, const Failure &failure) {
 /// The variable's dimension ids, in library order.
 template <class Failure>
 DimensionVector<int> dimensionIDs(int ncid, int varid, std::size_t ndims, const Failure &failure) {
-    DimensionVector<int> dimids(ndims);
+    DimensionVector<int> dimids(ndims, unfilled);
     check(nc_inq_vardimid(ncid, varid, dimids.data()), failure);
     return dimids;
 }

@@ -46,7 +46,7 @@ void inqAttnameHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *p
     const int varid = unpackID(prhs[2], "varid");
     const int attid = unpackID(prhs[3], "attid");
 
-    std::array<char, NC_MAX_NAME + 1> name{};
+    std::array<char, NC_MAX_NAME + 1> name; // filled by the inquiry
     check(nc_inq_attname(ncid, varid, attid, name.data()), catalogue::inqAttname.failure);
     plhs[0] = tsCreateString(name.data());
 }

@@ -29,7 +29,7 @@ void inqDimHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[
     const int ncid = unpackID(prhs[1], "ncid");
     const int dimid = unpackID(prhs[2], "dimid");
 
-    std::array<char, NC_MAX_NAME + 1> name{};
+    std::array<char, NC_MAX_NAME + 1> name; // filled by the inquiry
     std::size_t length = 0;
     check(nc_inq_dim(ncid, dimid, name.data(), &length), catalogue::inqDim.failure);
     plhs[0] = tsCreateString(name.data());

@@ -40,7 +40,7 @@ void inqVarHandler(int /*nlhs*/, tsArray *plhs[], int nrhs, const tsArray *prhs[
     const int ncid = unpackID(prhs[1], "ncid");
     const int varid = unpackID(prhs[2], "varid");
 
-    std::array<char, NC_MAX_NAME + 1> name{};
+    std::array<char, NC_MAX_NAME + 1> name; // filled by the inquiry
     nc_type type = NC_NAT;
     int ndims = 0;
     std::array<int, NC_MAX_VAR_DIMS> dimids; // filled as far as it is read

@@ -2,11 +2,13 @@
 #pragma once
 
 #include "tessel/runtime/array.hpp"
+#include "tessel/runtime/error.hpp"
 
 #include <array>
 #include <cstddef>
 #include <filesystem>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string_view>
 
@@ -114,9 +116,9 @@ class Module {
 
   private:
     friend class Ask;
-    struct Ending;
     class Told;
-    [[nodiscard]] Ending run(std::span<const tsArray *> inputs, const CallOptions &options) const;
+    [[nodiscard]] std::optional<Error> run(std::span<const tsArray *> inputs,
+                                           const CallOptions &options, Results &results) const;
 
     struct Loaded;
     std::shared_ptr<const Loaded> loaded;
