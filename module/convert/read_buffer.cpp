@@ -3,8 +3,6 @@
 
 #include "call/catalogue.hpp"
 
-#include <algorithm>
-
 namespace tessel::netcdf {
 
 char *allocateReadBuffer(std::size_t count, std::size_t unit, const OperationEntry *entry) {
@@ -13,11 +11,6 @@ char *allocateReadBuffer(std::size_t count, std::size_t unit, const OperationEnt
         raiseNamed(entry->shortName, catalogue::readBufferFailure, entry->shortName);
     }
     return static_cast<char *>(buffer);
-}
-
-void widenText(const char *bytes, std::size_t count, tsArray *characters) {
-    std::transform(bytes, bytes + count, static_cast<tsChar *>(tsGetData(characters)),
-                   [](char byte) { return static_cast<tsChar>(static_cast<signed char>(byte)); });
 }
 
 } // namespace tessel::netcdf

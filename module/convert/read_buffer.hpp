@@ -7,6 +7,7 @@
 
 #include "call/operation.hpp"
 #include "convert/memory.hpp"
+#include "convert/text.hpp"
 #include "tessel/create.h"
 #include "tessel/memory.h"
 
@@ -25,9 +26,6 @@ struct TextBlock {
 /// A zero-filled buffer of the host's. Raises where there is none, except for a request of no
 /// bytes, which the host may answer with NULL.
 char *allocateReadBuffer(std::size_t count, std::size_t unit, const OperationEntry *entry);
-
-/// Copies bytes into a char array, each widened with its sign: 0xE9 becomes 0xFFE9.
-void widenText(const char *bytes, std::size_t count, tsArray *characters);
 
 /// Creates a numeric result of the given dimensions in the slot and has `read` fill it. Gives back
 /// the status of `read`.
@@ -51,7 +49,7 @@ int readBlock(tsArray *&slot, std::span<const std::size_t> dims, const TextBlock
     const std::size_t length = tsGetNumberOfElements(slot);
     char *const bytes = allocateReadBuffer(length + 1, text.unit, entry);
     const int status = read(bytes);
-    widenText(bytes, text.handedOver(length), slot);
+    widen(bytes, text.handedOver(length), static_cast<tsChar *>(tsGetData(slot)));
     tsFree(bytes);
     return status;
 }

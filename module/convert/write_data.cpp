@@ -2,8 +2,8 @@
 #include "convert/write_data.hpp"
 
 #include "call/catalogue.hpp"
+#include "convert/text.hpp"
 
-#include <algorithm>
 #include <array>
 
 namespace tessel::netcdf {
@@ -52,9 +52,7 @@ char *make_text_write_buffer(const tsArray *data, const OperationEntry *entry) {
     if (bytes == nullptr) {
         raiseNamed(entry->shortName, catalogue::writeBufferFailure, entry->shortName);
     }
-    const auto *const characters = elements<tsChar>(data);
-    std::transform(characters, characters + n, bytes,
-                   [](tsChar character) { return static_cast<char>(character); });
+    narrow(elements<tsChar>(data), n, bytes);
     return bytes;
 }
 

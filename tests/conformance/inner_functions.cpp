@@ -11,6 +11,7 @@
 #include "convert/index_vector.hpp"
 #include "convert/pack.hpp"
 #include "convert/scalar.hpp"
+#include "convert/text.hpp"
 #include "convert/write_data.hpp"
 #include "gateway/lookup.hpp"
 #include "gateway/operation_table.hpp"
@@ -21,6 +22,8 @@
 #include <cctype>
 #include <limits>
 #include <memory>
+#include <random>
+#include <vector>
 
 namespace tessel::test {
 namespace {
@@ -109,6 +112,56 @@ TEST(Lookup, IsAWalkThroughTheTable) {
     }
     expectAsByWalk("");
     expectAsByWalk("\xC3\x96");
+}
+
+/// Any values of Unit, the same in each run.
+template <class Unit>
+std::vector<Unit> anyValues(std::size_t count) {
+    std::mt19937 engine(1);
+    std::vector<Unit> values(count);
+    std::generate(values.begin(), values.end(), [&] { return static_cast<Unit>(engine()); });
+    return values;
+}
+
+/// Copies of all lengths around those at which another way of copying begins or ends, from and to
+/// wherever a vector may stand; nothing beside them is written.
+template <class From, class To, class Copy, class Each>
+void expectCopies(const Copy &copy, const Each &each) {
+    constexpr std::size_t large = std::size_t{1} << 20U;
+    constexpr std::size_t room = 40;
+    constexpr To untouched = 0x5A;
+    const std::vector<From> from = anyValues<From>(large + 2 * room);
+    std::vector<To> to(from.size() + 2 * room, untouched);
+    for (const std::size_t length : {std::size_t{0}, large - room, large}) {
+        for (std::size_t more = 0; more < room; ++more) {
+            // A vector has 16 bytes: both sides stand at each place in one, and at different ones.
+            const std::size_t first = more % 17;
+            const std::size_t place = room + more % 16;
+            const std::size_t count = length + more;
+            copy(from.data() + first, count, to.data() + place);
+            std::size_t wrong = 0;
+            for (std::size_t i = 0; i < to.size(); ++i) {
+                const bool copied = i >= place && i - place < count;
+                const To expected = copied ? each(from[first + i - place]) : untouched;
+                wrong += to[i] == expected ? 0U : 1U;
+            }
+            ASSERT_EQ(wrong, 0U) << count << " from " << first << " to " << place;
+            std::fill(to.begin(), to.end(), untouched);
+        }
+    }
+}
+
+TEST(Text, IsWidenedWithItsSignWhateverItsLengthAndPlace) {
+    expectCopies<char, tsChar>(netcdf::widen, [](char byte) {
+        const int code = static_cast<unsigned char>(byte);
+        return static_cast<tsChar>(code < 0x80 ? code : code + 0xFF00);
+    });
+}
+
+TEST(Text, IsNarrowedToItsLowBytesWhateverItsLengthAndPlace) {
+    expectCopies<tsChar, char>(netcdf::narrow, [](tsChar character) {
+        return static_cast<char>(static_cast<unsigned char>(character % 0x100));
+    });
 }
 
 /// Fewer than no inputs are too few as well.
