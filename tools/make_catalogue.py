@@ -1,11 +1,12 @@
 #!/usr/bin/env python3
-"""tools/make_catalogue.py: writes python/tessel/catalogue.py, what the module can raise.
+"""tools/make_catalogue.py: writes python/tessel/catalogue.py, what a call can raise.
 
 usage: tools/make_catalogue.py
 
 The rows are read from module/call/catalogue.hpp and the words from module/call/status.cpp. What
 each operation can raise is found by following its handler through the functions and constants that
-it mentions, so that no list has to be kept beside the code.
+it mentions, so that no list has to be kept beside the code. The errors of the host, of the guard
+and of the Python package are read where they stand as well.
 """
 
 from __future__ import annotations
@@ -20,6 +21,17 @@ MODULE = ROOT / "module"
 TARGET = ROOT / "python" / "tessel" / "catalogue.py"
 TYPES = ("double", "float", "int", "short", "schar", "uchar", "text")
 TEXT = r'"((?:[^"\\]|\\.)*)"'
+
+# What stands in the messages of the extension for an expression.
+ONLY_THE_CALL_KNOWS = {
+    'dtype.attr("name").cast<std::string>()': "<the dtype>",
+    "array.className()": "<the class>",
+    "std::to_string(deepest)": "<the most>",
+    "std::to_string(mostDimensions)": "<the most>",
+    "std::to_string(dims.size())": "<the number>",
+    "typeName(value)": "<the type>",
+    "typeName(key)": "<the type>",
+}
 
 
 def unescaped(text: str) -> str:
@@ -61,6 +73,50 @@ def statuses() -> dict[int, str]:
     pairs = re.findall(r'^    (?:"(\w+)"|unknown),\s*// (-?\d+)$', text, re.M)
     [two] = re.findall(r'versionTwoStatus\) \{\s*return "(\w+)"', text)
     return {-1: two, **{int(status): word for word, status in pairs if word}}
+
+
+def pairs(file: Path) -> dict[str, str]:
+    """The rows of a table that has an identifier and a text in each."""
+    found = re.findall(rf'= \{{"(TESSEL:\w+:\w+)",\s*{TEXT}\}}', file.read_text())
+    return {identifier: unescaped(text) for identifier, text in found}
+
+
+def host() -> dict[str, str]:
+    """The host's errors: identifiers and messages."""
+    return pairs(ROOT / "runtime" / "src" / "host_errors.hpp")
+
+
+def guard() -> dict[str, str]:
+    """The same of the guard; the particulars come before the reason, which is always the same."""
+    file = ROOT / "guard" / "src" / "refusals.hpp"
+    [start, middle, end] = re.findall(TEXT, file.read_text().partition("throw Error(")[2])
+    return {identifier: f"{start}<particulars>{middle}{reason}{end}"
+            for identifier, reason in pairs(file).items()}
+
+
+def refusals(*names: str) -> dict[str, str]:
+    """What is refused in source files of the Python package's extension."""
+    found: dict[str, str] = {}
+    for name in names:
+        text = (ROOT / "python" / "src" / name).read_text()
+        for word, message in re.findall(r'\brefuse\(\s*"(\w+)",(.*?)\);', text, re.S):
+            for expression, stands_for in ONLY_THE_CALL_KNOWS.items():
+                message = message.replace(expression, f'"{stands_for}"')
+            rest = re.sub(TEXT, "", message).replace("std::string()", "")
+            assert not rest.strip(" +\n"), (name, rest)
+            whole = unescaped("".join(re.findall(TEXT, message)))
+            assert found.setdefault(f"TESSEL:python:{word}", whole) == whole, word
+    return found
+
+
+def package() -> tuple[str, ...]:
+    """All identifiers of the Python package."""
+    words = set()
+    for file in (ROOT / "python").rglob("*"):
+        if file != TARGET and file.suffix in (".py", ".cpp"):
+            words |= set(re.findall(
+                r'(?:"TESSEL:python:|\b(?:refuse|refusal|_error)\(\s*")(\w+)"', file.read_text()))
+    return tuple(f"TESSEL:python:{word}" for word in sorted(words))
 
 
 @dataclass(frozen=True)
@@ -162,15 +218,24 @@ def made() -> str:
     def row(name: str, identifier: str, message: str) -> str:
         line = f'    "{name}": (\n        "{identifier}",\n        {literal(message)}),'
         return line if max(map(len, line.splitlines())) <= 100 else line.replace(
-            literal(message), halves(message))
+            literal(message), parts(message))
 
-    def halves(message: str) -> str:
+    def parts(message: str) -> str:
+        if len(message) < 88:
+            return literal(message)
         at = message.rindex(" ", 0, 80) + 1
-        return f"{literal(message[:at])}\n        {literal(message[at:])}"
+        return f"{literal(message[:at])}\n        {parts(message[at:])}"
+
+    def table(name: str, what: str, found: dict[str, str]) -> list[str]:
+        return [f"{name}: dict[str, str] = {{",
+                *(f'    "{identifier}":\n        {parts(message)},'
+                  for identifier, message in found.items()),
+                "}", f'"""{what}"""', ""]
 
     return "\n".join([
-        "# python/tessel/catalogue.py: written by tools/make_catalogue.py; change the module.",
-        '"""The errors of the module: catalogue, words of statuses, and who raises what."""',
+        "# python/tessel/catalogue.py: written by tools/make_catalogue.py; change the sources.",
+        '"""The errors of the module, with the words of statuses and who raises what; and those of',
+        'the host, the guard and this package."""',
         "",
         "ROWS: dict[str, tuple[str, str]] = {",
         *(row(name, *each) for name, each in rows().items()),
@@ -187,6 +252,17 @@ def made() -> str:
           for name, each in operations().items()),
         "}",
         '"""The rows of an operation, or of the numeric members of a family."""',
+        "",
+        *table("HOST", "The host's errors, each with the beginning of its message.", host()),
+        *table("GUARD", "What the guard refuses.", guard()),
+        *table("GIVEN", "What Python makes no argument of.",
+               refusals("to_host.cpp", "python_classes.cpp")),
+        *table("RETURNED", "What Python makes nothing of that a call gives.",
+               refusals("to_python.cpp")),
+        "PACKAGE: tuple[str, ...] = (",
+        *(f'    "{each}",' for each in package()),
+        ")",
+        '"""Every identifier of the Python package."""',
     ]) + "\n"
 
 

@@ -16,9 +16,9 @@ from collections.abc import Callable, Iterable
 from pathlib import Path
 
 from tessel import command, reference
-from tessel.catalogue import STATUSES
+from tessel.catalogue import GUARD, HOST, PACKAGE, STATUSES
 from tessel.errors import built_in_of, word_of
-from tessel.meanings import GROUPS
+from tessel.meanings import GROUPS, MEANINGS
 from tessel.operation import Operation
 from tessel.operations import OPERATIONS
 from tessel.reference import Raised
@@ -135,8 +135,9 @@ def man_command() -> str:
                 value = f" {action.metavar}" if action.option_strings and action.metavar else ""
                 term = ", ".join(action.option_strings) or str(action.metavar)
                 parts.append(entry(term + value, f"{action.help}."))
-    parts.append(".SH EXIT STATUS\n" + roff("0 if all is well, 1 if something failed, 2 for wrong "
-                                            "usage; errors are one line on standard error.") + "\n"
+    parts.append(".SH EXIT STATUS\n" + roff(
+        "0 if all is well, 1 if something failed or the command was used wrongly; errors are one "
+        "line on standard error.") + "\n"
                  ".SH SEE ALSO\n.BR tessel\\-open (3),\n.BR tessel\\-errors (7)\n")
     return "".join(parts)
 
@@ -247,11 +248,26 @@ def raisers() -> dict[str, list[Operation]]:
     found: dict[str, list[Operation]] = {}
     for operation in OPERATIONS:
         page = reference.page_of(operation)
-        for each in (*page.raised, *page.guards, *page.refused):
-            found.setdefault(each.identifier, []).append(operation)
-        for each in page.statuses:
-            found.setdefault(f"{each.identifier}<word>", []).append(operation)
+        for errors, end in ((page.raised, ""), *((errors, end)
+                                                 for _, _, errors, end in page.others)):
+            for each in errors:
+                found.setdefault(each.identifier + end, []).append(operation)
     return {identifier: list(dict.fromkeys(each)) for identifier, each in found.items()}
+
+
+def who(operations: list[Operation]) -> str:
+    """Those operations, or what they have in common where they are nearly all."""
+    if len(operations) == len(OPERATIONS):
+        return "Every operation."
+    if operations == [each for each in OPERATIONS if each.arguments]:
+        return "Every operation that has arguments."
+    return " ".join(map(link, operations))
+
+
+def advice(identifier: str) -> str:
+    """What the word of an identifier means, and what to do."""
+    meaning, remedy = MEANINGS[word_of(identifier)]
+    return f"{rst(meaning)} What to do: {rst(remedy)}"
 
 
 def rst_index() -> str:
@@ -266,14 +282,18 @@ def rst_index() -> str:
             also = built_in_of(word)
             parts.append(f"   {word}\n      {f'*({also.__name__})* ' if also else ''}{rst(meaning)}"
                          f"\n\n      What to do: {rst(remedy)}\n\n")
-    parts.append(title("All identifiers of the module", "-") +
-                 "Where a ``<word>`` is, a status's word is appended: those of `What the netCDF "
-                 "library refuses`_ and `What the system refuses`_.\n\n")
-    every = {each.identifier: "every call, before its operation is found"
-             for each in reference.every_call()}
-    for identifier, operations in sorted(raisers().items()):
-        every[identifier] = " ".join(map(link, operations))
-    parts += [f"{code(identifier)}\n   {who}\n\n" for identifier, who in sorted(every.items())]
+    parts.append(title("All identifiers", "-") +
+                 "Each with the operations that raise it; those of the host, of the guard and of "
+                 "the Python package with what they mean, too. Where a ``<word>`` is, a status's "
+                 "word is appended: those of `What the netCDF library refuses`_ and "
+                 "`What the system refuses`_.\n\n")
+    said = {identifier: [advice(identifier)] for identifier in (*HOST, *GUARD, *PACKAGE)}
+    for each in reference.every_call():
+        said.setdefault(each.identifier, []).append("Every call, before its operation is found.")
+    for identifier, operations in raisers().items():
+        said.setdefault(identifier, []).append(who(operations))
+    parts += [f"{code(identifier)}\n   " + "\n\n   ".join(texts) + "\n\n"
+              for identifier, texts in sorted(said.items())]
     parts.append(title("All words of statuses", "-") + "".join(
         f"* {status}: :term:`{word}`\n" for status, word in sorted(STATUSES.items())))
     return "".join(parts)

@@ -1,5 +1,6 @@
-# python/tessel/catalogue.py: written by tools/make_catalogue.py; change the module.
-"""The errors of the module: catalogue, words of statuses, and who raises what."""
+# python/tessel/catalogue.py: written by tools/make_catalogue.py; change the sources.
+"""The errors of the module, with the words of statuses and who raises what; and those of
+the host, the guard and this package."""
 
 ROWS: dict[str, tuple[str, str]] = {
     "abort": (
@@ -766,3 +767,146 @@ RAISES: dict[str, tuple[str, ...]] = {
     ),
 }
 """The rows of an operation, or of the numeric members of a family."""
+
+HOST: dict[str, str] = {
+    "TESSEL:host:outOfMemory":
+        "Out of memory.",
+    "TESSEL:host:dimensionsTooLarge":
+        "The dimensions of the array are too large.",
+    "TESSEL:host:badDimensions":
+        "An array needs at least one dimension.",
+    "TESSEL:host:badClass":
+        "The class of the array is not one that this works with.",
+    "TESSEL:host:badIndex":
+        "The index is beyond the end of the array.",
+    "TESSEL:host:badOwner":
+        "The array is not the call's own: it is an input, or has been given away before.",
+    "TESSEL:host:noCall":
+        "The function is for a module that is being called.",
+    "TESSEL:host:nestedCall":
+        "A module cannot be called from within a call.",
+    "TESSEL:host:badOutputCount":
+        "A call has 0 to 8 outputs.",
+    "TESSEL:host:tooManyInputs":
+        "The call has too many inputs.",
+    "TESSEL:host:missingInput":
+        "An input of the call is not there.",
+    "TESSEL:host:foreignException":
+        "An exception that is not the host's left the module",
+    "TESSEL:host:violation":
+        "The module broke a promise",
+    "TESSEL:host:moduleNotFound":
+        "there is no such file; looked for a shared object that exports tsxFunction",
+    "TESSEL:host:notAModule":
+        "it is not a shared object that can be loaded; looked for one that exports tsxFunction",
+    "TESSEL:host:noEntryPoint":
+        "it does not export the entry point tsxFunction",
+}
+"""The host's errors, each with the beginning of its message."""
+
+GUARD: dict[str, str] = {
+    "TESSEL:guard:alignment":
+        "The call was not made: <particulars>, and the library divides by the alignment "
+        "of the data and of the records, which must be at least 1 (4 is the usual one).",
+    "TESSEL:guard:mode":
+        "The call was not made: <particulars>, and the library follows an invalid "
+        "pointer when it is given this mode flag without what belongs to it.",
+    "TESSEL:guard:closed":
+        "The call was not made: <particulars>, and an earlier closing of the dataset "
+        "failed, and the library may have freed its memory but not its id.",
+    "TESSEL:guard:counts":
+        "The call was not made: <particulars>, and the library would write what is "
+        "beyond the data, or for ever.",
+    "TESSEL:guard:records":
+        "The call was not made: <particulars>, and every record before it would be "
+        "filled first; with set_fill(ncid, NC_NOFILL) they are left as they are.",
+    "TESSEL:guard:header":
+        "The call was not made: <particulars>, and the library would trust the header.",
+    "TESSEL:guard:remote":
+        "The call was not made: <particulars>, and the library would fetch it; addresses "
+        "are to be allowed first.",
+}
+"""What the guard refuses."""
+
+GIVEN: dict[str, str] = {
+    "TESSEL:python:integerTooLarge":
+        "An integer is beyond 64 bits and no double holds it exactly.",
+    "TESSEL:python:characterTooLarge":
+        "An element of a character array is beyond the 16 bits of a host character.",
+    "TESSEL:python:notRepresentable":
+        "An integer in a list of numbers is not exact as a double; use a NumPy array of "
+        "a 64-bit integer type.",
+    "TESSEL:python:badShape":
+        "The lengths of a shape are whole numbers from 0.",
+    "TESSEL:python:nestedTooDeeply":
+        "A value contains itself or is nested more than <the most> levels deep.",
+    "TESSEL:python:unsupportedType":
+        'A value of type "<the type>" has no counterpart in the host.',
+    "TESSEL:python:maskedArray":
+        'A masked array has no counterpart in the host; pass what its method "filled" gives.',
+    "TESSEL:python:unsupportedDtype":
+        'A NumPy array of dtype "<the dtype>" has no counterpart in the host.',
+    "TESSEL:python:badFieldName":
+        'A field of a structure is named by a value of type "<the type>" instead of a str.',
+    "TESSEL:python:differentFields":
+        "The dicts of a structure array have different keys.",
+    "TESSEL:python:notText":
+        "A name contains half of a surrogate pair.",
+}
+"""What Python makes no argument of."""
+
+RETURNED: dict[str, str] = {
+    "TESSEL:python:tooManyDimensions":
+        "A result has <the number> dimensions; a NumPy array can have <the most>.",
+    "TESSEL:python:shapeTooLarge":
+        "NumPy cannot represent the dimensions of a result.",
+    "TESSEL:python:unsupportedResult":
+        'A complex result of class "<the class>" has no counterpart in NumPy.',
+    "TESSEL:python:nestedTooDeeply":
+        "A result is nested more than <the most> levels deep.",
+}
+"""What Python makes nothing of that a call gives."""
+
+PACKAGE: tuple[str, ...] = (
+    "TESSEL:python:badBlockSize",
+    "TESSEL:python:badCountLength",
+    "TESSEL:python:badDimensions",
+    "TESSEL:python:badEncoding",
+    "TESSEL:python:badFieldName",
+    "TESSEL:python:badFormat",
+    "TESSEL:python:badFunctionName",
+    "TESSEL:python:badGuard",
+    "TESSEL:python:badIndex",
+    "TESSEL:python:badMode",
+    "TESSEL:python:badModuleName",
+    "TESSEL:python:badPath",
+    "TESSEL:python:badShape",
+    "TESSEL:python:badStartLength",
+    "TESSEL:python:characterTooLarge",
+    "TESSEL:python:differentFields",
+    "TESSEL:python:fileChanged",
+    "TESSEL:python:fileExists",
+    "TESSEL:python:fileTooShort",
+    "TESSEL:python:indexExceedsDimensionBound",
+    "TESSEL:python:integerTooLarge",
+    "TESSEL:python:maskedArray",
+    "TESSEL:python:namedArgument",
+    "TESSEL:python:nestedTooDeeply",
+    "TESSEL:python:notAClassicFile",
+    "TESSEL:python:notARegularFile",
+    "TESSEL:python:notExact",
+    "TESSEL:python:notRepresentable",
+    "TESSEL:python:notText",
+    "TESSEL:python:nothingToDraw",
+    "TESSEL:python:readOnlyArray",
+    "TESSEL:python:recordsWithoutVariables",
+    "TESSEL:python:sameFile",
+    "TESSEL:python:shapeTooLarge",
+    "TESSEL:python:tooManyDimensions",
+    "TESSEL:python:unknownOperation",
+    "TESSEL:python:unsupportedDtype",
+    "TESSEL:python:unsupportedResult",
+    "TESSEL:python:unsupportedType",
+    "TESSEL:python:valueDoesNotFit",
+)
+"""Every identifier of the Python package."""

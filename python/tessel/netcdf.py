@@ -35,11 +35,11 @@ import numpy
 from numpy import ndarray
 from numpy.typing import NDArray
 
-from tessel import errors, paths
+from tessel import errors, paths, reference
 from tessel._runtime import Module, call, call_ints
 from tessel.arguments import code, file_path, identifiers, integer, numbers, vector
 from tessel.operation import Operation
-from tessel.operations import EXAMPLE_BEGINNING, OPERATIONS
+from tessel.operations import OPERATIONS
 
 Indices = Union[SupportsIndex, Sequence[SupportsIndex], NDArray[Any]]
 """Positions, counts, strides, dimensions."""
@@ -191,7 +191,7 @@ def _add_methods() -> None:
     exec(compile(source, "<the methods of tessel.netcdf.Netcdf>", "exec"), _SCOPE)
     for each in OPERATIONS:
         written = _SCOPE.pop(each.short)
-        text = each.documentation(EXAMPLE_BEGINNING)
+        text = reference.docstring_of(each)
         for name in each.names:
             code = written.__code__.replace(co_name=name, co_qualname=f"Netcdf.{name}")
             method = FunctionType(code, _SCOPE, name)

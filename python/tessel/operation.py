@@ -3,12 +3,7 @@
 
 from __future__ import annotations
 
-import textwrap
-from collections.abc import Iterable
 from dataclasses import dataclass
-from functools import cache
-
-from tessel.errors import built_in_of, word_of
 
 Errors = tuple[tuple[str, str], ...]
 """Pairs of an identifier (or the end of one) and what causes it."""
@@ -138,39 +133,3 @@ class Operation:
         arguments = ((identifier, f"{' or '.join(dict.fromkeys(names))} {cause}")
                      for (identifier, cause), names in blamed.items())
         return *self.errors[:1], *arguments, *self.errors[1:]
-
-    def documentation(self, beginning: str) -> str:
-        """The docstring of the method."""
-        sections = [self.purpose]
-        if self.notes:
-            sections.append(_filled(self.notes))
-        if self.arguments:
-            sections.append(_section("Parameters", (
-                f"{each.name} : {each.kind.wording}\n{_filled(each.meaning, 4)}"
-                for each in self.arguments)))
-        if self.results:
-            sections.append(_section("Returns", (
-                f"{each.name} : {each.kind.wording}\n{_filled(each.meaning, 4)}"
-                for each in self.results)))
-        if self.errors:
-            sections.append(_section("Raises", ["tessel.Error\n" + "\n".join(
-                _filled(f"{_shown(identifier)}: {cause}", 4, 8)
-                for identifier, cause in self.all_errors)]))
-        sections.append(_section("Examples", [beginning + self.example.strip()]))
-        return "\n\n".join(sections) + "\n"
-
-
-def _shown(identifier: str) -> str:
-    built_in = built_in_of(word_of(identifier))
-    return f"{identifier} ({built_in.__name__})" if built_in else identifier
-
-
-def _section(title: str, entries: Iterable[str]) -> str:
-    return "\n".join([title, "-" * len(title), *entries])
-
-
-@cache
-def _filled(text: str, indent: int = 0, hanging: int | None = None) -> str:
-    return textwrap.fill(" ".join(text.split()), 92, initial_indent=" " * indent,
-                         subsequent_indent=" " * (indent if hanging is None else hanging),
-                         break_long_words=False, break_on_hyphens=False)

@@ -1,8 +1,8 @@
 # python/tessel/reference.py: the pages of the reference, one an operation.
 """Puts together what the table of operations, the module's catalogue and the meanings of words say.
 
-`tessel ops NAME` prints a page as text; tools/make_reference.py writes manual pages and the pages
-of the book.
+`tessel ops NAME` prints a page as text, the methods have docstrings of the same; and
+tools/make_reference.py writes manual pages and the pages of the book.
 """
 
 from __future__ import annotations
@@ -10,8 +10,9 @@ from __future__ import annotations
 import textwrap
 from collections.abc import Iterable, Iterator
 from dataclasses import dataclass
+from functools import cache
 
-from tessel.catalogue import RAISES, ROWS, STATUSES
+from tessel.catalogue import GIVEN, GUARD, HOST, RAISES, RETURNED, ROWS, STATUSES
 from tessel.errors import built_in_of, word_of
 from tessel.families import MEMBERS
 from tessel.kinds import SIZE
@@ -49,8 +50,6 @@ _WANTED = {"double": "double precision", "single": "single precision"}
 
 # Rows that the table of operations gives no cause for, because they speak of the host.
 _CAUSES = {
-    "nameExtractionFailure": "the host has no memory for the text",
-    "modeExtractionFailure": "the host has no memory for the text",
     "readBufferFailure": "the host has no memory for the text",
     "writeBufferFailure": "the host has no memory for the text",
     "getVarsDimids": "the library cannot say which dimensions the variable has",
@@ -67,13 +66,24 @@ _OWN = {
 EVERY_CALL = ("tooFewArguments", "firstArgNotChar", "invalidOperation")
 """The rows that a call raises before it has found its operation."""
 
+# What else a call raises before it has found its operation: the host in any language, and Python.
+_BEFORE_THE_MODULE = {
+    **{identifier: HOST[identifier] for identifier in (
+        "TESSEL:host:nestedCall", "TESSEL:host:badOutputCount", "TESSEL:host:tooManyInputs",
+        "TESSEL:host:missingInput")},
+    "TESSEL:python:namedArgument": "Operations take their arguments by position.",
+}
+
 # Rows that are guards: the conditions before them leave them no case.
 _NEVER = {"unhandledNumericType", "numberOfDimensionsOutOfBounds", "ndimsOutOfRange",
-          "sizeNotRepresentable", "unhandledFuncstr"}
+          "sizeNotRepresentable", "unhandledFuncstr", "nameExtractionFailure",
+          "modeExtractionFailure"}
 
 
 STATUS_NOTE = (f"For any other status of the library, the identifier ends with that status's word, "
                f"one of {len(set(STATUSES.values())) + 1}; the index of errors explains them.")
+AROUND_NOTE = ("Raised around the module: by the host (TESSEL:host:*), and by what makes its "
+               "arrays of Python's values and the other way round (TESSEL:python:*):")
 GUARDS_NOTE = "In the code, and reached by no call:"
 REFUSED_NOTE = "Refused by the guard, which Python installs and C++ programs may:"
 
@@ -97,6 +107,9 @@ class Page:
     statuses: tuple[Raised, ...]
     """The failures of its library calls; a status's word follows each identifier."""
 
+    around: tuple[Raised, ...]
+    """What the host and the Python package raise themselves."""
+
     guards: tuple[Raised, ...]
     """What stands in the code and no call reaches."""
 
@@ -108,6 +121,7 @@ class Page:
         """What there is beside `raised`: title, note, errors, and the end of each identifier."""
         for title, note, errors, end in (
                 ("Other statuses", STATUS_NOTE, self.statuses, "<word>"),
+                ("From the host and the front", AROUND_NOTE, self.around, ""),
                 ("The guard", REFUSED_NOTE, self.refused, ""),
                 ("Guards inside", GUARDS_NOTE, self.guards, "")):
             if errors:
@@ -140,9 +154,12 @@ def _labels(operation: Operation, template: str) -> list[str]:
 def _messages(operation: Operation, row: str) -> Iterator[tuple[str, str]]:
     """The identifiers of a row, with their messages, as the operation raises them."""
     identifier, message = ROWS[row]
-    labels = _labels(operation, identifier)
     fillings = ((LIBRARY_TEXT,) if row.endswith(".failure")
                 else _FILLINGS.get(row, ("{short}",) if "%" in message else ()))
+    if not fillings and "{" not in identifier:
+        yield identifier, message
+        return
+    labels = _labels(operation, identifier)
     wanted = next((each.host_class for each in MEMBERS
                    if operation.short.endswith(f"_{each.suffix}")), "")
     for group in labels if "{label}" in identifier else ["|".join(labels)]:
@@ -179,13 +196,33 @@ def page_of(operation: Operation) -> Page:
         found = messages.get(identifier) or [each.message for each in statuses
                                              if each.identifier == tag]
         raised.append(Raised(identifier, _OWN.get(identifier) or " / ".join(found), cause))
-    return Page(tuple(raised), tuple(statuses), tuple(guards), tuple(_refused(operation)))
+    return Page(tuple(raised), tuple(statuses), _around(
+        operation.short.startswith(("get_var_", "get_vara_", "get_vars_")),
+        bool(operation.arguments)), tuple(guards), tuple(_refused(operation)))
+
+
+@cache
+def _explained(identifier: str, message: str) -> Raised:
+    return Raised(identifier, message, MEANINGS[word_of(identifier)][0])
+
+
+@cache
+def _around(shaped: bool, given: bool) -> tuple[Raised, ...]:
+    """What is raised by the host and by conversions: of arguments, which may be anything, and of a
+    result that has the shape of a variable or of a block."""
+    host = ["TESSEL:host:outOfMemory", *(["TESSEL:host:dimensionsTooLarge"] if shaped else [])]
+    result = ["TESSEL:python:tooManyDimensions", "TESSEL:python:shapeTooLarge"] if shaped else []
+    found = {**{each: HOST[each] for each in host}, **(GIVEN if given else {}),
+             **{each: RETURNED[each] for each in result}}
+    return tuple(_explained(*each) for each in found.items())
 
 
 def _refused(operation: Operation) -> Iterator[Raised]:
+    """What the guard looks for before the operation."""
     short = operation.short
     words = {
-        "remote": operation.opens, "mode": operation.opens, "header": short in ("open", "_open"),
+        "remote": operation.opens, "mode": operation.opens,
+        "header": short in ("open", "_open", "sync"),
         "alignment": short == "_enddef",
         "counts": short.startswith(("put_vara_", "put_vars_")),
         "records": short.startswith(("put_var1_", "put_vara_", "put_vars_")),
@@ -193,14 +230,13 @@ def _refused(operation: Operation) -> Iterator[Raised]:
     }
     for word, may in words.items():
         if may:
-            yield Raised(f"TESSEL:guard:{word}",
-                         "The call was not made: <particulars>, and <reason>.", MEANINGS[word][0])
+            yield _explained(f"TESSEL:guard:{word}", GUARD[f"TESSEL:guard:{word}"])
 
 
 def every_call() -> tuple[Raised, ...]:
     """What a call raises before it has found its operation."""
-    return tuple(Raised(ROWS[row][0], ROWS[row][1].replace("%s", "<the name>"),
-                        MEANINGS[word_of(ROWS[row][0])][0]) for row in EVERY_CALL)
+    rows = {ROWS[row][0]: ROWS[row][1].replace("%s", "<the name>") for row in EVERY_CALL}
+    return tuple(map(_explained, *zip(*(rows | _BEFORE_THE_MODULE).items())))
 
 
 def host_call(operation: Operation) -> str:
@@ -252,6 +288,7 @@ def _taken(annotation: str, host: str) -> str:
     return f".elements<{element}>()" if element else ".utf8()"
 
 
+@cache
 def shown(identifier: str) -> str:
     """An identifier, with the built-in exception that it also is in Python."""
     built_in = built_in_of(word_of(identifier))
@@ -287,6 +324,31 @@ def text_of(operation: Operation) -> str:
     return "\n\n".join(parts) + "\n"
 
 
+def docstring_of(operation: Operation) -> str:
+    """The docstring of the operation's method: the page without the calls, and without the messages
+    of errors."""
+    page = page_of(operation)
+    parts = [operation.purpose]
+    if operation.notes:
+        parts.append(_filled(operation.notes))
+    for title, entries in given_and_taken(operation):
+        parts.append(_section({"Arguments": "Parameters", "Results": "Returns"}[title], "\n".join(
+            f"{each.name} : {each.kind.wording}\n{_filled(each.meaning, '    ')}"
+            for each in entries)))
+    errors = [_named(page.raised)]
+    errors += [f"{_filled(note, '    ')}\n{_named(found, end)}"
+               for _, note, found, end in page.others]
+    parts.append(_section("Raises", "\n".join(["tessel.Error", *filter(None, errors)])))
+    parts.append(_section("Examples", example_of(operation)))
+    return "\n\n".join(parts) + "\n"
+
+
+@cache
+def _named(errors: tuple[Raised, ...], end: str = "") -> str:
+    return "\n".join(_wrapped(f"{shown(each.identifier + end)}: {each.cause}", "    ", "        ")
+                     for each in errors)
+
+
 def _listed(errors: Iterable[Raised], end: str = "") -> str:
     return "\n".join(f"{shown(each.identifier + end)}\n{_filled(each.cause, '    ')}\n"
                      f"{_wrapped(each.message, '    ')}" for each in errors)
@@ -296,10 +358,16 @@ def _section(title: str, body: str) -> str:
     return f"{title}\n{'-' * len(title)}\n{body}"
 
 
+def _joined(text: str) -> str:
+    return " ".join(text.split())
+
+
 def _filled(text: str, indent: str = "") -> str:
-    return _wrapped(" ".join(text.split()), indent)
+    return _wrapped(_joined(text), indent)
 
 
-def _wrapped(text: str, indent: str) -> str:
-    return textwrap.fill(text, 92, initial_indent=indent, subsequent_indent=indent,
+@cache
+def _wrapped(text: str, indent: str, hanging: str | None = None) -> str:
+    return textwrap.fill(text, 92, initial_indent=indent,
+                         subsequent_indent=indent if hanging is None else hanging,
                          break_long_words=False, break_on_hyphens=False)

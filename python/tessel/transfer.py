@@ -228,9 +228,11 @@ def _selection(dataset: Dataset, variable: Variable, start: Sequence[int] | None
     first = [0] * len(lengths) if start is None else _whole_numbers("start", start)
     counts = ([length - begin for length, begin in zip(lengths, first)] if count is None
               else _whole_numbers("count", count))
-    for what, vector in (("Start", first), ("Count", first if count is None else counts)):
+    for what, identifier, vector in (
+            ("Start", "TESSEL:python:badStartLength", first),
+            ("Count", "TESSEL:python:badCountLength", first if count is None else counts)):
         if len(vector) != len(lengths):
-            raise dataset.refusal(f"TESSEL:python:bad{what}Length",
+            raise dataset.refusal(identifier,
                                   f"{what} has {len(vector)} elements, and {name} "
                                   f"{len(lengths)} dimensions.", variable)
     if any(begin < 0 or many < 0 or begin + many > length

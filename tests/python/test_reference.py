@@ -67,6 +67,25 @@ def test_every_text_of_the_catalogue_is_a_row() -> None:
                                                          if each.endswith(":")}
 
 
+def test_nothing_else_that_is_raised_escapes() -> None:
+    """No identifier of the host, the guard or the package is one that the catalogue lacks, and none
+    is put together but by the two functions whose callers give the word."""
+    literals = {identifier for folder in ("runtime/src", "guard/src", "python/src", "python/tessel")
+                for file in (ROOT / folder).rglob("*") if file.suffix in (".cpp", ".hpp", ".py")
+                for identifier in re.findall(r'"(TESSEL:(?:host|guard|python):\w+)"',
+                                             file.read_text())}
+    known = {*catalogue.HOST, *catalogue.GUARD, *catalogue.PACKAGE}
+    assert len(literals) > 50 and literals <= known
+    assert {*catalogue.GIVEN, *catalogue.RETURNED} < set(catalogue.PACKAGE)
+    put_together = [(file.name, line.strip()) for file in (ROOT / "python").rglob("*")
+                    if file.suffix in (".py", ".cpp") for line in file.read_text().splitlines()
+                    if re.search(r'Error\(.*"TESSEL:python:(?!\w+")', line)]
+    assert sorted(put_together) == [
+        ("opening.py", 'error = tessel.Error(f"TESSEL:python:{word}", message, path=path)'),
+        ("python_classes.cpp", 'throw Error(std::string("TESSEL:python:").append(word), message);'),
+    ]
+
+
 def test_every_row_is_on_a_page() -> None:
     on_pages = {row for each in OPERATIONS for row in reference.rows_of(each)}
     assert on_pages | set(reference.EVERY_CALL) == set(catalogue.ROWS)
@@ -98,7 +117,7 @@ def test_page_has_what_the_code_can_raise(operation: Operation) -> None:
     caused = {each for each in own - expected
               if each[:-len(word_of(each))] in tags and word_of(each) in words}
     assert own == expected | caused
-    for each in (*page.raised, *page.statuses, *page.guards, *page.refused):
+    for each in (*page.raised, *page.statuses, *page.around, *page.guards, *page.refused):
         assert each.cause and each.message and not re.search(r"%[sduf]|[{}]", each.message)
 
 
@@ -149,7 +168,7 @@ def test_the_same_everywhere(operation: Operation) -> None:
     man = MAN[f"man3/tessel-{operation.short}.3"].replace("\\-", "-").replace("\\e", "\\")
     rst = RST[f"{operation.short}.rst"]
     for form in (text, man, rst):
-        for each in (*page.raised, *page.statuses, *page.guards, *page.refused):
+        for each in (*page.raised, *page.statuses, *page.around, *page.guards, *page.refused):
             assert each.identifier in form
         for each in (*operation.arguments, *operation.results):
             assert each.name in form and each.kind.host in form
@@ -167,6 +186,13 @@ def test_the_index_has_all() -> None:
             assert f"\n``{identifier}``\n" in index
     for each in reference.every_call():
         assert f"\n``{each.identifier}``\n" in index
+    explained = {*catalogue.HOST, *catalogue.GUARD, *catalogue.PACKAGE}
+    assert len(explained) > 60
+    for identifier in explained:
+        assert f"\n``{identifier}``\n   {make_reference.advice(identifier)}\n" in index
+    assert "\nAll identifiers\n" in index
+    assert ("``TESSEL:host:outOfMemory``\n   There is no memory left. What to do: Read or write by "
+            "smaller blocks.\n\n   Every operation.\n") in index
     assert {f"{each.short}.rst" for each in OPERATIONS} < set(RST)
     assert sum(map(len, make_reference.by_subject().values())) == 102
     assert all(make_reference.by_subject().values())
@@ -184,6 +210,26 @@ def test_manual_pages_are_clean(tmp_path: Path) -> None:
     for name in ("info", "plot", "copy", "check", "ops"):
         assert f".SS {name}\n" in whole
     assert command.parser().prog == "tessel"
+
+
+@pytest.mark.parametrize("arguments, what", [
+    (["ops", "open"], "all is well"),
+    (["info", "missing.nc"], "something failed"),
+    (["ops", "nothing"], "something failed"),
+    ([], "the command was used wrongly"),
+    (["nothing"], "the command was used wrongly"),
+    (["info"], "the command was used wrongly"),
+    (["copy", "a.nc", "b.nc", "--format", "nothing"], "the command was used wrongly"),
+    (["info", "a.nc", "--guard", "nothing"], "the command was used wrongly"),
+])
+def test_the_status_is_what_the_page_says(arguments: list[str], what: str) -> None:
+    [text] = re.findall(r"^\.SH EXIT STATUS\n(.*?);", MAN["man1/tessel.1"], re.M)
+    said = {each: int(number) for number, causes in re.findall(r"(\d+) if ([^,\d]*)", text)
+            for each in causes.split(" or ")}
+    assert set(said) == {"all is well", "something failed", "the command was used wrongly"}
+    run = subprocess.run([sys.executable, "-B", "-m", "tessel", *arguments], check=False,
+                         capture_output=True, text=True)
+    assert (run.returncode, len(run.stderr.splitlines())) == (said[what], said[what])
 
 
 def test_calls_in_cpp_compile(tmp_path: Path) -> None:
