@@ -1,13 +1,14 @@
 # bench/all.py: every measurement, one after the other, and the tables and the chart made of them.
 """Runs the measuring programs and rewrites what the documents show of them.
 
-usage: bench/all [--quick | --tables] [PROGRAM...]
+usage: bench/all [--quick | --tables] [--built FOLDER] [PROGRAM...]
 
 bench/all is this program with the interpreter and the package of the build. Each measuring program
 puts its table into its document, and its numbers into build/release/bench/results. From those come
-docs/performance.md's tables and docs/performance.svg. It takes most of an hour; run it on a machine
-that does nothing else. PROGRAM runs only those named, --tables none at all, and the rest of the
-numbers are those of the last time. --quick tries everything out and writes no document.
+docs/performance.md's tables, docs/performance.svg and the short table of growth. It takes most of an
+hour; run it on a machine that does nothing else. PROGRAM runs only those named, --tables none at all,
+and the rest of the numbers are those of the last time. --quick tries everything out and writes no
+document. --built says where the programs in C++ are, if not in build/release/bench.
 """
 
 from __future__ import annotations
@@ -19,13 +20,13 @@ import time
 from pathlib import Path
 from typing import NamedTuple
 
+import growth
 from chart import draw
 from expectations import ROWS, missed_without_reason, table
 from measuring import put_between_marks
 from results import Results
 
 PROJECT = Path(__file__).resolve().parent.parent
-BUILD = PROJECT / "build/release/bench"
 DOCS = PROJECT / "docs"
 PICTURE = "![What calls and transfers cost, beside what is expected](performance.svg)"
 
@@ -44,12 +45,12 @@ class Program(NamedTuple):
         """The file of its numbers."""
         return folder / f"{Path(self.name).stem}.json"
 
-    def command(self, folder: Path, quick: bool) -> list[str]:
+    def command(self, built: Path, folder: Path, quick: bool) -> list[str]:
         """How it is run, from the project's folder."""
         numbers = self.numbers(folder)
         start = [sys.executable, "-B", str(PROJECT / "bench" / self.name), f"--json={numbers}"] \
             if self.in_python else \
-            [str(BUILD / self.name), f"--benchmark_out={numbers}", "--benchmark_out_format=json"]
+            [str(built / self.name), f"--benchmark_out={numbers}", "--benchmark_out_format=json"]
         return [*start, *(["--quick"] if quick else ["--write", str(DOCS / self.document)])]
 
 
@@ -64,14 +65,14 @@ PROGRAMS = [
 ]
 
 
-def run(programs: list[Program], folder: Path, quick: bool) -> None:
+def run(programs: list[Program], built: Path, folder: Path, quick: bool) -> None:
     """Runs them, with what they say in the folder as well."""
     folder.mkdir(parents=True, exist_ok=True)
     for program in programs:
         print(f"{program.name:20}", end="", flush=True)
         start = time.monotonic()
         with open(program.numbers(folder).with_suffix(".log"), "w+") as log:
-            status = subprocess.run(program.command(folder, quick), cwd=PROJECT, check=False,
+            status = subprocess.run(program.command(built, folder, quick), cwd=PROJECT, check=False,
                                     stdout=log, stderr=subprocess.STDOUT).returncode
             if status != 0:
                 log.seek(0)
@@ -88,26 +89,33 @@ def main() -> int:
                       help="try everything out; the numbers say nothing and go to no document")
     only.add_argument("--tables", action="store_true",
                       help="measure nothing, and write docs/performance.* from the last numbers")
+    parser.add_argument("--built", type=Path, default=PROJECT / "build/release/bench",
+                        help="the folder of the programs in C++")
     options = parser.parse_args()
     for unknown in set(options.program) - set(names):
         parser.error(f"there is no {unknown}")
     chosen = [names[each] for each in options.program] or PROGRAMS
-    folder = BUILD / ("quick" if options.quick else "results")
-    run([] if options.tables else chosen, folder, options.quick)
+    folder = options.built / ("quick" if options.quick else "results")
+    run([] if options.tables else chosen, options.built, folder, options.quick)
     results = Results({each.name: each.numbers(folder) for each in PROGRAMS
-                       if each.name in {row.program for row in ROWS}})
+                       if each.name in {growth.PROGRAM, *(row.program for row in ROWS)}})
     text = f"{PICTURE}\n\n{table(results)}"
-    print(text)
+    of_growth = growth.table(results)
+    print(text, of_growth, sep="\n\n")
     if options.quick:
         draw(results, folder / "performance.svg")
         print("\nTried out only: these numbers are no measurement.")
         return 0
     put_between_marks(DOCS / "performance.md", "bench/all", text)
+    put_between_marks(DOCS / "measurements.md", "bench/all, growth", of_growth)
     draw(results, DOCS / "performance.svg")
+    growing = growth.growing(results)
+    for series in growing:
+        print(f"grows faster than its work: {series}", file=sys.stderr)
     unexplained = missed_without_reason(results)
     for row in unexplained:
         print(f"missed, and bench/expectations.py has no reason: {row}", file=sys.stderr)
-    return 1 if unexplained else 0
+    return 1 if unexplained or growing else 0
 
 
 if __name__ == "__main__":

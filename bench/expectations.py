@@ -85,7 +85,6 @@ REASONS = {
     **{f"{each}, text of 64 MiB": ZEROS
        for each in ("get_var", "get_vara", "get_att", "put_var", "put_vara", "put_att")},
     **{f"{each}, numbers of 64 MiB": UNCOPIED for each in BLOCKS},
-    "get_var_double of 256 MiB": UNCOPIED,
 }
 
 
@@ -116,6 +115,8 @@ ROWS = (
     *(of_family(each, "64MiB", ("text",), times(1.25)) for each in BLOCKS),
     from_python("one element, one after the other, call", one_of(30)),
     from_python("one element, one after the other, method", one_of(20)),
+    from_python("ten elements, one after the other, call", one_of(30)),
+    from_python("ten elements, one after the other, method", one_of(20)),
     from_python("whole read", times(1)),
     from_python("whole write, to a new file", times(1)),
 )

@@ -22,7 +22,6 @@ using namespace tessel;
 using bench::check;
 using bench::Pair;
 
-constexpr std::size_t blockBytes = std::size_t{64} << 20U;
 constexpr std::size_t columns = 1024;
 constexpr std::ptrdiff_t step = 2; // of the strided blocks, along the fastest dimension
 
@@ -85,8 +84,9 @@ class Datasets {
 template <class T>
 class Type {
   public:
-    Type(const Module &module, const Datasets &sets, const Library<T> &functions)
-        : netcdf(module), datasets(sets), library(functions) {
+    Type(const Module &module, const Datasets &sets, const Library<T> &functions,
+         std::size_t sizeOfBlocks)
+        : netcdf(module), datasets(sets), library(functions), blockBytes(sizeOfBlocks) {
         std::array<int, 2> dims{};
         define("rows", rows, dims[0]);
         define("columns", columns, dims[1]);
@@ -148,11 +148,8 @@ class Type {
     }
 
   private:
-    static constexpr std::size_t elements = blockBytes / sizeof(T);
-    static constexpr std::size_t rows = elements / columns;
     static constexpr std::array<std::size_t, 2> origin = {0, 0};
     static constexpr std::array<std::size_t, 2> single = {1, 1};
-    static constexpr std::array<std::size_t, 2> count = {rows, columns};
     static constexpr std::array<std::ptrdiff_t, 2> stride = {1, step};
 
     [[nodiscard]] int data() const { return datasets.data; }
@@ -207,8 +204,8 @@ class Type {
 
     /// New memory of the kind that results have, for the library to fill.
     template <class Fill>
-    static std::function<void()> intoNew(const Fill &fill) {
-        return [fill] {
+    std::function<void()> intoNew(const Fill &fill) const {
+        return [fill, this] {
             const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{blockBytes, 1});
             check(fill(static_cast<T *>(memory.data())));
         };
@@ -314,8 +311,8 @@ class Type {
     /// A read of text with all that it takes: a zero-filled buffer of so many bytes a character for
     /// the library, and a zero-filled result of the host's characters.
     template <class Fill>
-    static std::function<void()> widening(std::size_t unit, const Fill &fill) {
-        return [unit, fill] {
+    std::function<void()> widening(std::size_t unit, const Fill &fill) const {
+        return [unit, fill, this] {
             const Array result = Array::characters(count);
             const Array buffer = Array::logical(std::array{elements + 1, unit});
             auto *const bytes = static_cast<char *>(buffer.data());
@@ -423,7 +420,11 @@ class Type {
     const Module &netcdf;
     const Datasets &datasets;
     const Library<T> &library;
-    int block = -1; ///< 64 MiB
+    std::size_t blockBytes;
+    std::size_t elements = blockBytes / sizeof(T); ///< of a block
+    std::size_t rows = elements / columns;
+    std::array<std::size_t, 2> count = {rows, columns};
+    int block = -1; ///< a block
     int wide = -1;  ///< `step` times as much
     int one = -1;   ///< without dimensions
     std::vector<T> values = std::vector<T>(elements);
@@ -434,12 +435,13 @@ class Type {
 } // namespace
 
 int main(int argc, char **argv) try {
+    const std::size_t blockBytes = std::size_t{bench::isQuick(argc, argv) ? 1U : 64U} << 20U;
     const Module netcdf(TESSEL_NETCDF_MODULE);
     const Datasets datasets;
-    Type<double> ofDoubles(netcdf, datasets, doubles);
-    Type<float> ofFloats(netcdf, datasets, floats);
-    Type<short> ofShorts(netcdf, datasets, shorts);
-    Type<char> ofText(netcdf, datasets, text);
+    Type<double> ofDoubles(netcdf, datasets, doubles, blockBytes);
+    Type<float> ofFloats(netcdf, datasets, floats, blockBytes);
+    Type<short> ofShorts(netcdf, datasets, shorts, blockBytes);
+    Type<char> ofText(netcdf, datasets, text, blockBytes);
     check(nc_enddef(datasets.data));
     std::vector<Pair> pairs;
     const auto fillAndAdd = [&](auto &type) {

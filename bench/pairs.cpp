@@ -11,6 +11,7 @@
 #include <map>
 #include <sstream>
 #include <stdexcept>
+#include <string_view>
 
 namespace tessel::bench {
 namespace {
@@ -134,6 +135,10 @@ void write(const std::string &document, const std::string &title, const std::str
 
 } // namespace
 
+bool isQuick(int argc, char **argv) {
+    return std::find(argv, argv + argc, std::string_view("--quick")) != argv + argc;
+}
+
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs) {
     std::vector<char *> arguments(argv, argv + argc);
     std::string document;
@@ -142,9 +147,8 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         document = *(option + 1);
         arguments.erase(option, option + 2);
     }
-    const auto last = std::remove(arguments.begin(), arguments.end(), std::string("--quick"));
-    const bool quick = last != arguments.end();
-    arguments.erase(last, arguments.end());
+    const bool quick = isQuick(argc, argv);
+    std::erase(arguments, std::string_view("--quick"));
     if (quick && !document.empty()) {
         std::fprintf(stderr, "Numbers that say nothing belong into no document.\n");
         return 1;

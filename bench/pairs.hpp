@@ -41,6 +41,9 @@ struct Pair {
 /// repetitions in the file that `--benchmark_out` names. Gives back main's status.
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
 
+/// Whether `--quick` is on the command line, so that a program can do with less.
+bool isQuick(int argc, char **argv);
+
 /// A call with inputs that are made once, as a program's loop would have them.
 template <class... Inputs>
 std::function<void()> called(const Module &module, Inputs... made) {

@@ -40,6 +40,10 @@ class Results:
             self._rows[program] = of_benchmark(read["benchmarks"]) if "benchmarks" in read \
                 else of_python(read)
 
+    def rows(self, program: str) -> Mapping[str, Mapping[str, float]]:
+        """All rows of a program."""
+        return self._rows[program]
+
     def of(self, program: str, row: str) -> dict[str, float]:
         """The sides of a row."""
         return self._rows[program][row]

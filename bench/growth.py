@@ -1,0 +1,63 @@
+# bench/growth.py: whether a call grows faster than its work, from what bench_scaling measured.
+"""The short table of docs/measurements.md's section on growth."""
+
+from __future__ import annotations
+
+import re
+from typing import NamedTuple
+
+from results import Results
+
+PROGRAM = "bench_scaling"
+
+MOST = 1.5
+"""How many times as large a ratio may become. The work is what the library's function takes for it,
+so that a call which grows with its work keeps its ratio or, where much of it is the call itself,
+comes nearer to one. What grows with the square of its work is many times beyond this."""
+
+
+class Series(NamedTuple):
+    """The same work with more and more of something."""
+
+    what: str
+    counted: str
+    ratios: dict[int, float]
+    """How many times the library's time ours is, by the count."""
+
+    @property
+    def counts(self) -> str:
+        return f"{min(self.ratios):,} to {max(self.ratios):,}"
+
+    @property
+    def first(self) -> float:
+        return self.ratios[min(self.ratios)]
+
+    @property
+    def largest(self) -> float:
+        return max(self.ratios.values())
+
+    @property
+    def grows(self) -> bool:
+        return self.largest > MOST * self.first
+
+
+def all_series(results: Results) -> list[Series]:
+    found: dict[tuple[str, str], dict[int, float]] = {}
+    for name, sides in results.rows(PROGRAM).items():
+        what, counted, count = re.fullmatch(r"(.*), ([a-z ]+): (\d+)", name).groups()
+        found.setdefault((what, counted), {})[int(count)] = sides["module"] / sides["reference"]
+    return [Series(*key, ratios) for key, ratios in found.items()]
+
+
+def growing(results: Results) -> list[str]:
+    """The series that grow faster than their work."""
+    return [f"{each.what}, {each.counted}" for each in all_series(results) if each.grows]
+
+
+def table(results: Results) -> str:
+    lines = ["| what | with the number of | from, to | ratio at first | largest | faster than its "
+             "work |", "|---|---|---:|---:|---:|---|"]
+    lines += [f"| {each.what} | {each.counted} | {each.counts} | {each.first:.2f} | "
+              f"{each.largest:.2f} | {'**yes**' if each.grows else 'no'} |"
+              for each in sorted(all_series(results))]
+    return "\n".join(lines)
