@@ -5,10 +5,10 @@ usage: bench/all [--quick | --tables] [--built FOLDER] [PROGRAM...]
 
 bench/all is this program with the interpreter and the package of the build. Each measuring program
 puts its table into its document, and its numbers into build/release/bench/results. From those come
-docs/performance.md's tables, docs/performance.svg and the short table of growth. It takes most of an
-hour; run it on a machine that does nothing else. PROGRAM runs only those named, --tables none at all,
-and the rest of the numbers are those of the last time. --quick tries everything out and writes no
-document. --built says where the programs in C++ are, if not in build/release/bench.
+docs/performance.md's tables, docs/performance.svg and the short table of growth. It takes most of
+an hour; run it on a machine that does nothing else. PROGRAM runs only those named, --tables none at
+all, and the rest of the numbers are those of the last time. --quick tries everything out and writes
+no document. --built says where the programs in C++ are, if not in build/release/bench.
 """
 
 from __future__ import annotations
@@ -98,9 +98,10 @@ def main() -> int:
     folder = options.built / ("quick" if options.quick else "results")
     run([] if options.tables else chosen, options.built, folder, options.quick)
     results = Results({each.name: each.numbers(folder) for each in PROGRAMS
-                       if each.name in {growth.PROGRAM, *(row.program for row in ROWS)}})
+                       if each.name in {row.program for row in ROWS}})
     text = f"{PICTURE}\n\n{table(results)}"
-    of_growth = growth.table(results)
+    series = growth.all_series(names["bench_scaling"].numbers(folder))
+    of_growth = growth.table(series)
     print(text, of_growth, sep="\n\n")
     if options.quick:
         draw(results, folder / "performance.svg")
@@ -109,9 +110,9 @@ def main() -> int:
     put_between_marks(DOCS / "performance.md", "bench/all", text)
     put_between_marks(DOCS / "measurements.md", "bench/all, growth", of_growth)
     draw(results, DOCS / "performance.svg")
-    growing = growth.growing(results)
-    for series in growing:
-        print(f"grows faster than its work: {series}", file=sys.stderr)
+    growing = [each for each in series if each.grows]
+    for each in growing:
+        print(f"grows faster than its work: {each.what}, {each.counted}", file=sys.stderr)
     unexplained = missed_without_reason(results)
     for row in unexplained:
         print(f"missed, and bench/expectations.py has no reason: {row}", file=sys.stderr)

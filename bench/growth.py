@@ -3,12 +3,12 @@
 
 from __future__ import annotations
 
+import json
 import re
+from pathlib import Path
 from typing import NamedTuple
 
-from results import Results
-
-PROGRAM = "bench_scaling"
+from results import of_benchmark
 
 MOST = 1.5
 """How many times as large a ratio may become. The work is what the library's function takes for it,
@@ -22,7 +22,8 @@ class Series(NamedTuple):
     what: str
     counted: str
     ratios: dict[int, float]
-    """How many times the library's time ours is, by the count."""
+    """How many times the library's time ours is, by the count: of the shortest repetitions, because
+    there are few of the longest reads."""
 
     @property
     def counts(self) -> str:
@@ -41,23 +42,20 @@ class Series(NamedTuple):
         return self.largest > MOST * self.first
 
 
-def all_series(results: Results) -> list[Series]:
+def all_series(numbers: Path) -> list[Series]:
+    """The series in the file of bench_scaling's numbers."""
     found: dict[tuple[str, str], dict[int, float]] = {}
-    for name, sides in results.rows(PROGRAM).items():
+    rows = of_benchmark(json.loads(numbers.read_text())["benchmarks"], "shortest")
+    for name, sides in rows.items():
         what, counted, count = re.fullmatch(r"(.*), ([a-z ]+): (\d+)", name).groups()
         found.setdefault((what, counted), {})[int(count)] = sides["module"] / sides["reference"]
-    return [Series(*key, ratios) for key, ratios in found.items()]
+    return sorted(Series(*key, ratios) for key, ratios in found.items())
 
 
-def growing(results: Results) -> list[str]:
-    """The series that grow faster than their work."""
-    return [f"{each.what}, {each.counted}" for each in all_series(results) if each.grows]
-
-
-def table(results: Results) -> str:
+def table(series: list[Series]) -> str:
     lines = ["| what | with the number of | from, to | ratio at first | largest | faster than its "
              "work |", "|---|---|---:|---:|---:|---|"]
     lines += [f"| {each.what} | {each.counted} | {each.counts} | {each.first:.2f} | "
               f"{each.largest:.2f} | {'**yes**' if each.grows else 'no'} |"
-              for each in sorted(all_series(results))]
+              for each in series]
     return "\n".join(lines)

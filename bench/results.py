@@ -11,12 +11,12 @@ from pathlib import Path
 SECONDS = {"ns": 1e-9, "us": 1e-6, "ms": 1e-3, "s": 1.0}
 
 
-def of_benchmark(runs: list[dict]) -> dict[str, dict[str, float]]:
-    """The median of each side of each row, in seconds of the processor. The name of a run is that
-    of the row and the side, followed by how it was run."""
+def of_benchmark(runs: list[dict], statistic: str = "median") -> dict[str, dict[str, float]]:
+    """A statistic ("median" or "shortest") of each side of each row, in seconds of the processor.
+    The name of a run is that of the row and the side, followed by how it was run."""
     rows: dict[str, dict[str, float]] = {}
     for run in runs:
-        if run.get("aggregate_name") == "median":
+        if run.get("aggregate_name") == statistic:
             name, side = re.match(r"(.*)/(reference|module|steps)/", run["run_name"] + "/").groups()
             rows.setdefault(name, {})[side] = run["cpu_time"] * SECONDS[run["time_unit"]]
     return rows
@@ -39,10 +39,6 @@ class Results:
             read = json.loads(file.read_text())
             self._rows[program] = of_benchmark(read["benchmarks"]) if "benchmarks" in read \
                 else of_python(read)
-
-    def rows(self, program: str) -> Mapping[str, Mapping[str, float]]:
-        """All rows of a program."""
-        return self._rows[program]
 
     def of(self, program: str, row: str) -> dict[str, float]:
         """The sides of a row."""
