@@ -4,6 +4,8 @@
 #include "call/catalogue.hpp"
 #include "convert/number.hpp"
 
+#include <cmath>
+
 namespace tessel::netcdf {
 namespace {
 
@@ -17,11 +19,9 @@ void unpackVector(const tsArray *array, const char *argName, DimensionVector<Wid
     const bool numeric = visitNumeric(array, [&]<class T>(const T *from) {
         for (std::size_t i = 0; i < n; ++i) {
             if constexpr (std::is_same_v<T, double>) {
-                if (tsIsInf(from[i])) {
-                    raise(catalogue::indexArgumentHasInf);
-                }
-                if (tsIsNaN(from[i])) {
-                    raise(catalogue::indexArgumentHasNaN);
+                if (!std::isfinite(from[i])) { // as a rule, the host need not be asked
+                    raise(tsIsInf(from[i]) ? catalogue::indexArgumentHasInf
+                                           : catalogue::indexArgumentHasNaN);
                 }
             }
             out[n - 1 - i] = widened<Wide>(from[i]);
