@@ -6,9 +6,13 @@ from __future__ import annotations
 import argparse
 import contextlib
 import os
+import platform
+import sys
 from collections.abc import Callable, Iterator
-from typing import get_args
+from importlib import metadata
+from typing import Any, get_args
 
+import numpy as np
 import tessel
 from tessel import integrity, notes, operations, reference, show, terminal, wording
 from tessel.dataset import Dataset
@@ -20,10 +24,20 @@ def _open(options: argparse.Namespace) -> Dataset:
     try:
         if options.check:
             integrity.verify(dataset)
+        else:
+            _tell_of_zeros(dataset)
     except BaseException:
         dataset.close()
         raise
     return dataset
+
+
+def _tell_of_zeros(dataset: Dataset) -> None:
+    """Whoever wants a file that was cut off is told what stands for the rest."""
+    missing = integrity.missing(dataset)
+    if missing:
+        print(wording.printable(f"tessel: zeros stand for {missing} bytes that were cut off: "
+                                f"{dataset.place}"), file=sys.stderr)
 
 
 def _info(options: argparse.Namespace) -> None:
@@ -55,6 +69,9 @@ def _copy(options: argparse.Namespace) -> None:
     with tessel.progress_bar(os.path.basename(options.source)) as progress:
         tessel.copy(options.source, options.target, options.format, overwrite=options.overwrite,
                     progress=progress, check=options.check)
+    if not options.check:
+        with Dataset(options.source) as source:
+            _tell_of_zeros(source)
 
 
 def _check(options: argparse.Namespace) -> None:
@@ -89,7 +106,8 @@ def _position(text: str) -> tuple[str, int]:
 
 def _add_check(parser: argparse.ArgumentParser) -> None:
     parser.add_argument("--no-check", dest="check", action="store_false",
-                        help="do not refuse a file that was cut off")
+                        help="do not refuse a file that was cut off: zeros stand for what is "
+                             "gone, in a copy as well, which is complete then")
 
 
 def _add_guard(parser: argparse.ArgumentParser) -> None:
@@ -99,9 +117,33 @@ def _add_guard(parser: argparse.ArgumentParser) -> None:
                              "(remote), or nothing (off); else what TESSEL_GUARD says, or on")
 
 
+def _plain(error: Exception) -> str:
+    """What went wrong, where no file is concerned."""
+    return f"tessel: {terminal.message_of(error)}"
+
+
+class _Version(argparse.Action):
+    """Prints what runs here, for those who report an error."""
+
+    def __call__(self, parser: argparse.ArgumentParser, *_others: Any) -> None:
+        parser.exit(terminal.run(self._print, _plain))
+
+    @staticmethod
+    def _print() -> None:
+        try:
+            version = metadata.version("tessel")
+        except metadata.PackageNotFoundError:  # it runs without having been installed
+            version = "of an unknown version"
+        library = tessel.load("netcdf", guard="off").inq_libvers().partition(" ")[0]
+        print(f"tessel {version}, netCDF library {library}, NumPy {np.__version__}, "
+              f"Python {platform.python_version()}")
+
+
 def parser() -> argparse.ArgumentParser:
     """The command line as its arguments are read; the manual page is made of it as well."""
     whole = terminal.Parser(prog="tessel", description=__doc__)
+    whole.add_argument("--version", action=_Version, nargs=0,
+                       help="print the versions of what runs here")
     commands = whole.add_subparsers(metavar="COMMAND", required=True)
 
     def command(name: str, action: Callable[[argparse.Namespace], None],
@@ -157,7 +199,8 @@ def _line(error: Exception, options: argparse.Namespace) -> str:
         if path is None and error.identifier.startswith(_OF_A_FILE):
             path = getattr(options, "file", getattr(options, "source", None))
         if path:
-            message = ": ".join([terminal.with_file(error.message, path), *notes.instead(error)])
+            message = ": ".join([terminal.with_file(error.message, path),
+                                 *notes.instead(error), *notes.known(error)])
     return f"tessel: {message}"
 
 

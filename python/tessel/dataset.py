@@ -3,6 +3,8 @@
 
 from __future__ import annotations
 
+import os
+import stat
 from collections.abc import Iterator, Mapping, Sequence
 from dataclasses import dataclass, field
 from functools import cached_property
@@ -149,6 +151,20 @@ def host_order(places: Sequence[int]) -> NDArray[Any]:
     return np.array(places[::-1], float)
 
 
+def _judge(path: str, place: str) -> None:
+    """Refuses what is no name, and what whoever opens it would wait for."""
+    if not path:
+        raise tessel.Error("TESSEL:python:badPath", "The file has no name.")
+    try:
+        mode = os.stat(path).st_mode
+    except OSError:  # the module says what is wrong
+        return
+    if not (stat.S_ISREG(mode) or stat.S_ISDIR(mode) or stat.S_ISBLK(mode)):
+        raise tessel.Error("TESSEL:python:notARegularFile",
+                           "The file is no regular file, but a pipe, a socket or a device.",
+                           path=place)
+
+
 class Dataset:
     """An open file. Close it, or use it in a `with` statement.
 
@@ -159,6 +175,7 @@ class Dataset:
         self._netcdf = tessel.load("netcdf")
         self.path = paths.given(path)
         self.place = paths.absolute(self.path)
+        _judge(self.path, self.place)
         self.ncid = self._open()
 
     def _open(self) -> int:

@@ -106,18 +106,28 @@ class Extent(NamedTuple):
 
 def extent(dataset: Dataset) -> Extent | None:
     """The same, with what else is known then."""
-    form = _form(dataset.place)
-    if form is None:
-        return None
-    header = _Header(dataset, form)
-    with open(dataset.place, "rb") as file:
-        found = header.extent(file.read(header.length))
-        there = os.fstat(file.fileno()).st_size
-    if there < found.least:
+    found, there = _measured(dataset)
+    if found is not None and there < found.least:
         raise tessel.Error("TESSEL:python:fileTooShort",
                            f"The file is cut off: it has {there} bytes, and what is in it needs "
                            f"{found.least}.", path=dataset.place)
     return found
+
+
+def missing(dataset: Dataset) -> int:
+    """How many bytes of an open file were cut off, in whose place the library reads zeros."""
+    found, there = _measured(dataset)
+    return max(found.least - there, 0) if found is not None else 0
+
+
+def _measured(dataset: Dataset) -> tuple[Extent | None, int]:
+    """What a file needs, None for other formats, and the bytes that it has."""
+    form = _form(dataset.place)
+    if form is None:
+        return None, 0
+    header = _Header(dataset, form)
+    with open(dataset.place, "rb") as file:
+        return header.extent(file.read(header.length)), os.fstat(file.fileno()).st_size
 
 
 def _padded(length: int) -> int:

@@ -129,7 +129,7 @@ def _ids(value: Any) -> tuple[int, ...]:
 def _id(value: Any) -> int:
     """An id as the module reads it: the first element."""
     try:
-        return int(numpy.asarray(value).flat[0])
+        return int(numpy.asarray(value).real.flat[0])
     except (ValueError, TypeError, IndexError, OverflowError):
         return -1
 

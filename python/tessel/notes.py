@@ -216,7 +216,7 @@ class _Subject:
         """The dimensions that the call names."""
         dimids = self._values.get("dimids", self._values.get("dimid"))
         if dimids is not None:
-            for dimid in map(int, numpy.asarray(dimids).flat[:_MOST]):
+            for dimid in map(int, numpy.asarray(dimids).real.flat[:_MOST]):
                 for dimension in self._ask(self._dimension, ncid, dimid):
                     yield f"dimid {dimid}: {dimension}"
 
@@ -224,20 +224,33 @@ class _Subject:
         """What there is instead of what was not found."""
         word = self._error.word
         # Nothing is asked of a dataset without need: one whose closing failed does not survive it.
-        if word not in ("variableNotFound", "invalidDimensionIdOrName", "attributeNotFound"):
+        if word not in _KINDS:
             return
         with suppress(Exception):
             inq = self._module.inq(ncid)
             if word == "variableNotFound":
-                yield _list("variables", inq.nvars,
+                yield _list(_KINDS[word], inq.nvars,
                             lambda i: str(self._module.inq_var(ncid, i).name))
             elif word == "invalidDimensionIdOrName":
-                yield _list("dimensions", inq.ndims, lambda i: str(self._dimension(ncid, i)))
+                yield _list(_KINDS[word], inq.ndims, lambda i: str(self._dimension(ncid, i)))
             elif word == "attributeNotFound":
                 varid = self._number("varid")
                 count = inq.natts if varid == -1 else self._module.inq_var(ncid, varid).natts
-                yield _list("attributes", count,
+                yield _list(_KINDS[word], count,
                             lambda i: str(self._module.inq_attname(ncid, varid, i)))
+
+
+_KINDS = {"variableNotFound": "variables", "invalidDimensionIdOrName": "dimensions",
+          "attributeNotFound": "attributes"}
+"""Of what kind is what was not found, by the word of the error."""
+
+
+def known(error: Error) -> Iterator[str]:
+    """What the notes of an error list in place of what was not found."""
+    kind = _KINDS.get(error.word)
+    for line in "\n".join(getattr(error, "__notes__", ())).splitlines():
+        if kind is not None and line.startswith((f"{kind}: ", f"there are no {kind}")):
+            yield line
 
 
 def _list(what: str, count: int, name: Callable[[int], str]) -> str:

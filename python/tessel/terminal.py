@@ -4,12 +4,14 @@
 from __future__ import annotations
 
 import argparse
+import contextlib
 import io
 import os
 import signal
 import sys
+import threading
 import time
-from collections.abc import Callable
+from collections.abc import Callable, Iterator
 from types import TracebackType
 from typing import NoReturn, TextIO
 
@@ -47,28 +49,63 @@ def message_of(error: Exception) -> str:
         library = error.name.partition(".")[0]
         return (f"This needs {library}, which is not installed; Debian has it in the package "
                 f"python3-{library}.")
-    if isinstance(error, OSError) and error.strerror and error.filename:
-        return f"{error.strerror}: {os.fsdecode(error.filename)}"
+    if isinstance(error, OSError) and error.strerror:
+        name = error.filename
+        return f"{error.strerror}: {os.fsdecode(name)}" if name else error.strerror
     return str(error)
+
+
+class _Terminated(BaseException):
+    """Somebody asked the process to end."""
+
+
+@contextlib.contextmanager
+def _terminable() -> Iterator[None]:
+    """Has SIGTERM raise an exception within the `with` block, so that files that were begun are
+    removed. Where it has been given another meaning, and in other threads, nothing changes."""
+    if (threading.current_thread() is not threading.main_thread()
+            or signal.getsignal(signal.SIGTERM) is not signal.SIG_DFL):
+        yield
+        return
+
+    def terminate(_number: int, _frame: object) -> None:
+        # Some send it twice, to the process and to its group; the second must not end the tidying.
+        signal.signal(signal.SIGTERM, signal.SIG_IGN)
+        raise _Terminated
+
+    signal.signal(signal.SIGTERM, terminate)
+    try:
+        yield
+    finally:
+        signal.signal(signal.SIGTERM, signal.SIG_DFL)
+
+
+def _ended_by(number: signal.Signals) -> int:
+    """Ends the process as the signal ends others."""
+    signal.signal(number, signal.SIG_DFL)
+    os.kill(os.getpid(), number)
+    return 128 + number
 
 
 def run(command: Callable[[], object], line: Callable[[Exception], str] = message_of) -> int:
     """Runs a command and returns its exit status: 0, or 1 when it failed, which one `line` on the
-    standard error says. Ctrl-C ends the process as it ends others."""
+    standard error says. Ctrl-C and SIGTERM end the process as they end others, after what was begun
+    has been removed."""
     for stream in (sys.stdout, sys.stderr):  # never fail over a character that a terminal lacks
         if isinstance(stream, io.TextIOWrapper):
             stream.reconfigure(errors="backslashreplace")
     try:
-        command()
+        with _terminable():
+            command()
         sys.stdout.flush()
         return 0
     except BrokenPipeError:  # whoever read has seen enough
         os.dup2(os.open(os.devnull, os.O_WRONLY), sys.stdout.fileno())
         return 0
     except KeyboardInterrupt:
-        signal.signal(signal.SIGINT, signal.SIG_DFL)
-        os.kill(os.getpid(), signal.SIGINT)
-        return 128 + signal.SIGINT
+        return _ended_by(signal.SIGINT)
+    except _Terminated:
+        return _ended_by(signal.SIGTERM)
     except (tessel.Error, OSError, MemoryError, ImportError) as error:
         message = line(error)
     try:

@@ -50,7 +50,8 @@ def read(path: Path, variable: str, start: Sequence[int] | None = None,
     `out`, an array of the result's shape and dtype, takes the values, and is returned: with a
     numpy.memmap, a variable of any size needs no more than `block_bytes` of memory. `progress` is
     called with the bytes done and all bytes, before the first block and after each. Ctrl-C is
-    heard between blocks. A file that was cut off is refused unless `check` is False.
+    heard between blocks. A file that was cut off is refused unless `check` is False; then zeros
+    stand for what is gone.
     """
     size, tell = block_size(block_bytes), listener(progress)
     with Dataset(path) as dataset:
@@ -74,7 +75,8 @@ def copy(source: Path, target: Path,
     counts records and has no variable with records, which the library does not write but reads, is
     refused: there is nothing by which the copy could count them.
 
-    `progress`, `block_bytes` and `check` are as in `read`.
+    `progress`, `block_bytes` and `check` are as in `read`. A copy of a file that was cut off is
+    complete: nobody sees any more which of its zeros stand for what is gone.
     """
     size, tell = block_size(block_bytes), listener(progress)
     with Dataset(source) as dataset:

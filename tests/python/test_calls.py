@@ -72,6 +72,19 @@ def test_datasets_are_remembered_by_any_spelling(opening: str, closing: str) -> 
     assert netcdf.path_of(ncid) is None
 
 
+@pytest.mark.parametrize("arguments", [
+    ("close", 1j), ("close", numpy.array([2 + 1j], "F")), ("close", "abc"), ("close", b""),
+    ("close", numpy.array([object()])), ("inq_var", 1j, 2j), ("inq_dim", 1, 1j),
+    ("def_var", 1, "v", 5, numpy.array([1j]))])
+@pytest.mark.filterwarnings("error")
+def test_what_is_no_id(arguments: tuple[object, ...]) -> None:
+    """Nothing but the module's error, neither of a call nor of a method."""
+    name, *given = arguments
+    for call in (lambda: nc(*arguments), lambda: getattr(nc, str(name))(*given)):
+        with pytest.raises(tessel.Error):
+            call()
+
+
 def test_instead() -> None:
     """What takes the calls of a name gets the module and all arguments, and its result is theirs."""
     seen = []

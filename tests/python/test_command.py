@@ -256,7 +256,11 @@ def test_check(capsys, tmp_path):
             f"The file is cut off: it has {size - 10} bytes, and what is in it needs "
             f"{re.search('needs ([0-9]+)', output)[1]}: {path}"), arguments
         if arguments[0] != "check":
-            assert run(capsys, arguments[0], path, *more, *arguments[1:], "--no-check")[0] == 0
+            status, _, errors = run(capsys, arguments[0], path, *more, *arguments[1:], "--no-check")
+            assert (status, errors) == (
+                0, f"tessel: zeros stand for 10 bytes that were cut off: {path}\n"), arguments
+    whole = generate(tmp_path / "whole.nc", EVERYTHING)
+    assert run(capsys, "copy", whole, tmp_path / "a.nc", "--no-check") == (0, "", "")
     other = generate(tmp_path / "g.nc", EVERYTHING, "netCDF-4")
     assert run(capsys, "check", other)[1].startswith(f"{other}: nothing to check; ")
 
@@ -338,7 +342,14 @@ def test_the_file_that_an_error_is_about(capsys, field, tmp_path):
         f'"No such file or directory": {missing}: there is no folder {tmp_path}/missing')
     assert one_line(run(capsys, "copy", field, field)) == (
         f"The target is the same file as the source: {field}")
-    assert one_line(run(capsys, "info", field, "none")).endswith(f"Variable not found\": {field}")
+    for arguments in (["info", field, "none"],
+                      ["plot", field, "none", "-o", tmp_path / "a.png"]):
+        assert one_line(run(capsys, *arguments)).endswith(
+            f"Variable not found\": {field}: variables: time, z, y, x, t, tz, zy, yz, lonlat, s, "
+            "profile, word and 1 more")
+    empty = generate(tmp_path / "empty.nc", "")
+    assert one_line(run(capsys, "info", empty, "none")).endswith(
+        f"{empty}: there are no variables")
     wide = generate(tmp_path / "wide.nc", "dimensions: x = 2 ; variables: ubyte a(x) ;", "cdf5")
     line = one_line(run(capsys, "copy", wide, tmp_path / "new.nc", "--format", "classic"))
     assert line.endswith(f": {tmp_path}/new.nc") and ".part" not in line
@@ -366,7 +377,9 @@ def test_errors_that_are_about_no_file(capsys, field, monkeypatch):
     for arguments in (["info", field], ["check", field]):
         assert one_line(run(capsys, *arguments)) == "There is no module netcdf."
     monkeypatch.undo()
-    assert one_line(run(capsys, "info", "")).endswith('Malformed URL"')
+    for arguments in (["info", ""], ["check", ""], ["copy", "", "new.nc"],
+                      ["plot", "", "v", "-o", "a.png"]):
+        assert one_line(run(capsys, *arguments)) == "The file has no name."
     for arguments in ([], ["--guard", "off"]):
         assert one_line(run(capsys, "info", *arguments, "http://[")).endswith(": http://[")
 
@@ -419,6 +432,35 @@ def test_memory_that_is_not_there(capsys, field, monkeypatch):
 
     monkeypatch.setattr(Dataset, "main_variable", exhausted)
     assert one_line(run(capsys, "info", field)) == "There is not enough memory."
+
+
+def test_what_would_be_waited_for(capsys, tmp_path):
+    """A pipe that nobody writes into."""
+    pipe = tmp_path / "pipe"
+    os.mkfifo(pipe)
+    for path in (pipe, "/dev/tty"):
+        for arguments in (["info", path], ["check", path], ["copy", path, tmp_path / "a.nc"],
+                          ["plot", path, "v", "-o", tmp_path / "a.png"]):
+            assert one_line(run(capsys, *arguments)) == (
+                f"The file is no regular file, but a pipe, a socket or a device: {path}")
+
+
+def test_version(capsys):
+    status, output, errors = run(capsys, "--version")
+    assert (status, errors) == (0, "")
+    library = tessel.load("netcdf").inq_libvers().split()[0]
+    assert re.fullmatch(rf"tessel \d+\.\d+\.\d+, netCDF library {re.escape(library)}, "
+                        rf"NumPy {re.escape(np.__version__)}, Python \d+\.\d+\.\S+\n", output)
+
+
+@pytest.mark.parametrize("arguments", [["info", "field.nc"], ["ops"], ["--version"]],
+                         ids=lambda each: each[0])
+def test_an_output_that_takes_nothing(field, arguments):
+    with open("/dev/full", "wb") as full:
+        done = subprocess.run([sys.executable, "-B", "-m", "tessel", *arguments], stdout=full,
+                              stderr=subprocess.PIPE, text=True, check=False,
+                              cwd=Path(field).parent)
+    assert (done.returncode, done.stderr) == (1, "tessel: No space left on device\n")
 
 
 @pytest.mark.parametrize("name", ["missing.nc", "\033[31mred\a.nc"])

@@ -328,6 +328,34 @@ def test_whole_numbers_of_any_kind(ncid: int, kind: type) -> None:
     assert nc.inq_var(ncid, varid)[1:3] == (5, (0, 3))
 
 
+@pytest.mark.parametrize("make", [
+    lambda number: numpy.array([number], "i4"), lambda number: numpy.array(number, "i4"),
+    lambda number: numpy.array([[number]], "i4"), lambda number: numpy.array([number, 7], "i4"),
+    lambda number: numpy.array([number], "i8"), lambda number: numpy.array([number], ">i2"),
+    lambda number: numpy.array([number], float)],
+    ids=["i4", "0-d i4", "2-d i4", "two i4", "i8", ">i2", "double"])
+def test_codes_in_arrays(make, tmp_path) -> None:
+    """Of an int32, the module would read the bytes as those of a double, and answer something
+    else."""
+    assert nc.strerror(make(-33)) == nc.strerror(-33) != nc.strerror(0)
+    before = nc.set_default_format(make(nc.param("FORMAT_64BIT")))
+    try:
+        assert nc.set_default_format(make(before)) == nc.param("FORMAT_64BIT")
+    finally:
+        nc.set_default_format(before)
+    dataset = nc.create(tmp_path / "filled.nc", "CLOBBER")
+    assert nc.set_fill(dataset, make(nc.param("NOFILL"))) == nc.param("FILL")
+    assert nc.set_fill(dataset, make(nc.param("FILL"))) == nc.param("NOFILL")
+    nc.close(dataset)
+
+
+def test_codes_that_are_none() -> None:
+    for wrong in (numpy.array([], "i4"), numpy.array(["a"]), numpy.array([True])):
+        with pytest.raises(tessel.Error) as raised:
+            nc.strerror(wrong)
+        assert raised.value.identifier.startswith("TESSEL:netcdf:unpackIntSingleton:")
+
+
 @pytest.mark.parametrize("vector", [
     [1, 0], (1, 0), numpy.array([1, 0]), numpy.array([1.0, 0.0]), numpy.array([1, 0], numpy.uint8),
     numpy.array([[1, 0]]), range(1, -1, -1), {1: "x", 0: "y"}.keys(), numpy.array([1, 0]).data],

@@ -593,8 +593,10 @@ def child(program: str, *arguments: object, **more: object) -> subprocess.Popen:
                             text=True, **more)
 
 
-@pytest.mark.parametrize("command", ["copy", "command line", "read"])
-def test_interrupt(tmp_path, command):
+@pytest.mark.parametrize(("command", "number"), [
+    ("copy", signal.SIGINT), ("read", signal.SIGINT), ("command line", signal.SIGINT),
+    ("command line", signal.SIGTERM)])
+def test_interrupt(tmp_path, command, number):
     source = sparse(tmp_path / "large.nc", 2**31)
     target = tmp_path / "copy.nc"
     program = {
@@ -620,9 +622,11 @@ def test_interrupt(tmp_path, command):
             if done > 0:
                 break
         assert 0 < done < total == 2**31
-        process.send_signal(signal.SIGINT)
+        process.send_signal(number)
+        if number == signal.SIGTERM:
+            process.send_signal(number)  # as `timeout` does, to the process and to its group
         output, errors = process.communicate(timeout=60)
-        assert process.returncode == -signal.SIGINT
+        assert process.returncode == -number
         last = int((output.split("\n")[-2] if output else line).split()[0])
         assert last < total
     assert ("KeyboardInterrupt" in errors) == (command != "command line")

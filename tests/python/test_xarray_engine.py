@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import ctypes
 import gc
+import io
 import os
 import pickle
 import shutil
@@ -286,10 +287,13 @@ def test_what_is_no_file(tmp_path: Path) -> None:
         assert not guess(each)
     with pytest.raises(FileNotFoundError):
         xarray.open_dataset(tmp_path / "missing.nc", engine="tessel")
-    with pytest.raises(tessel.Error):
-        xarray.open_dataset(tmp_path, engine="tessel")
-    with pytest.raises(TypeError):
-        xarray.open_dataset(3, engine="tessel")
+    for path in (tmp_path, "http://localhost/a.nc"):
+        with pytest.raises(OSError) as raised:
+            xarray.open_dataset(path, engine="tessel")
+        assert raised.value.word == "notAClassicFile"
+    for none in (3, io.BytesIO(b"CDF\1")):
+        with pytest.raises(TypeError, match="A path is a str"):
+            xarray.open_dataset(none, engine="tessel")
 
 
 def test_a_file_that_must_not_be_read(everything: str) -> None:
@@ -509,8 +513,9 @@ def test_a_file_that_is_cut_off(cubes: list[str], mapped: bool) -> None:
     assert file.mapped is mapped
     file.close()
     os.truncate(cubes[0], size - 5000)
-    with pytest.raises(tessel.Error, match="cut off"):
+    with pytest.raises(tessel.Error, match="cut off") as error:
         OpenFile(cubes[0], mapped)
+    assert error.value.__notes__ == [f"file: {cubes[0]}"]
 
 
 def test_a_file_that_is_cut_off_while_it_is_read(tmp_path: Path) -> None:

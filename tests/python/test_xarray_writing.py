@@ -319,7 +319,7 @@ def test_unlimited_dimensions(tmp_path: Path) -> None:
 
 
 @pytest.mark.parametrize("unlimited, word", [
-    (["t", "y"], "onlyOneUnlimitedDimensionAllowed"), ("y", "unlimitedDimensionInTheWrongIndex"),
+    (["t", "y"], "onlyOneUnlimitedDimensionAllowed"), ("y", "badDimensions"),
     ("z", "badDimensions"), (["t", "z"], "badDimensions"), (iter("tz"), "badDimensions")])
 def test_unlimited_dimensions_that_cannot_be(tmp_path: Path, unlimited: Any, word: str) -> None:
     with pytest.raises(tessel.Error) as raised:
@@ -327,6 +327,19 @@ def test_unlimited_dimensions_that_cannot_be(tmp_path: Path, unlimited: Any, wor
                   unlimited_dims=unlimited)
     assert raised.value.word == word
     assert not list(tmp_path.iterdir())
+
+
+@pytest.mark.parametrize(("made", "unlimited"), [
+    (xr.Dataset({"x": (("t", "y"), np.ones((3, 2)))}), "y"),
+    (xr.Dataset({"x": (("t", "y"), np.ones((3, 0)))}), None)], ids=["asked for", "no length"])
+def test_the_dimension_that_must_be_the_first(tmp_path: Path, made: xr.Dataset,
+                                              unlimited: str | None) -> None:
+    with pytest.raises(tessel.Error) as raised:
+        to_netcdf(made, tmp_path / "x.nc", unlimited_dims=unlimited)
+    assert raised.value.message == "y is unlimited, and so must be the first dimension of x."
+    to_netcdf(xr.Dataset({"v": ("y", [1.0])}), tmp_path / "x.nc", unlimited_dims="y")
+    with pytest.raises(tessel.Error, match="must be the first dimension of w"):
+        to_netcdf(xr.Dataset({"w": (("t", "y"), [[1.0], [2.0]])}), tmp_path / "x.nc", "a")
 
 
 @pytest.mark.parametrize("lazy", [False, True])

@@ -90,13 +90,21 @@ class OpenFile(Dataset):
             self._layout_bytes = _LAYOUT_END - _LAYOUT_BEGIN
             self._layout = self._layout_now()  # before the library looks at it
             super().__init__(path)
-            self._extent = integrity.extent(self) or integrity.Extent(0, 0, [], 0)
+            self._extent = self._extent_now()
             self._layout = self._layout[:max(self._extent.header - _LAYOUT_BEGIN, 0)]
             self._layout_bytes = len(self._layout)
             if not self._is_at_its_path():
                 raise self._error("fileChanged", "The file was replaced while it was being opened.")
         except BaseException:
             self.close()
+            raise
+
+    def _extent_now(self) -> integrity.Extent:
+        try:
+            return integrity.extent(self) or integrity.Extent(0, 0, [], 0)
+        except tessel.Error as error:
+            if error.word == "fileTooShort":  # of many files, which one
+                error.add_note(f"file: {self.place}")
             raise
 
     def _open(self) -> int:
@@ -232,7 +240,7 @@ class OpenFile(Dataset):
 
 def _descriptor_of(path: str) -> int:
     """A descriptor of a file that is in one of the two formats."""
-    if not os.path.isfile(path) and os.path.exists(path):
+    if "://" in path or (os.path.exists(path) and not os.path.isfile(path)):
         raise _not_ours(path)
     descriptor = os.open(path, os.O_RDONLY)
     if os.pread(descriptor, len(FORMATS[0]), 0) not in FORMATS:

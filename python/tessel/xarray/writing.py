@@ -131,6 +131,8 @@ class WritingStore(AbstractWritableDataStore):
         self._variables = there.variables if there else {}
         self._lengths: dict[Any, int] = {}
         self._dimids: dict[Any, int] = {}
+        self._growing: set[Any] = {each.name for each in there.dimensions if each.unlimited} \
+            if there else set()
         for dimid, each in enumerate(there.dimensions if there else []):
             self._lengths[each.name] = each.length
             self._dimids[each.name] = dimid
@@ -165,8 +167,10 @@ class WritingStore(AbstractWritableDataStore):
         """Defines a dimension."""
         # The only dimension of length 0 that the formats have is the unlimited one.
         self._lengths[dim] = length or 0
-        self._dimids[dim] = self._made.define_dimension(dim, self._lengths[dim],
-                                                        is_unlimited or length == 0)
+        growing = is_unlimited or length == 0
+        self._dimids[dim] = self._made.define_dimension(dim, self._lengths[dim], growing)
+        if growing:
+            self._growing.add(dim)
 
     def set_attribute(self, k: Any, v: Any) -> None:
         """Puts a global attribute."""
@@ -193,6 +197,10 @@ class WritingStore(AbstractWritableDataStore):
                 raise tessel.Error("TESSEL:python:badDimensions", f"The dimension {dim} of "
                                    f"{name} has the length {length}, and not "
                                    f"{self._lengths[dim]} as elsewhere.")
+        for dim in variable.dims[1:]:
+            if dim in self._growing:
+                raise tessel.Error("TESSEL:python:badDimensions", f"{dim} is unlimited, and so "
+                                   f"must be the first dimension of {name}.")
         varid = self._defined(name, variable)
         # Of a variable that was there, no attribute may say of the new values what the old ones
         # meant: their scale, their units, which of them were missing.
