@@ -23,11 +23,14 @@ from pathlib import Path
 
 import netCDF4
 import numpy as np
-from measuring import give_out, options_of, seconds
+from measuring import give_out, leave, options_of, seconds
 from tessel.xarray.array import DTYPES, LazyArray
 from tessel.xarray.opening import MAPPED, OpenFile
 from tessel.xarray.planning import COSTS, Costs
 from xarray.backends import CachingFileManager
+
+MOST_OFF = 2
+"""How many times more or less than what is measured the plans may count with."""
 
 MEMBERS = {False: "float", True: "text"}
 
@@ -126,6 +129,12 @@ def main() -> None:
                              f"{costs.picked * 1e9:.2f} ns | {costs.strided * 1e9:.0f} ns |")
         lines += ["", column(path, shape)]
     give_out(options, "bench/access_costs.py", "\n".join(lines), rows)
+    leave(options, [
+        f"{kind}: {name} takes {getattr(sides['measured'], name):.3g} s, and the plans count with "
+        f"{getattr(sides['used'], name):.3g} s"
+        for kind, sides in rows.items() for name in Costs._fields
+        if not 1 / MOST_OFF <= getattr(sides["used"], name) / getattr(sides["measured"], name)
+        <= MOST_OFF])
 
 
 if __name__ == "__main__":

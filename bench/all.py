@@ -23,7 +23,7 @@ from typing import NamedTuple
 import growth
 from chart import draw
 from expectations import ROWS, missed_without_reason, table
-from measuring import put_between_marks
+from measuring import UNEXPECTED, put_between_marks
 from results import Results
 
 PROJECT = Path(__file__).resolve().parent.parent
@@ -62,22 +62,28 @@ PROGRAMS = [
     Program("python_front.py"),
     Program("xarray_engine.py"),
     Program("access_costs.py", "xarray.md"),
+    Program("open_modes.py", "xarray.md"),
 ]
 
 
-def run(programs: list[Program], built: Path, folder: Path, quick: bool) -> None:
-    """Runs them, with what they say in the folder as well."""
+def run(programs: list[Program], built: Path, folder: Path, quick: bool) -> list[str]:
+    """Runs them, with what they say in the folder as well; gives the names of those that measured
+    what they must not."""
     folder.mkdir(parents=True, exist_ok=True)
+    unexpected = []
     for program in programs:
         print(f"{program.name:20}", end="", flush=True)
         start = time.monotonic()
         with open(program.numbers(folder).with_suffix(".log"), "w+") as log:
             status = subprocess.run(program.command(built, folder, quick), cwd=PROJECT, check=False,
                                     stdout=log, stderr=subprocess.STDOUT).returncode
-            if status != 0:
+            if status not in (0, UNEXPECTED):
                 log.seek(0)
                 sys.exit(f"failed\n{log.read()}")
         print(f"{time.monotonic() - start:8.0f} s", flush=True)
+        if status == UNEXPECTED:
+            unexpected.append(f"{program.name}: see {log.name}")
+    return unexpected
 
 
 def main() -> int:
@@ -96,7 +102,7 @@ def main() -> int:
         parser.error(f"there is no {unknown}")
     chosen = [names[each] for each in options.program] or PROGRAMS
     folder = options.built / ("quick" if options.quick else "results")
-    run([] if options.tables else chosen, options.built, folder, options.quick)
+    unexpected = run([] if options.tables else chosen, options.built, folder, options.quick)
     results = Results({each.name: each.numbers(folder) for each in PROGRAMS
                        if each.name in {row.program for row in ROWS}})
     text = f"{PICTURE}\n\n{table(results)}"
@@ -110,13 +116,13 @@ def main() -> int:
     put_between_marks(DOCS / "performance.md", "bench/all", text)
     put_between_marks(DOCS / "measurements.md", "bench/all, growth", of_growth)
     draw(results, DOCS / "performance.svg")
-    growing = [each for each in series if each.grows]
-    for each in growing:
-        print(f"grows faster than its work: {each.what}, {each.counted}", file=sys.stderr)
-    unexplained = missed_without_reason(results)
-    for row in unexplained:
-        print(f"missed, and bench/expectations.py has no reason: {row}", file=sys.stderr)
-    return 1 if unexplained or growing else 0
+    unexpected += [f"grows faster than its work: {each.what}, {each.counted}"
+                   for each in series if each.grows]
+    unexpected += [f"missed, and bench/expectations.py has no reason: {row}"
+                   for row in missed_without_reason(results)]
+    for each in unexpected:
+        print(each, file=sys.stderr)
+    return 1 if unexpected else 0
 
 
 if __name__ == "__main__":

@@ -84,11 +84,17 @@ UNCOPIED = ("nothing is copied or added on this way, and the same row lies on ei
 NOISE = ("both sides leave nearly all of the work to the library, and a difference below 3 % is "
          "noise")
 
+FILLED = ("for each call, the library moves in the file twice and fills its buffer of 8 KiB, which "
+          "takes longer than the rest and is more than a twentieth of the other side's time by "
+          "itself; see [From Python](measurements.md#from-python)")
+
 REASONS = {
     **{f"{each}, one element": Reason(MORE_FUNCTIONS, 160e-9) for each in FAMILIES},
     "get_vars, one element": Reason(STRIDED, 280e-9),
     "put_vars, one element": Reason(STRIDED, 280e-9),
     "get_att, one element": Reason(TWICE, 420e-9),
+    **{f"Python: {each}, anywhere in the file, {form}": Reason(FILLED, 1 / 12)
+       for each in ("one element", "ten elements") for form in ("call", "method")},
     **{f"Python: whole {each}": Reason(NOISE, 1.03) for each in ("read", "write, to a new file")},
     **{f"{each}, text of 64 MiB": Reason(ZEROS, 2.3) for each in ("get_var", "get_vara")},
     "get_att, text of 64 MiB": Reason(ZEROS, 4),
@@ -127,6 +133,8 @@ ROWS = (
     from_python("one element, one after the other, method", one_of(20)),
     from_python("ten elements, one after the other, call", one_of(30)),
     from_python("ten elements, one after the other, method", one_of(20)),
+    *(from_python(f"{each}, anywhere in the file, {form}", one_of(20))
+      for each in ("one element", "ten elements") for form in ("call", "method")),
     from_python("whole read", times(1)),
     from_python("whole write, to a new file", times(1)),
 )

@@ -8,16 +8,21 @@ import argparse
 import json
 import random
 import statistics
+import sys
 import time
 from collections.abc import Callable, Mapping, Sequence
 from pathlib import Path
-from typing import NamedTuple
+from typing import NamedTuple, NoReturn
 
 Work = Callable[[], object]
 
 # Where all sides leave nearly all of the work to the library, two measurements of the same side
 # differ by as much as this, and a difference below it says nothing.
 NOISE = 0.03
+
+
+# The exit status of a program that measured, and found what it must not.
+UNEXPECTED = 3
 
 
 class Measured(NamedTuple):
@@ -58,6 +63,15 @@ def give_out(options: argparse.Namespace, program: str, text: str,
         options.json.write_text(json.dumps(
             {name: {side: measured._asdict() for side, measured in sides.items()}
              for name, sides in rows.items()}, indent=1))
+
+
+def leave(options: argparse.Namespace, unexpected: Sequence[str]) -> NoReturn:
+    """Ends a program that has given out its results; with a status that says so if something in
+    them must not be, unless the numbers say nothing."""
+    if options.quick or not unexpected:
+        sys.exit(0)
+    print(*unexpected, sep="\n", file=sys.stderr)
+    sys.exit(UNEXPECTED)
 
 
 def seconds(work: Work) -> float:

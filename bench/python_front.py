@@ -28,21 +28,20 @@ import netCDF4
 import numpy as np
 
 import tessel
-from measuring import Measured, Work, give_out, measure, options_of
+from measuring import NOISE, Measured, Work, give_out, measure, options_of
 
 FORMAT = "NETCDF3_64BIT_OFFSET"
 MAPPED = 16  # the library's mode flag for mapping a file, which is none of its named constants
 TEN = 10
 EXPECTED = {"call": 30, "method": 20}  # times faster, where the call itself is what costs
+ANYWHERE = {"call": 20, "method": 20}
 
 Places = list[tuple[int, int, int]]
 
 
 class Row(NamedTuple):
-    """One piece of work, by each side, and how many times faster ours shall be at least.
-
-    Nothing is expected where the library itself takes most of the time.
-    """
+    """One piece of work, by each side, and how many times faster ours shall be at least; None in
+    rows that are there to be compared with others."""
 
     name: str
     unit: str
@@ -191,7 +190,7 @@ class Bench:
                  {"call": self.block_tessel, "method": self.block_method}))
             for how, places, expected in (
                 ("one after the other", self.near, EXPECTED),
-                ("anywhere in the file", self.anywhere, {}))
+                ("anywhere in the file", self.anywhere, ANYWHERE))
             for form, ours in forms.items()
         ]
         return [
@@ -236,8 +235,10 @@ def table(bench: Bench, repetitions: int) -> tuple[list[str], dict[str, dict[str
         ours, bare, masked = measure(sides, count, row.times, bench.remove_new)
         rows[row.name] = {"tessel": ours, "netcdf4": bare, "netcdf4, masked": masked}
         show = [f"{side.time * scale[row.unit]:.3g} {row.unit}" for side in (ours, bare, masked)]
+        missed = row.expected and bare.ratio < row.expected * (1 - NOISE)
         lines.append(f"| {row.name} | {show[0]} | {show[1]} | {bare.ratio:.3g} | {show[2]} | "
-                     f"{masked.ratio:.3g} | {row.expected or '–'} |")
+                     f"{masked.ratio:.3g} | {row.expected or '–'}"
+                     f"{', **missed**' if missed else ''} |")
     return lines, rows
 
 
