@@ -9,7 +9,6 @@ from importlib import metadata
 from pathlib import Path
 
 import numpy as np
-import xarray
 
 COMPATIBILITY = Path(__file__).parents[2] / "docs" / "compatibility.md"
 
@@ -29,9 +28,7 @@ def test_what_is_imported() -> None:
         "numpy": "", "cftime": "", "matplotlib": "plot", "xarray": "xarray", "dask": "dask"}
     assert tuple(map(int, needs["numpy"][0].split("."))) == versions["NumPy"]
     assert tuple(map(int, needs["xarray"][0].split("."))) == versions["xarray"]
-    for module, name in ((np, "numpy"), (xarray, "xarray")):
-        there = tuple(map(int, module.__version__.split(".")))
-        assert there >= tuple(map(int, needs[name][0].split(".")))
+    assert versions["NumPy"] <= tuple(map(int, np.__version__.split(".")))
 
 
 def test_the_python_that_it_was_compiled_for() -> None:
