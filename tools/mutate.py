@@ -61,6 +61,10 @@ EQUIVALENT = (
                "another order of the slots, for what is put in and for what is looked for"),
     Equivalent("convert/index_vector.hpp", "constant", "small_vector<T, 8>", "8",
                "room for one dimension more before memory is asked for"),
+    Equivalent("convert/text.cpp", "comparison", "count >= large", ">=",
+               "both ways of copying copy the same"),
+    Equivalent("convert/text.cpp", "constant", "std::size_t{1} << 20U", "1",
+               "both ways of copying copy the same"),
     Equivalent("*.[ch]pp", "constant", "NC_MAX_NAME + 1", "1", "room for one character more"),
 )
 
