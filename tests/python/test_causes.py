@@ -110,20 +110,25 @@ def test_a_method_takes_a_code_by_its_value(make: typing.Callable[[str], typing.
 
 # Advice.
 
+VECTORS = ["start", "count", "stride"]
 PLACES = {"get_var1_int": 1, "get_vara_int": 2, "get_vars_int": 3,
           "put_var1_int": 1, "put_vara_int": 2, "put_vars_int": 3}
 
 
-@pytest.mark.parametrize("operation", PLACES)
-@pytest.mark.parametrize("place", [[], [0], [1]])
-def test_a_variable_without_dimensions(operation: str, place: list[int]) -> None:
-    """These families do not reach it; the advice names those that do."""
+@pytest.mark.parametrize("operation, empty", [
+    (operation, each) for operation, vectors in PLACES.items()
+    for each in ("none", *VECTORS[:vectors])])
+def test_a_variable_without_dimensions(operation: str, empty: str) -> None:
+    """These families do not reach it, with one number or with none; the advice names those that
+    do."""
     ncid = nc.create("single.nc", "CLOBBER")
     varid = nc.def_var(ncid, "single", nc.param("INT"), [])
     nc.enddef(ncid)
     data = [numpy.array([7], "int32")] if operation.startswith("put") else []
     with pytest.raises(tessel.Error) as caught:
-        getattr(nc, operation)(ncid, varid, *[place] * PLACES[operation], *data)
+        getattr(nc, operation)(ncid, varid, *([] if each == empty else [1]
+                                              for each in VECTORS[:PLACES[operation]]), *data)
+    assert (caught.value.word == f"{empty}ArgumentIsEmpty") == (empty in VECTORS)
     advice = meanings.MEANINGS[caught.value.word][1]
     assert advice.endswith("a variable without dimensions is read by get_var_* and written by "
                            "put_var_*, and by no other family.")
