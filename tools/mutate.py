@@ -65,6 +65,10 @@ EQUIVALENT = (
                "both ways of copying copy the same"),
     Equivalent("convert/text.cpp", "constant", "std::size_t{1} << 20U", "1",
                "both ways of copying copy the same"),
+    Equivalent("convert/text.cpp", "comparison", "at + step <= count", "<=",
+               "the last step is left to the other way of copying"),
+    Equivalent("convert/text.cpp", "removal", "_mm_sfence()", "",
+               "the thread that copied sees what it wrote without it"),
     Equivalent("*.[ch]pp", "constant", "NC_MAX_NAME + 1", "1", "room for one character more"),
 )
 
