@@ -1,5 +1,5 @@
-# bench/python_front.py: what a call from Python costs, beside netCDF4-python.
-"""Measures tessel and netCDF4-python (Debian's python3-netcdf4) in one run, on the same files.
+# bench/python_front.py: what a call from Python costs, beside netCDF4-python and SciPy.
+"""Measures tessel, netCDF4-python and SciPy (Debian's packages) in one run, on the same files.
 
 usage: python_front.py [--write DOCUMENT] [--json FILE] [--quick]
 
@@ -7,6 +7,8 @@ Each row is one piece of work done by each side. The sides take turns, in anothe
 repetition. A time is the median of all repetitions; how many times faster one side is, is the
 median of what each repetition says, so that what slows down both does not count. netCDF4-python is
 measured as it comes, with masking and scaling, and without, as its users who want speed run it.
+SciPy reads from a mapping of the file, which needs no call at all, and gives numbers in the file's
+order of bytes; a whole read makes this machine's of them, as the others do.
 Before anything is measured, the sides must give the same values and write the same file.
 
 --write puts the table between the marks in the document. --quick does everything once, on small
@@ -26,6 +28,8 @@ from typing import NamedTuple
 
 import netCDF4
 import numpy as np
+import scipy
+from scipy.io import netcdf_file
 
 import tessel
 from measuring import NOISE, Measured, Work, give_out, measure, options_of
@@ -48,6 +52,7 @@ class Row(NamedTuple):
     expected: float | None
     tessel: Work
     netcdf4: Callable[[bool], Work]  # with masking and scaling or without
+    scipy: Work
     times: int  # how often one measurement does it
 
 
@@ -69,6 +74,8 @@ class Bench:
         self.varid = int(self.nc("inq_varid", self.ncid, "v")[0, 0])
         self.dataset = netCDF4.Dataset(self.path)
         self.variable = self.dataset["v"]
+        self.scipy = netcdf_file(self.path, mmap=True)
+        self.scipy_variable = self.scipy.variables["v"]
         # Ten elements begin at each place. One after the other, they are in the library's buffer
         # most of the time; anywhere, the library reads from the file for each.
         rooms = (*self.shape[:-1], self.shape[-1] - TEN)
@@ -78,6 +85,8 @@ class Bench:
 
     def close(self) -> None:
         self.dataset.close()
+        del self.scipy_variable
+        self.scipy.close()
         self.nc.close(self.ncid)
         self.nc.close(self.mapped)
 
@@ -107,6 +116,12 @@ class Bench:
             value = variable[t, y, x]
         return float(value)
 
+    def element_scipy(self, places: Places) -> float:
+        variable = self.scipy_variable
+        for t, y, x in places:
+            value = variable[t, y, x]
+        return float(value)
+
     def block_tessel(self, places: Places) -> np.ndarray:
         nc, ncid, varid = self.nc, self.ncid, self.varid
         for t, y, x in places:
@@ -125,6 +140,12 @@ class Bench:
             values = variable[t, y, x:x + TEN]
         return np.asarray(values)
 
+    def block_scipy(self, places: Places) -> np.ndarray:
+        variable = self.scipy_variable
+        for t, y, x in places:
+            values = variable[t, y, x:x + TEN]
+        return np.array(values, "f8")
+
     # The whole variable.
 
     def read_tessel(self) -> np.ndarray:
@@ -132,6 +153,10 @@ class Bench:
 
     def read_netcdf4(self) -> np.ndarray:
         return self.variable[:]
+
+    def read_scipy(self) -> np.ndarray:
+        """SciPy has the numbers as in the file; the others give them in this machine's order."""
+        return self.scipy_variable[:].astype("f8")
 
     def write_tessel(self) -> None:
         """A new file each time. The transposed array is column-major, and so not copied."""
@@ -153,6 +178,12 @@ class Bench:
             variable.set_auto_maskandscale(mask)
             variable[:] = self.data
 
+    def write_scipy(self) -> None:
+        with netcdf_file(self.path_of_new(), "w", version=2) as dataset:
+            for name, n in zip("tyx", self.shape):
+                dataset.createDimension(name, n)
+            dataset.createVariable("v", "f8", ("t", "y", "x"))[:] = self.data
+
     def path_of_new(self) -> Path:
         """Where a new file goes: first the one that is read, then one that comes and goes."""
         return self.new if self.path.exists() else self.path
@@ -170,6 +201,10 @@ class Bench:
         for _ in range(self.times):
             netCDF4.Dataset(self.path).close()
 
+    def open_scipy(self) -> None:
+        for _ in range(self.times):
+            netcdf_file(self.path, mmap=True).close()
+
     def masked(self, work: Work) -> Callable[[bool], Work]:
         """The work of netCDF4-python on the open variable, with masking and scaling or without."""
         def chosen(mask: bool) -> Work:
@@ -182,11 +217,11 @@ class Bench:
     def rows(self) -> list[Row]:
         small = [
             Row(f"{what}, {how}, {form}", "µs", expected.get(form), partial(ours, places),
-                self.masked(partial(theirs, places)), self.times)
-            for what, theirs, forms in (
-                ("one element", self.element_netcdf4,
+                self.masked(partial(theirs, places)), partial(of_scipy, places), self.times)
+            for what, theirs, of_scipy, forms in (
+                ("one element", self.element_netcdf4, self.element_scipy,
                  {"call": self.element_tessel, "method": self.element_method}),
-                ("ten elements", self.block_netcdf4,
+                ("ten elements", self.block_netcdf4, self.block_scipy,
                  {"call": self.block_tessel, "method": self.block_method}))
             for how, places, expected in (
                 ("one after the other", self.near, EXPECTED),
@@ -197,55 +232,64 @@ class Bench:
             *small,
             Row("one element, anywhere in the file, mapped", "µs", None,
                 partial(self.element_mapped, self.anywhere),
-                self.masked(partial(self.element_netcdf4, self.anywhere)), self.times),
+                self.masked(partial(self.element_netcdf4, self.anywhere)),
+                partial(self.element_scipy, self.anywhere), self.times),
             *(Row(name, "µs", expected, partial(self.open_tessel, nc),
-                  lambda mask: self.open_netcdf4, self.times)
+                  lambda mask: self.open_netcdf4, self.open_scipy, self.times)
               for name, expected, nc in (
                   ("open and close", 1, self.nc),
                   ("open and close, without the guard", None, self.unguarded))),
             Row("whole read", "ms", 1, self.read_tessel,
-                self.masked(self.read_netcdf4), 1),
+                self.masked(self.read_netcdf4), self.read_scipy, 1),
             Row("whole write, to a new file", "ms", 1, self.write_tessel,
-                lambda mask: lambda: self.write_netcdf4(mask), 1),
+                lambda mask: lambda: self.write_netcdf4(mask), self.write_scipy, 1),
         ]
 
     def check(self) -> None:
-        """Both sides give what was written, and write the same file."""
+        """All sides give what was written, and write the same file."""
         for row in self.rows():
             ours = row.tessel()
             for mask in (True, False):
                 np.testing.assert_array_equal(np.asarray(ours), np.asarray(row.netcdf4(mask)()))
+            self.remove_new()
+            np.testing.assert_array_equal(np.asarray(ours), np.asarray(row.scipy()))
         np.testing.assert_array_equal(self.read_tessel(), self.data)
         self.write_tessel()
         written = self.new.read_bytes()
         self.remove_new()
-        self.write_netcdf4(False)
-        assert written == self.new.read_bytes(), "the files differ"
+        for write in (lambda: self.write_netcdf4(False), self.write_scipy):
+            write()
+            assert written == self.new.read_bytes(), "the files differ"
+            self.remove_new()
 
 
 def table(bench: Bench, repetitions: int) -> tuple[list[str], dict[str, dict[str, Measured]]]:
     """The rows as Markdown, and as numbers."""
     scale = {"µs": 1e6, "ms": 1e3}
     lines = ["| | tessel | netCDF4, no masking | times faster | netCDF4, as it comes "
-             "| times faster | expected |", "|---|---:|---:|---:|---:|---:|---:|"]
+             "| times faster | expected | SciPy | times faster |",
+             "|---|---:|---:|---:|---:|---:|---:|---:|---:|"]
     rows = {}
     for row in bench.rows():
         count = repetitions if row.unit == "µs" else max(repetitions // 3, 1)
-        sides = [row.tessel, row.netcdf4(False), row.netcdf4(True)]
-        ours, bare, masked = measure(sides, count, row.times, bench.remove_new)
-        rows[row.name] = {"tessel": ours, "netcdf4": bare, "netcdf4, masked": masked}
-        show = [f"{side.time * scale[row.unit]:.3g} {row.unit}" for side in (ours, bare, masked)]
+        sides = [row.tessel, row.netcdf4(False), row.netcdf4(True), row.scipy]
+        taken = measure(sides, count, row.times, bench.remove_new)
+        ours, bare, masked, by_scipy = taken
+        rows[row.name] = {"tessel": ours, "netcdf4": bare, "netcdf4, masked": masked,
+                          "scipy": by_scipy}
+        show = [f"{side.time * scale[row.unit]:.3g} {row.unit}" for side in taken]
         missed = row.expected and bare.ratio < row.expected * (1 - NOISE)
         lines.append(f"| {row.name} | {show[0]} | {show[1]} | {bare.ratio:.3g} | {show[2]} | "
                      f"{masked.ratio:.3g} | {row.expected or '–'}"
-                     f"{', **missed**' if missed else ''} |")
+                     f"{', **missed**' if missed else ''} | {show[3]} | {by_scipy.ratio:.3g} |")
     return lines, rows
 
 
 def circumstances() -> str:
     """What was measured with."""
-    return (f"Python {platform.python_version()}, NumPy {np.__version__}, netCDF4-python "
-            f"{netCDF4.__version__}, netCDF library {netCDF4.getlibversion().split()[0]}.")
+    return (f"Python {platform.python_version()}, NumPy {np.__version__}, SciPy "
+            f"{scipy.__version__}, netCDF4-python {netCDF4.__version__}, netCDF library "
+            f"{netCDF4.getlibversion().split()[0]}.")
 
 
 def main() -> None:
