@@ -49,7 +49,7 @@ unknown              tessel.Unknown                      tessel.Unknown
 - A NumPy scalar and an array without dimensions become 1-by-1, an array of one dimension of length
   n becomes n-by-1. In a list, NumPy's real scalars are plain numbers too; bool is not.
 - Codes (of set_fill, set_default_format and strerror) are doubles in the host. An int32 array is no
-  error there, but the module reads its bytes as those of a double, which is another number. The
+  error there, but the module reads its bytes as a double's, so that a single one counts as 0. The
   methods convert; in a call, give an int, a float or a float64 array.
 - None stands for an element of a cell, or a field, that nothing was put into. It is no argument.
 - A str is UTF-16 in the host: a character beyond U+FFFF is two of the host's, and half of such a

@@ -78,8 +78,8 @@ _ARGUMENTS = {
     "argumentIsEmptySet": ("A code is an empty array.", "Give one number."),
     "badNumericType": (
         "A code is of another class than double and int32.",
-        "Give it as a double: an int32 is no error, but its bytes are read as those of a double, "
-        "which is another number."),
+        "Give it as a double: an int32 is no error, but its bytes are read as a double's, so that "
+        "a single one counts as 0."),
     "badDimidsType": (
         "A list of dimension ids is not of doubles.",
         "Give the ids as doubles, whatever ids of other kinds may be."),

@@ -55,7 +55,8 @@ def _errors(tag: str, *failures: tuple[str, str], count: str = "badInputParamete
 def _code(name: str, meaning: str, label: str) -> Argument:
     """A code, with what is easily done wrong in the host."""
     return Argument(name, CODE, f"""{meaning} In the host, and in a call by name, give a double: an
-        int32 is no error, but its bytes are read as those of a double, which is another number.""",
+        int32 is no error, but its bytes are read as a double's, so that a single one counts as
+        0.""",
                     label)
 
 

@@ -81,7 +81,7 @@ def test_every_cause_that_is_about_a_class_is_tried() -> None:
 def test_what_is_said_of_codes() -> None:
     """The module reads the bytes of an int32 as a double's. The page and the docstring of each
     operation that takes a code say so, and what to do; the words of the module's error do, too."""
-    assert nc("strerror", -33.0) != nc("strerror", numpy.int32(-33)) == "No error"
+    assert nc("strerror", -33.0) != nc("strerror", numpy.int32(-33)) == nc("strerror", 0.0)
     takers = [each for each in OPERATIONS
               if any(argument.kind is kinds.CODE for argument in each.arguments)]
     assert {each.short for each in takers} == {"set_fill", "set_default_format", "strerror"}
@@ -89,7 +89,8 @@ def test_what_is_said_of_codes() -> None:
         [code] = [argument for argument in each.arguments if argument.kind is kinds.CODE]
         for text in (reference.text_of(each), getattr(nc, each.short).__doc__):
             said = " ".join(text.split())
-            assert "give a double: an int32 is no error, but its bytes are read as" in said
+            assert ("give a double: an int32 is no error, but its bytes are read as a double's, so "
+                    "that a single one counts as 0.") in said
         assert code.kind.host.startswith("double;")
     assert meanings.MEANINGS["badNumericType"][1].startswith("Give it as a double:")
     assert "int32 array is no\n  error there" in (tessel.__doc__ or "")
