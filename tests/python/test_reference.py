@@ -121,6 +121,17 @@ def test_page_has_what_the_code_can_raise(operation: Operation) -> None:
         assert each.cause and each.message and not re.search(r"%[sduf]|[{}]", each.message)
 
 
+def test_each_conversion_is_filled() -> None:
+    """As many texts as conversions; the operation's name only where a name can stand."""
+    assert set(reference._FILLINGS) <= set(catalogue.ROWS)
+    for row, (_, message) in catalogue.ROWS.items():
+        conversions = re.findall("%.", message)
+        if row in reference._FILLINGS:
+            assert len(conversions) == len(reference._FILLINGS[row]), row
+        else:
+            assert conversions in ([], ["%s"]), row
+
+
 @each_operation
 def test_page_is_provoked(operation: Operation) -> None:
     """Each identifier is one that a test of the module expects; statuses are forced into every
