@@ -149,8 +149,11 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
     }
     const bool quick = isQuick(argc, argv);
     std::erase(arguments, std::string_view("--quick"));
-    if (quick && !document.empty()) {
-        std::fprintf(stderr, "Numbers that say nothing belong into no document.\n");
+    const bool part = std::any_of(argv, argv + argc, [](std::string_view argument) {
+        return argument.starts_with("--benchmark_filter");
+    });
+    if ((quick || part) && !document.empty()) {
+        std::fprintf(stderr, "A document has all rows, and none that is no measurement.\n");
         return 1;
     }
     std::string interleaving = "--benchmark_enable_random_interleaving=true";

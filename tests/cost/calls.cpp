@@ -176,6 +176,24 @@ void measureGuarded(const Module &guarded, const Dataset &data) {
                 data.numbers, Array::row({0, 3}), Array::row({10, 1}), ten());
 }
 
+/// How many variables there are besides does not count: not for the module, and not for the guard.
+void measureAmongMany(const Module &netcdf, const Module &guarded, const std::string &file) {
+    const double ncid = guarded("create", file, "CLOBBER")[0].number();
+    const double x = guarded("def_dim", ncid, "x", 10)[0].number();
+    double last = 0;
+    for (int i = 0; i < 8000; ++i) {
+        last = guarded("def_var", ncid, std::string("v").append(std::to_string(i)), NC_DOUBLE, x)[0]
+                   .number();
+    }
+    guarded("enddef", ncid);
+    measureCall("inq_varid, of 8000", Ends::well, netcdf, "inq_varid", ncid, "v7999");
+    measureCall("put_var1_double, of 8000", Ends::well, netcdf, "put_var1_double", ncid, last, 3,
+                1.5);
+    measureCall("put_var1_double, of 8000, guarded", Ends::well, guarded, "put_var1_double", ncid,
+                last, 3, 1.5);
+    guarded("close", ncid);
+}
+
 } // namespace
 
 int main() try {
@@ -190,6 +208,7 @@ int main() try {
     const Module guarded = netcdf.watchedBy(netcdfGuard({}));
     const Dataset known(guarded, folder.file("guarded.nc"));
     measureGuarded(guarded, known);
+    measureAmongMany(netcdf, guarded, folder.file("many.nc"));
     netcdf("close", data.ncid);
     guarded("close", known.ncid);
     std::printf("times=%d\n", measured);
