@@ -255,6 +255,7 @@ def made() -> str:
         "",
         *table("HOST", "The host's errors, each with the beginning of its message.", host()),
         *table("GUARD", "What the guard refuses.", guard()),
+        *table("CALLED", "What Python makes no call of.", refusals("module_object.cpp")),
         *table("GIVEN", "What Python makes no argument of.",
                refusals("to_host.cpp", "python_classes.cpp")),
         *table("RETURNED", "What Python makes nothing of that a call gives.",

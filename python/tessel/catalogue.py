@@ -828,6 +828,12 @@ GUARD: dict[str, str] = {
 }
 """What the guard refuses."""
 
+CALLED: dict[str, str] = {
+    "TESSEL:python:namedArgument":
+        "Operations take their arguments by position.",
+}
+"""What Python makes no call of."""
+
 GIVEN: dict[str, str] = {
     "TESSEL:python:integerTooLarge":
         "An integer is beyond 64 bits and no double holds it exactly.",

@@ -12,7 +12,7 @@ from collections.abc import Iterable, Iterator
 from dataclasses import dataclass
 from functools import cache
 
-from tessel.catalogue import GIVEN, GUARD, HOST, RAISES, RETURNED, ROWS, STATUSES
+from tessel.catalogue import CALLED, GIVEN, GUARD, HOST, RAISES, RETURNED, ROWS, STATUSES
 from tessel.errors import built_in_of, word_of
 from tessel.families import MEMBERS
 from tessel.kinds import SIZE
@@ -71,7 +71,7 @@ _BEFORE_THE_MODULE = {
     **{identifier: HOST[identifier] for identifier in (
         "TESSEL:host:nestedCall", "TESSEL:host:badOutputCount", "TESSEL:host:tooManyInputs",
         "TESSEL:host:missingInput")},
-    "TESSEL:python:namedArgument": "Operations take their arguments by position.",
+    **CALLED,
 }
 
 # Rows that are guards: the conditions before them leave them no case.

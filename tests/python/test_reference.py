@@ -76,7 +76,7 @@ def test_nothing_else_that_is_raised_escapes() -> None:
                                              file.read_text())}
     known = {*catalogue.HOST, *catalogue.GUARD, *catalogue.PACKAGE}
     assert len(literals) > 50 and literals <= known
-    assert {*catalogue.GIVEN, *catalogue.RETURNED} < set(catalogue.PACKAGE)
+    assert {*catalogue.CALLED, *catalogue.GIVEN, *catalogue.RETURNED} < set(catalogue.PACKAGE)
     put_together = [(file.name, line.strip()) for file in (ROOT / "python").rglob("*")
                     if file.suffix in (".py", ".cpp") for line in file.read_text().splitlines()
                     if re.search(r'Error\(.*"TESSEL:python:(?!\w+")', line)]
