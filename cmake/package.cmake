@@ -1,4 +1,4 @@
-# What other projects find the installation by: a CMake package and a pkg-config file.
+# What other projects find the installation by: a CMake package and files for pkg-config.
 include(CMakePackageConfigHelpers)
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/tessel)
@@ -19,6 +19,8 @@ install(FILES
 # Where it is installed is known when it is used: packages are made for another prefix than this.
 file(RELATIVE_PATH to_prefix /${CMAKE_INSTALL_LIBDIR}/pkgconfig /)
 string(REGEX REPLACE "/$" "" to_prefix ${to_prefix})
-configure_file(${CMAKE_CURRENT_LIST_DIR}/tessel.pc.in ${CMAKE_BINARY_DIR}/tessel.pc @ONLY)
-install(FILES ${CMAKE_BINARY_DIR}/tessel.pc
+foreach(name tessel tessel-netcdf-guard)
+    configure_file(${CMAKE_CURRENT_LIST_DIR}/${name}.pc.in ${CMAKE_BINARY_DIR}/${name}.pc @ONLY)
+endforeach()
+install(FILES ${CMAKE_BINARY_DIR}/tessel.pc ${CMAKE_BINARY_DIR}/tessel-netcdf-guard.pc
     DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT development)

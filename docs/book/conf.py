@@ -12,6 +12,7 @@ extensions = ["myst_parser", "breathe"]
 source_suffix = {".md": "markdown", ".rst": "restructuredtext"}
 myst_heading_anchors = 6
 highlight_language = "text"
+smartquotes = False  # what is quoted is to be pasted into programs
 
 breathe_projects = {"tessel": os.environ["TESSEL_DOXYGEN"]}
 breathe_default_project = "tessel"

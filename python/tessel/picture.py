@@ -111,7 +111,7 @@ def _slice(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
     parts = usable.transpose(others + drawn)
     at = next(index for index in np.ndindex(parts.shape[:len(others)])
               if not parts[index].mask.all())
-    if np.abs(parts[at]).max() > _LARGEST:
+    if float(np.abs(parts[at]).max()) > _LARGEST:
         raise NothingToDraw(f"it has values beyond {_LARGEST:g}")
     places = [axes[i].written(first[i] + index) for i, index in zip(others, at)
               if axes[i].variable is not None or axes[i].dimension.length > 1]
@@ -121,7 +121,7 @@ def _slice(dataset: Dataset, variable: Variable, values: np.ma.MaskedArray,
 def _drawable(axis: Axis) -> Axis:
     """The axis with positions that go one way; by index where the file's do not."""
     unwrapped = replace(axis, values=axis.unwrapped)
-    if unwrapped.is_monotonic and np.abs(unwrapped.values).max() <= _LARGEST:
+    if unwrapped.is_monotonic and float(np.abs(unwrapped.values).max()) <= _LARGEST:
         return unwrapped
     return Axis(axis.dimension, np.arange(axis.dimension.length, dtype=float))
 

@@ -2,6 +2,7 @@
 // act and a kind of call which operation reports it, and whether the last one is passed over in
 // silence.
 #include "support.hpp"
+#include "support/library.hpp"
 #include "system_calls.hpp"
 #include "tessel/netcdf_guard.hpp"
 
@@ -82,7 +83,10 @@ void redefineAndCloseGuarded(const std::string &file) {
     guarded("close", ncid);
 }
 
-enum class Silent { none, last, all };
+enum class Silent { none, look, last, all };
+
+/// Newer libraries look at the file before they open or make it, and go on if they cannot.
+constexpr std::size_t looks = libraryRelease < 41001 ? 0 : 1;
 
 struct Row {
     const char *name;
@@ -100,11 +104,11 @@ void PrintTo(const Row &row, std::ostream *out) {
 
 // clang-format off
 const Row rows[] = {
-    {"OpenOpen",      open,           SystemCall::open,  {"open"}},
-    {"OpenStat",      open,           SystemCall::stat,  {"open"}},
+    {"OpenOpen",      open,           SystemCall::open,  {"open"}, Silent::look},
+    {"OpenStat",      open,           SystemCall::stat,  {"open"}, Silent::look},
     {"OpenSeek",      open,           SystemCall::seek,  {"open"}},
     {"OpenRead",      open,           SystemCall::read,  {"open"}},
-    {"CreateOpen",    create,         SystemCall::open,  {"create"}},
+    {"CreateOpen",    create,         SystemCall::open,  {"create"}, Silent::look},
     {"CreateStat",    create,         SystemCall::stat,  {"create"}},
     {"CreateSeek",    create,         SystemCall::seek,  {"create"}},
     {"CreateWrite",   create,         SystemCall::write, {"create"}},
@@ -121,7 +125,7 @@ const Row rows[] = {
     {"CloseSeek",     appendAndClose, SystemCall::seek,  {"open", "putVara", "close"}, Silent::last},
     {"CloseWrite",    appendAndClose, SystemCall::write, {"putVara", "close"}, Silent::last},
     {"CloseRead",     appendAndClose, SystemCall::read,  {"open", "putVara", "close"}},
-    {"CloseStat",     appendAndClose, SystemCall::stat,  {"open", "close"}},
+    {"CloseStat",     appendAndClose, SystemCall::stat,  {"open", "close"}, Silent::look},
     {"CloseClose",    appendAndClose, SystemCall::close, {}, Silent::all},
     {"GuardedSeek",   appendAndCloseGuarded, SystemCall::seek,  {"open", "putVara", "close"}},
     {"GuardedWrite",  appendAndCloseGuarded, SystemCall::write, {"putVara", "close"}},
@@ -222,12 +226,15 @@ TEST_P(SystemCalls, FailInTurn) {
                          std::to_string(calls) + " fails: " + error.word);
             const Attempt came = attempt(row, n, {error.number});
             const std::size_t now = placeOf(came.raised, row, error.word);
-            EXPECT_GE(now, place) << came.raised << " after a later operation";
-            place = now;
-            seen[now] = true;
+            const bool look = row.silent == Silent::look && n <= looks;
             const bool maySilent =
-                row.silent == Silent::all || (row.silent == Silent::last && n == calls);
+                look || row.silent == Silent::all || (row.silent == Silent::last && n == calls);
             EXPECT_EQ(now == row.reportedBy.size(), maySilent) << came.raised;
+            if (!look) {
+                EXPECT_GE(now, place) << came.raised << " after a later operation";
+                place = now;
+                seen[now] = true;
+            }
             if (row.keeps) {
                 EXPECT_EQ(came.fault, "");
             }

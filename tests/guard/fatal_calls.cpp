@@ -74,15 +74,18 @@ const Fatal rows[] = {
      }},
     {"CreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode",
      "the flag 64 (a user-defined format) is set",
-     [](const Module &netcdf, const Folder &folder) { netcdf("create", folder.file("a.nc"), 64); }},
+     [](const Module &netcdf, const Folder &folder) { netcdf("create", folder.file("a.nc"), 64); },
+     41001},
     {"CreateWithTheOtherUserFormat", SIGSEGV, "TESSEL:guard:mode", "the flag 128",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("NC_CREATE", folder.file("a.nc"), 128 + 1);
-     }},
+     },
+     41001},
     {"TunedCreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode", "the flag 64",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 64, 1024, 1024);
-     }},
+     },
+     41001},
     {"OpenInMemory", SIGSEGV, "TESSEL:guard:mode", "the flag 32768 (NC_INMEMORY) is set",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("open", folder.file("a.nc"), 32768);
@@ -97,7 +100,8 @@ const Fatal rows[] = {
          netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
      }},
     {"OpenOfATypeWithoutSize", SIGFPE, "TESSEL:guard:header", "has a variable of the type 12",
-     [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); }},
+     [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); },
+     41001},
     {"NameOf300Letters", SIGSEGV, "TESSEL:guard:header", "has a name of 300 characters",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim",
@@ -105,7 +109,8 @@ const Fatal rows[] = {
                      "CDF\1" + words({0, 10, 1, 300}) + std::string(300, 'n') +
                          words({1, 0, 0, 0, 0})),
                 0);
-     }},
+     },
+     41001},
     {"VariableOfTooManyDimensions", SIGSEGV, "TESSEL:guard:header", "a variable of 3000 dimensions",
      [](const Module &netcdf, const Folder &folder) {
          // A few too many may go unnoticed.
@@ -119,12 +124,14 @@ const Fatal rows[] = {
                          "v\0\0\0"s + words({3000}) + ids + words({0, 0, 4, 4, 20000}) +
                          std::string(16, '\0')),
                 0);
-     }},
+     },
+     41001},
     {"NameWhoseLengthTheFileEndsIn", SIGSEGV, "TESSEL:guard:header", "characters in a name",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),
                 0);
-     }},
+     },
+     41001},
     {"CloseAfterACloseThatFailed", SIGSEGV, "TESSEL:netcdf:close:invalidDataType",
      "Close operation failed, library error message \"NetCDF: Not a valid data type",
      [](const Module &netcdf, const Folder &folder) {
@@ -154,7 +161,8 @@ const Fatal rows[] = {
          const int ncid = open(netcdf, folder, variableOfType(4));
          written(folder, "a.nc", variableOfType(12));
          netcdf("sync", ncid);
-     }},
+     },
+     41001},
     {"CountsThatWrapInRecords", SIGALRM, "TESSEL:guard:counts",
      "multiply to more than 64 bits hold",
      [](const Module &netcdf, const Folder &folder) {

@@ -2,8 +2,10 @@
 #pragma once
 
 #include "support.hpp"
+#include "support/library.hpp"
 
 #include <functional>
+#include <limits>
 #include <ostream>
 #include <span>
 
@@ -15,6 +17,7 @@ struct Fatal {
     const char *identifier; // of the error with it; "" if the call succeeds then
     const char *why;        // what the message says
     std::function<void(const Module &netcdf, const Folder &folder)> call;
+    int mended = std::numeric_limits<int>::max(); // the first release tried that survives it
 };
 
 inline void PrintTo(const Fatal &fatal, std::ostream *out) {

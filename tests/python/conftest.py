@@ -10,6 +10,11 @@ from collections.abc import Iterator
 
 import pytest
 import tessel
+from xarray.backends import api
+
+collect_ignore = [] if hasattr(api, "to_netcdf") else ["test_xarray_own.py"]
+"""xarray's own tests are those of its version, and what this puts into the place of xarray's
+functions is known for the oldest that is supported."""
 
 
 def pytest_configure(config: pytest.Config) -> None:

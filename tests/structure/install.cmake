@@ -1,5 +1,5 @@
-# Installs BUILD into PREFIX, and then uses nothing but that: builds PROGRAM by pkg-config, and the
-# projects of EXAMPLES by the CMake package, and runs all of it on FILE.
+# Installs BUILD into PREFIX, and then uses nothing but that: builds PROGRAM and one with a guard by
+# pkg-config, and the projects of EXAMPLES by the CMake package, and runs all of it on FILE.
 file(REMOVE_RECURSE ${PREFIX})
 execute_process(COMMAND ${CMAKE_COMMAND} --install ${BUILD} --prefix ${PREFIX}/usr
     OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
@@ -13,13 +13,19 @@ function(expect printed)
 endfunction()
 
 set(ENV{PKG_CONFIG_PATH} ${lib}/pkgconfig)
-execute_process(COMMAND pkg-config --cflags --libs tessel
-    OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
-separate_arguments(flags)
-execute_process(COMMAND ${COMPILER} -std=c++20 ${PROGRAM} ${flags} -Wl,-rpath,${lib}
-        -o ${PREFIX}/embed
-    COMMAND_ERROR_IS_FATAL ANY)
+function(build_by_pkg_config package program)
+    execute_process(COMMAND pkg-config --cflags --libs ${package}
+        OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
+    separate_arguments(flags)
+    get_filename_component(name ${program} NAME_WE)
+    execute_process(COMMAND ${COMPILER} -std=c++20 ${program} ${flags} -Wl,-rpath,${lib}
+            -o ${PREFIX}/${name}
+        COMMAND_ERROR_IS_FATAL ANY)
+endfunction()
+build_by_pkg_config(tessel ${PROGRAM})
 expect("90 values, from -89 to 89\n" ${PREFIX}/embed ${FILE} COADSY)
+build_by_pkg_config(tessel-netcdf-guard ${EXAMPLES}/embedding/guarded.cpp)
+expect("opened\n" ${PREFIX}/guarded ${FILE})
 
 foreach(project second_module embedding)
     execute_process(COMMAND ${CMAKE_COMMAND} -S ${EXAMPLES}/${project} -B ${PREFIX}/${project}

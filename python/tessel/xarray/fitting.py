@@ -15,6 +15,7 @@ from xarray.backends.netcdf3 import STRING_ENCODING
 from xarray.coding import strings, times, variables
 
 import tessel
+from tessel.xarray import elsewhere
 
 EXTERNAL = {"int8": ("schar", "BYTE"), "bytes8": ("text", "CHAR"), "int16": ("short", "SHORT"),
             "int32": ("int", "INT"), "float32": ("float", "FLOAT"), "float64": ("double", "DOUBLE")}
@@ -122,7 +123,7 @@ def checked(variable: Variable, name: Hashable) -> Variable:
     variable = variable.copy(deep=False)
     attrs, encoding = dict(variable.attrs), dict(variable.encoding)
     if "dtype" in encoding and encoding["dtype"] not in ("S1", str):
-        variable = conventions.ensure_dtype_not_object(variable, name=name)
+        variable = elsewhere.ensure_dtype_not_object(variable, name=name)
     if encoding.get("dtype") in ("S1", str) or variable.dtype.kind in "OSU":
         return variable
 
@@ -154,6 +155,8 @@ def checked(variable: Variable, name: Hashable) -> Variable:
 def external(variable: Variable, name: Hashable) -> Variable:
     """A variable that xarray has encoded, in one of the types that the files have, with its texts
     as characters."""
+    # Which newer versions of xarray do not count as encoding.
+    variable = elsewhere.ensure_dtype_not_object(variable, name=name)
     encoding = dict(variable.encoding)
     asked = {"dtype": encoding.pop("dtype")} if encoding.get("dtype") is str else {}
     variable = Variable(variable.dims, variable.data, variable.attrs, encoding, fastpath=True)

@@ -11,7 +11,6 @@ from typing import Any
 import xarray
 from numpy.typing import NDArray
 from xarray import Variable
-from xarray.backends.api import _validate_attrs, _validate_dataset_names
 from xarray.backends.common import AbstractWritableDataStore
 from xarray.conventions import _update_bounds_encoding, cf_encoder
 
@@ -21,7 +20,7 @@ from tessel.aside import written_aside
 from tessel.dataset import Dataset
 from tessel.new_dataset import NewDataset
 from tessel.transfer import BLOCK_BYTES, Progress, block_size, blocks, listener
-from tessel.xarray import fitting, opening
+from tessel.xarray import elsewhere, fitting, opening
 from tessel.xarray.blocks import BlockWriter, Slot
 
 FORMATS = {"NETCDF3_64BIT": "64bit-offset", "NETCDF3_64BIT_OFFSET": "64bit-offset",
@@ -56,8 +55,7 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
     in blocks of `block_bytes`. `progress` is told the bytes that are done, and all bytes, before
     the first block and after each.
     """
-    _validate_dataset_names(dataset)
-    _validate_attrs(dataset)
+    elsewhere.validate(dataset)
     form = _format(format)
     if mode not in ("w", "a"):
         raise tessel.Error("TESSEL:python:badMode",
