@@ -6,10 +6,14 @@ if(TESSEL_SANITIZE)
     # The interpreter is not built for the sanitizer, whose library must then come first, and with
     # it the C++ library, in which it looks for the function that throws. The interpreter does not
     # free all that it allocated; that is not ours to report.
-    foreach(name asan stdc++)
+    set(sanitizer asan)
+    if(TESSEL_SANITIZE STREQUAL thread)
+        set(sanitizer tsan)
+    endif()
+    foreach(name ${sanitizer} stdc++)
         execute_process(COMMAND ${CMAKE_CXX_COMPILER} -print-file-name=lib${name}.so
             OUTPUT_VARIABLE ${name} OUTPUT_STRIP_TRAILING_WHITESPACE)
     endforeach()
     list(APPEND TESSEL_PYTHON_TEST_ENVIRONMENT
-        LD_PRELOAD=${asan}:${stdc++} ASAN_OPTIONS=detect_leaks=0)
+        LD_PRELOAD=${${sanitizer}}:${stdc++} ASAN_OPTIONS=detect_leaks=0)
 endif()

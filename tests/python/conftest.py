@@ -27,7 +27,8 @@ def pytest_configure(config: pytest.Config) -> None:
 
 def pytest_collection_modifyitems(items: list[pytest.Item]) -> None:
     """Skips them there, for whoever runs pytest by hand."""
-    if "libasan" in os.environ.get("LD_PRELOAD", ""):
+    preloaded = os.environ.get("LD_PRELOAD", "")
+    if "libasan" in preloaded or "libtsan" in preloaded:
         for item in items:
             if item.get_closest_marker("without_sanitizers"):
                 item.add_marker(pytest.mark.skip(reason="not in a build with sanitizers"))
