@@ -208,13 +208,24 @@ const Name *nameOf(ModuleObject &self, Arguments arguments) {
         {py::reinterpret_borrow<py::object>(str), toHost(str, none), insteadOf(self, arguments)});
 }
 
-/// A call of the module; its error is one that Python makes, which adds what was called.
-py::object call(ModuleObject &self, const Name *name, Arguments arguments, bool named,
+/// Refuses arguments that were given by the names in a tuple.
+[[noreturn]] void refuseNamed(PyObject *names) {
+    std::string given;
+    for (const py::handle each : py::reinterpret_borrow<py::tuple>(names)) {
+        given.append(given.empty() ? "" : ", ").append(toUtf8(each)).append("=");
+    }
+    refuse("namedArgument",
+           "In this form, operations take their arguments by position, not as " + given + ".");
+}
+
+/// A call of the module; its error is one that Python makes, which adds what was called. `names`
+/// are those of arguments that have one, or null.
+py::object call(ModuleObject &self, const Name *name, Arguments arguments, PyObject *names,
                 ToPython convert) {
     std::optional<Error> failure;
     try {
-        if (named) {
-            refuse("namedArgument", "Operations take their arguments by position.");
+        if (names != nullptr) {
+            refuseNamed(names);
         }
         Inputs inputs(name, arguments);
         return valueOf(
@@ -240,11 +251,13 @@ PyObject *callObject(PyObject *self, PyObject *const *given, std::size_t flags, 
         ModuleObject &module = of(self);
         const Name *const name = nameOf(module, arguments);
         const py::object instead = name != nullptr ? name->instead : insteadOf(module, arguments);
-        const bool named = names != nullptr && PyTuple_GET_SIZE(names) != 0;
-        if (instead && !named) {
+        if (names != nullptr && PyTuple_GET_SIZE(names) == 0) {
+            names = nullptr;
+        }
+        if (instead && names == nullptr) {
             return called(instead, tupleOf(arguments, self));
         }
-        return call(module, name, arguments, named, toPython);
+        return call(module, name, arguments, names, toPython);
     });
 }
 
@@ -255,7 +268,7 @@ PyObject *callFunction(PyObject * /*extension*/, PyObject *const *given, Py_ssiz
         static_cast<void>(moduleOf(count == 0 ? Py_None : given[0]));
         ModuleObject &module = of(given[0]);
         const Arguments arguments(given + 1, static_cast<std::size_t>(count - 1));
-        return call(module, nameOf(module, arguments), arguments, false, convert);
+        return call(module, nameOf(module, arguments), arguments, nullptr, convert);
     });
 }
 

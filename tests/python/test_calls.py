@@ -113,8 +113,9 @@ def test_an_error_instead() -> None:
 @pytest.mark.parametrize("name", ["inq_libvers", "close"])
 def test_named_arguments(name: str) -> None:
     with pytest.raises(tessel.Error) as caught:
-        nc(name, ncid=3)
+        nc(name, ncid=3, **{"größe": 4})
     assert caught.value.identifier == "TESSEL:python:namedArgument"
+    assert caught.value.message.endswith("by position, not as ncid=, größe=.")
 
 
 def test_no_arguments() -> None:

@@ -134,3 +134,63 @@ def test_nothing_is_asked_of_a_dataset_that_could_not_be_closed(tmp_path, guard)
     done = subprocess.run([sys.executable, "-B", "-c", UNCLOSABLE, tmp_path / "a.nc", guard],
                           capture_output=True, text=True, check=False)
     assert (done.returncode, done.stdout) == (0, "TESSEL:netcdf:close:invalidDataType\n")
+
+
+HOSTILE = b"CDF\1" + bytes(4) + b"\0\0\0\x0a" + b"\x7f\xff\xff\xff" + bytes(16)
+"""A header that claims two thousand million dimensions."""
+
+ADDRESS = "https://127.0.0.1:1/a.nc"
+
+WAYS = {
+    "read": "tessel.read(path, 'v')",
+    "copy": "tessel.copy(path, 'new.nc')",
+    "check": "tessel.check(path)",
+    "tessel info": "main(['info', path])",
+    "tessel plot": "main(['plot', path, 'v', '-o', 'a.png'])",
+    "tessel copy": "main(['copy', path, 'new.nc'])",
+    "tessel check": "main(['check', path])",
+    "tessel.show": "show.main([path])",
+    "to_netcdf": "xarray.to_netcdf(Dataset({'w': 1}), path, 'a')",
+    "open_dataset": "open_dataset(path, engine='tessel')",
+}
+
+SEEN = """
+import sys, tessel
+from tessel import show, xarray
+from tessel.command import main
+from xarray import Dataset, open_dataset
+path = sys.argv[1]
+try:
+    {way}
+except tessel.Error as error:
+    print(error.identifier.rpartition(":")[2], file=sys.stderr)
+"""
+
+
+GUARDED_BY_DEFAULT = {name: value for name, value in os.environ.items() if name != "TESSEL_GUARD"}
+
+
+def said(way: str, path: str, folder: Path) -> str:
+    """The one line of the command, or the last word of the error."""
+    done = subprocess.run([sys.executable, "-B", "-c", SEEN.format(way=way), path], cwd=folder,
+                          text=True, capture_output=True, check=False, timeout=60,
+                          env=GUARDED_BY_DEFAULT)
+    [line] = done.stderr.splitlines()
+    return line
+
+
+@pytest.mark.parametrize("way", WAYS.values(), ids=WAYS.keys())
+def test_a_header_that_cannot_be_believed(tmp_path, way):
+    """It is the guard that refuses it, wherever a file is opened."""
+    (tmp_path / "hostile.nc").write_bytes(HOSTILE)
+    line = said(way, "hostile.nc", tmp_path)
+    assert line == "header" or "the library would trust the header" in line, line
+    assert os.listdir(tmp_path) == ["hostile.nc"]
+
+
+@pytest.mark.parametrize("way", WAYS.values(), ids=WAYS.keys())
+def test_addresses_everywhere(tmp_path, way):
+    """None of them is asked for; xarray's engine opens no address whatever the guard says."""
+    line = said(way, ADDRESS, tmp_path)
+    assert line in ("remote", "notAClassicFile") or "is an address" in line, line
+    assert os.listdir(tmp_path) == []
