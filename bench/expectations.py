@@ -98,7 +98,7 @@ REASONS = {
     **{f"Python: whole {each}": Reason(NOISE, 1.03) for each in ("read", "write, to a new file")},
     **{f"{each}, text of 64 MiB": Reason(ZEROS, 2.3) for each in ("get_var", "get_vara")},
     "get_att, text of 64 MiB": Reason(ZEROS, 4),
-    **{f"{each}, text of 64 MiB": Reason(ZEROS, 1.4)
+    **{f"{each}, text of 64 MiB": Reason(ZEROS, 1.45)
        for each in ("put_var", "put_vara", "put_att")},
     **{f"{each}, numbers of 64 MiB": Reason(UNCOPIED, 1.03) for each in BLOCKS},
     "get_var_double of 256 MiB": Reason(UNCOPIED, 1.03),
