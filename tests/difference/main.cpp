@@ -227,8 +227,7 @@ struct Planted {
     Deviation deviation;
     std::size_t mostSteps;
 };
-// What is left of a program depends on where the search began, and that on the compiler, too, which
-// evaluates arguments in an order of its own: these are the most of 25 seeds with each compiler.
+// What is left of a program depends on where the search began: these are the most of 25 seeds.
 constexpr std::array plantings = {
     Planted{"two values that change places", Deviation::swappedValues, 8},
     Planted{"dimensions that are not turned", Deviation::dimensionsAsIs, 5},

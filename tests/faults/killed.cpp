@@ -112,8 +112,11 @@ Writer writerOf(std::string_view name) {
 
 Options optionsOf(int argc, char **argv) {
     Options options;
-    for (int i = 1; i + 1 < argc; i += 2) {
+    for (int i = 1; i < argc; i += 2) {
         const std::string_view name = argv[i];
+        if (i + 1 == argc) {
+            throw std::invalid_argument(std::string(name).append(" is given no value"));
+        }
         const char *const value = argv[i + 1];
         if (name == "--kills") {
             options.kills = std::stoul(value);
