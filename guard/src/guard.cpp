@@ -32,7 +32,8 @@ constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fa
 constexpr int mapped = 0x10;                              // the file is kept in memory
 constexpr int hdf5 = 0x1000;
 constexpr int noFill = 0x100;
-constexpr std::size_t secondDataset = 4;   // among the inputs of copy_att
+constexpr double tooLong = 0x1p63;       // elements, which the library takes for a negative number
+constexpr std::size_t secondDataset = 4; // among the inputs of copy_att
 constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
 
 Datasets &datasets() {
@@ -85,6 +86,19 @@ std::string inQuotes(std::string_view path) {
 void lookAtName(std::string_view path, const GuardOptions &options) {
     if (!options.remote && isAddress(path)) {
         refuse(remote, inQuotes(path) + " is an address");
+    }
+}
+
+/// Looks at what the module answers. Where it refuses, as for a dataset or a variable that there is
+/// not, it will refuse the call itself.
+template <class Look>
+void unlessRefused(const Look &look) {
+    try {
+        look();
+    } catch (const Error &error) {
+        if (!std::string_view(error.identifier()).starts_with("TESSEL:netcdf:")) {
+            throw;
+        }
     }
 }
 
@@ -186,6 +200,16 @@ void lookAtAlignment(Inputs inputs, int ncid, const Dataset *dataset, const Ask 
     const bool zero = size(inputs[3]) == 0 || size(inputs[5]) == 0;
     if (zero && ask("inq", ncid)[1].number() > 0) {
         refuse(alignment, "an alignment is 0");
+    }
+}
+
+/// Looks at the dimensions of a variable that is to be defined.
+void lookAtLengths(int ncid, const tsArray *dimids, const Ask &ask) {
+    for (const std::uint64_t dimid : indices(dimids).value_or(Indices{})) {
+        const Results dimension = ask("inq_dim", ncid, static_cast<double>(dimid));
+        if (dimension[1].number() >= tooLong) {
+            refuse(lengths, inQuotes(dimension[0].utf8()) + " is 2^63 or longer");
+        }
     }
 }
 
@@ -367,20 +391,17 @@ class Guard : public Watcher {
             datasets().add(
                 *ncid, Datasets::make({})); // so that there is memory to note that its end failed
         }
-        try {
-            if (kind == Kind::tunedEndDefinition) {
-                lookAtAlignment(inputs, *ncid, dataset, ask);
-            } else if (isWrite()) {
-                const auto varid = integer(inputs[2]);
-                if (const auto write = writeOf(kind, inputs); write && varid) {
+        if (kind == Kind::tunedEndDefinition) {
+            unlessRefused([&] { lookAtAlignment(inputs, *ncid, dataset, ask); });
+        } else if (kind == Kind::defineVariable && tsGetClassID(inputs[4]) == tsDOUBLE) {
+            unlessRefused([&] { lookAtLengths(*ncid, inputs[4], ask); });
+        } else if (isWrite()) {
+            const auto varid = integer(inputs[2]);
+            if (const auto write = writeOf(kind, inputs); write && varid) {
+                unlessRefused([&] {
                     recordsEnd = lookAtRecords(*write, *ncid, *varid, dataset, ask, options);
-                }
+                });
             }
-        } catch (const Error &error) {
-            if (!std::string_view(error.identifier()).starts_with("TESSEL:netcdf:")) {
-                throw;
-            }
-            // There is no such dataset or variable, which the module says itself.
         }
     }
 

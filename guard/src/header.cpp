@@ -13,9 +13,11 @@
 #include <charconv>
 #include <cstddef>
 #include <cstdint>
+#include <limits>
 #include <memory>
 #include <optional>
 #include <string_view>
+#include <vector>
 
 namespace tessel::guard {
 namespace {
@@ -23,6 +25,7 @@ namespace {
 // The library's limits.
 constexpr std::uint64_t maxName = 256;
 constexpr std::uint64_t maxDimensions = 1024;
+constexpr std::uint64_t maxLength = std::numeric_limits<std::int64_t>::max();
 
 /// The lists of a header, by their tags.
 enum : std::uint32_t { dimensionList = 10, variableList = 11, attributeList = 12 };
@@ -134,7 +137,7 @@ class Walk {
         reader.skip(countSize); // the number of records
         for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.has(1); --n) {
             name();
-            reader.skip(countSize);
+            lengths.push_back(reader.number(countSize));
         }
         attributes();
         for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.has(1); --n) {
@@ -191,7 +194,14 @@ class Walk {
                              " dimensions, where " + std::to_string(maxDimensions) +
                              " are the most"};
         }
-        reader.skip(dimensions * countSize);
+        for (std::uint64_t n = dimensions; n > 0; --n) {
+            const std::uint64_t dimid = reader.number(countSize);
+            if (dimid < lengths.size() && lengths[dimid] > maxLength) {
+                throw Distrusted{"has a variable over a dimension of " +
+                                 std::to_string(lengths[dimid]) + " elements, where " +
+                                 std::to_string(maxLength) + " are the most"};
+            }
+        }
         attributes();
         if (reader.number(4) == typeWithoutSize) {
             throw Distrusted{"has a variable of the type " + std::to_string(typeWithoutSize) +
@@ -203,6 +213,7 @@ class Walk {
     static std::uint64_t padded(std::uint64_t bytes) noexcept { return (bytes + 3) / 4 * 4; }
 
     Reader reader;
+    std::vector<std::uint64_t> lengths; // of the dimensions
     std::size_t countSize = 4;
     std::size_t offsetSize = 4;
 };

@@ -32,6 +32,7 @@ constexpr std::array rows = {
     Row{"enddef", Kind::endDefinition, 2},
     Row{"end_def", Kind::endDefinition, 2},
     Row{"_enddef", Kind::tunedEndDefinition, 6},
+    Row{"def_var", Kind::defineVariable, 5},
     Row{"set_fill", Kind::setFill, 3},
     Row{"set_default_format", Kind::setDefaultFormat, 2},
     Row{"copy_att", Kind::copyAttribute, 6},

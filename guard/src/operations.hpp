@@ -22,6 +22,7 @@ enum class Kind {
     redefine,
     endDefinition,
     tunedEndDefinition,
+    defineVariable,
     setFill,
     setDefaultFormat,
     copyAttribute,

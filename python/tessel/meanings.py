@@ -351,6 +351,9 @@ _GUARD = {
     "closed": (
         "An earlier closing of the dataset failed; the library may have freed it, but not its id.",
         "Do not use the id again; open the file anew."),
+    "lengths": (
+        "A dimension of the variable is longer than the library counts.",
+        "Look at where the length comes from: a file has room for fewer elements."),
     "counts": (
         "The counts multiply to more than 64 bits hold.", "Look at where the counts come from."),
     "records": (

@@ -163,6 +163,27 @@ const Fatal rows[] = {
          netcdf("sync", ncid);
      },
      41001},
+    {"ALengthThatMultipliesToZero", SIGFPE, "TESSEL:guard:lengths", R"("b" is 2^63 or longer)",
+     [](const Module &netcdf, const Folder &folder) {
+         definingVariable(netcdf, folder, ncChar, {2, 0x1p63, 2});
+     }},
+    {"ALengthThatMultipliesToZeroWhenDefinitionsEnd", SIGFPE, "TESSEL:guard:lengths",
+     "take the length for a negative number",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {0, 0x1p63, 2}));
+     }},
+    {"OpenOfALengthThatMultipliesToZero", SIGFPE, "TESSEL:guard:header",
+     "has a variable over a dimension of 9223372036854775808 elements",
+     [](const Module &netcdf, const Folder &folder) {
+         const std::string dimensions = words({0, 1}) + "x\0\0\0"s + words({0, 2}) + words({0, 1}) +
+                                        "y\0\0\0"s + words({0x80000000, 0});
+         const std::string variable = words({0, 1}) + "v\0\0\0"s + words({0, 3}) +
+                                      words({0, 0, 0, 1, 0, 0}) + words({0, 0, 0}) +
+                                      words({2, 0, 0, 0, 200});
+         open(netcdf, folder,
+              "CDF\5" + words({0, 0}) + words({10, 0, 2}) + dimensions + words({0, 0, 0}) +
+                  words({11, 0, 1}) + variable + std::string(16, '\0'));
+     }},
     {"CountsThatWrapInRecords", SIGALRM, "TESSEL:guard:counts",
      "multiply to more than 64 bits hold",
      [](const Module &netcdf, const Folder &folder) {

@@ -45,6 +45,21 @@ const Passing rows[] = {
          netcdf("redef", ncid);
          netcdf("_enddef", ncid, 0, 0, 0, 0);
      }},
+    {"LengthsThatAreTooLargeForTheLibrary", "TESSEL:netcdf:endDef:formatSizeConstraintsViolated",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {2, 0x1p62, 2}));
+     }},
+    {"ALengthOfWhichNoVariableIs", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingVariable(netcdf, folder, ncDouble, {2});
+         netcdf("def_dim", ncid, "z", 0x1p63);
+         netcdf("enddef", ncid);
+     }},
+    {"AVariableOverADimensionThatThereIsNot", "TESSEL:netcdf:defVar:invalidDimensionIdOrName",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingVariable(netcdf, folder, ncDouble, {2});
+         netcdf("def_var", ncid, "w", ncDouble, 99);
+     }},
     {"AlignmentThatIsNegative", "TESSEL:netcdf:negativeSize",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = newDataset(netcdf, folder.file("a.nc"));

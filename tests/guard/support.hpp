@@ -81,6 +81,7 @@ inline std::string words(std::initializer_list<std::uint32_t> values) {
 constexpr double ncDouble = 6;
 constexpr double noFill = 256; // of set_fill
 constexpr double ncInt = 4;
+constexpr double ncChar = 2;
 
 /// A dataset in data mode: the fixed variable 0 over x (10), and the record variable 1 over t and
 /// x.
@@ -92,6 +93,21 @@ inline int newDataset(const Module &netcdf, const std::string &file, int flags =
     netcdf("def_var", ncid, "records", ncDouble,
            Array::row({static_cast<double>(x), static_cast<double>(t)}));
     netcdf("enddef", ncid);
+    return ncid;
+}
+
+/// In define mode, with a variable of these lengths in a file of 64-bit data.
+inline int definingVariable(const Module &netcdf, const Folder &folder, int type,
+                            std::initializer_list<double> lengths) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 32));
+    const Array dimids = Array::numeric(tsDOUBLE, std::array{std::size_t{1}, lengths.size()});
+    auto at = dimids.elements<double>().rbegin(); // the host's order
+    std::string name = "a";
+    for (const double length : lengths) {
+        *at++ = netcdf("def_dim", ncid, name, length)[0].number();
+        ++name[0];
+    }
+    netcdf("def_var", ncid, "v", type, dimids);
     return ncid;
 }
 
