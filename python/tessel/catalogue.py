@@ -814,6 +814,9 @@ GUARD: dict[str, str] = {
     "TESSEL:guard:closed":
         "The call was not made: <particulars>, and an earlier closing of the dataset "
         "failed, and the library may have freed its memory but not its id.",
+    "TESSEL:guard:lengths":
+        "The call was not made: <particulars>, and the library would take the length for "
+        "a negative number, divide by zero, or lay variables over one another.",
     "TESSEL:guard:counts":
         "The call was not made: <particulars>, and the library would write what is "
         "beyond the data, or for ever.",

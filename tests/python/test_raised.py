@@ -150,6 +150,13 @@ def defining() -> int:
     return ncid
 
 
+def enormous() -> int:
+    """A dataset of 64-bit data with a dimension that the library takes for a negative number."""
+    ncid = nc.create("enormous.nc", 32)
+    nc.def_dim(ncid, "x", 2.0**63)
+    return ncid
+
+
 # What the guard refuses, as what arguments are instead, by their names.
 REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
     ("remote", {"path": "https://127.0.0.1:1/a.nc"}),
@@ -157,6 +164,7 @@ REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
     ("mode", {"cmode": 64}),
     ("header", {"path": "overwritten.nc", "mode": "NOWRITE", "ncid": overwritten}),
     ("alignment", {"ncid": defining, "v_align": 0, "r_align": 0}),
+    ("lengths", {"ncid": enormous, "dimids": 0}),
     ("counts", {"start": [1, 0], "count": [-1, -1], "stride": [2, 1], "index": [1, 0]}),
     ("records", {"varid": 6, "index": [2**40],
                  "start": [2**40], "count": [1], "stride": [1]}),
