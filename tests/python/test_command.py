@@ -3,6 +3,7 @@
 
 from __future__ import annotations
 
+import json
 import os
 import pty
 import re
@@ -472,7 +473,8 @@ def test_missing_files(capsys, tmp_path, name):
         assert "\033" not in line and "\a" not in line
 
 
-def test_what_is_in_a_file_cannot_steer_a_terminal(capsys, tmp_path):
+def evil_commands(tmp_path: Path) -> list[list[str]]:
+    """Commands on files with escapes in all names and texts, and on files that are none."""
     path = Path(generate(tmp_path / "evil.nc", """dimensions: dddd = 2 ;
         variables: float vvvv(dddd) ; vvvv:aaaa = "bbbb" ; vvvv:units = "uuuu" ;
             char tttt(dddd) ;
@@ -484,14 +486,39 @@ def test_what_is_in_a_file_cannot_steer_a_terminal(capsys, tmp_path):
     evil = path.with_name("\033[2Jevil\r.nc")
     evil.write_bytes(data)
     target = tmp_path / "\033[31m.png"
-    for arguments in (["info", evil], ["info", evil, "\033[t\a"], ["check", evil],
-                      ["plot", evil, "\033[v\a", "-o", target],
-                      ["plot", evil, "\033[t\a", "-o", target],
-                      ["plot", evil, "\033[v\a", "-o", target, "--index", "\033[d\a=7"],
-                      ["copy", evil, tmp_path / "copy.nc"], ["ops", "\033[x"]):
+    commands = [["info", evil], ["info", evil, "\033[t\a"], ["check", evil],
+                ["plot", evil, "\033[v\a", "-o", target],
+                ["plot", evil, "\033[t\a", "-o", target],
+                ["plot", evil, "\033[v\a", "-o", target, "--index", "\033[d\a=7"],
+                ["copy", evil, tmp_path / "copy.nc"], ["ops", "\033[x"]]
+    for number, (content, _) in enumerate(WRONG.values()):
+        wrong = tmp_path / f"\033[{number}m.nc"
+        wrong.write_bytes(content)
+        commands += [["info", wrong], ["check", wrong], ["copy", wrong, tmp_path / "a.nc"]]
+    return [list(map(str, each)) for each in commands]
+
+
+STEERING = re.compile(r"[\x00-\x09\x0b-\x1f\x7f-\x9f]")
+
+
+def test_what_is_in_a_file_cannot_steer_a_terminal(capsys, tmp_path):
+    for arguments in evil_commands(tmp_path):
         _, output, errors = run(capsys, *arguments)
         assert output or errors
-        assert not re.search(r"[\x00-\x09\x0b-\x1f\x7f-\x9f]", output + errors)
+        assert not STEERING.search(output + errors)
+
+
+def test_what_the_libraries_print_cannot_either(tmp_path):
+    """They have the process's own standard error, which only a process of its own shows."""
+    commands = evil_commands(tmp_path)
+    program = ("import json, sys; from tessel.command import main; "
+               "print(*map(main, json.load(sys.stdin)))")
+    done = subprocess.run([sys.executable, "-B", "-c", program], input=json.dumps(commands),
+                          capture_output=True, check=True, text=True)
+    assert not STEERING.search(done.stdout + done.stderr)
+    failed = done.stdout.splitlines()[-1].split().count("1")
+    assert failed >= 3 * len(WRONG)
+    assert len(done.stderr.splitlines()) == failed  # and nothing else was printed there
 
 
 def test_a_reader_that_has_seen_enough(field):
