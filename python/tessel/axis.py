@@ -9,9 +9,10 @@ from collections.abc import Callable, Iterator
 from dataclasses import dataclass
 from datetime import timedelta
 from types import ModuleType
-from typing import TYPE_CHECKING
+from typing import TYPE_CHECKING, Any
 
 import numpy as np
+from numpy.typing import NDArray
 
 from tessel import wording
 from tessel.dataset import Dataset, Dimension, Variable
@@ -88,7 +89,7 @@ class Axis:
     """The positions along one dimension."""
 
     dimension: Dimension
-    values: np.ndarray
+    values: NDArray[Any]
     """One number for each index; the indices themselves where the file gives no usable ones."""
 
     variable: Variable | None = None
@@ -140,7 +141,7 @@ class Axis:
         return bool((steps > 0).all() or (steps < 0).all())
 
     @property
-    def unwrapped(self) -> np.ndarray:
+    def unwrapped(self) -> NDArray[Any]:
         """The positions; longitudes go on beyond the meridian where their count starts anew."""
         if not self.is_longitude:
             return self.values

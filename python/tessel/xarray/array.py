@@ -8,6 +8,7 @@ import operator
 from typing import Any
 
 import numpy as np
+from numpy.typing import NDArray
 from xarray.backends import BackendArray, CachingFileManager
 from xarray.core import indexing
 
@@ -55,16 +56,16 @@ class LazyArray(BackendArray):
     def __getstate__(self) -> dict[str, Any]:
         return {**self.__dict__, "_file": None}
 
-    def __getitem__(self, key: indexing.ExplicitIndexer) -> np.ndarray:
+    def __getitem__(self, key: indexing.ExplicitIndexer) -> NDArray[Any]:
         if isinstance(key, indexing.VectorizedIndexer):
             return indexing.explicit_indexing_adapter(
                 key, self.shape, indexing.IndexingSupport.OUTER, self._read)
         return self._read(key.tuple)
 
-    def _read(self, key: tuple[planning.Selector, ...]) -> np.ndarray:
+    def _read(self, key: tuple[planning.Selector, ...]) -> NDArray[Any]:
         return planning.read(self, key)
 
-    def block(self, start: list[int], count: list[int]) -> np.ndarray:
+    def block(self, start: list[int], count: list[int]) -> NDArray[Any]:
         """The values of a block."""
         if not count:
             return self._values(count, "get_var")
@@ -86,11 +87,11 @@ class LazyArray(BackendArray):
                 and self.shape[-1] * self.dtype.itemsize >= 2 * _LINE
                 and self.memory <= self.dtype.itemsize)
 
-    def strided(self, start: list[int], count: list[int], step: list[int]) -> np.ndarray:
+    def strided(self, start: list[int], count: list[int], step: list[int]) -> NDArray[Any]:
         """Every n-th value from a start on."""
         return self._values(count, "get_vars", start, count, step)
 
-    def _values(self, count: list[int], family: str, *places: list[int]) -> np.ndarray:
+    def _values(self, count: list[int], family: str, *places: list[int]) -> NDArray[Any]:
         while True:
             file = self._file or self._manager.acquire()
             try:
@@ -121,7 +122,7 @@ class LazyArray(BackendArray):
         return place.varid
 
 
-def _bytes(characters: str | np.ndarray) -> np.ndarray:
+def _bytes(characters: str | NDArray[Any]) -> NDArray[Any]:
     """Characters as bytes: the low byte of a host character is the byte in the file."""
     if isinstance(characters, str):
         encoded = characters.encode("utf-16-le", "surrogatepass")

@@ -164,10 +164,10 @@ class BlockWriter:
 
     def _compute(self, made: NewDataset, sink: Sink, told: Callable[[int], None]) -> None:
         import dask
-        from dask import array
+        from dask.array.core import Array
 
         schedule = (dask.base.get_scheduler(collections=[source for source, _ in self._graphs])
-                    or array.Array.__dask_scheduler__)
+                    or Array.__dask_scheduler__)
         client = _client_of(schedule)
         if client is not None:
             made.close()
@@ -191,7 +191,7 @@ class BlockWriter:
 
     def _tasks(self, sink: Sink) -> tuple[Dask, dict[Any, int]]:
         """The graph of all blocks, and the bytes of each by the key of the task that writes it."""
-        from dask import array
+        from dask.array.core import Array
         from dask.highlevelgraph import HighLevelGraph
 
         name = f"write-{uuid.uuid4().hex}"
@@ -207,7 +207,7 @@ class BlockWriter:
                 sizes[key] = slot.itemsize * math.prod(lengths)
         sources = [source for source, _ in self._graphs]
         graph = HighLevelGraph.from_collections(name, tasks, dependencies=sources)
-        return array.Array.__dask_optimize__(graph, list(sizes)), sizes
+        return Array.__dask_optimize__(graph, list(sizes)), sizes
 
 
 def _client_of(schedule: Any) -> Any:

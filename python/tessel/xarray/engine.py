@@ -27,7 +27,7 @@ class TesselBackendEntrypoint(BackendEntrypoint):
         except OSError:
             return False
 
-    def open_dataset(  # pylint: disable=arguments-differ
+    def open_dataset(  # type: ignore[override]  # pylint: disable=arguments-differ
             self, filename_or_obj: str | os.PathLike[Any], *, mask_and_scale: bool = True,
             decode_times: bool = True, concat_characters: bool = True, decode_coords: bool = True,
             drop_variables: str | Iterable[str] | None = None, use_cftime: bool | None = None,

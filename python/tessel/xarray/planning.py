@@ -22,13 +22,14 @@ import math
 import operator
 from collections.abc import Iterator, Sequence
 from dataclasses import dataclass
-from typing import NamedTuple, Protocol, Union
+from typing import Any, NamedTuple, Protocol, Union
 
 import numpy as np
+from numpy.typing import NDArray
 
 import tessel
 
-Selector = Union[int, slice, np.ndarray]
+Selector = Union[int, slice, NDArray[Any]]
 """What is selected of one dimension."""
 
 PIECE_BYTES = 2**20
@@ -74,15 +75,15 @@ class Reader(Protocol):
     """Reads a variable; everything in the library's order of dimensions."""
 
     shape: tuple[int, ...]
-    dtype: np.dtype
+    dtype: np.dtype[Any]
     costs: Costs
     memory: int
     """The bytes that a value needs on its way, where that is more than the result."""
 
-    def block(self, start: list[int], count: list[int]) -> np.ndarray:
+    def block(self, start: list[int], count: list[int]) -> NDArray[Any]:
         """The values of a block."""
 
-    def strided(self, start: list[int], count: list[int], step: list[int]) -> np.ndarray:
+    def strided(self, start: list[int], count: list[int], step: list[int]) -> NDArray[Any]:
         """Every n-th value from a start on."""
 
 
@@ -98,7 +99,7 @@ class Axis:
     step: int
     """From each position to the next; 0 where `places` has the positions."""
 
-    places: np.ndarray | None = None
+    places: NDArray[Any] | None = None
     back: Selector | None = None
     """What makes the selection of the values in ascending order; None where they are it."""
 
@@ -109,11 +110,12 @@ class Axis:
         start = int(self.places[begin])
         return start, int(self.places[end - 1]) + 1 - start
 
-    def pick(self, begin: int, end: int) -> slice | np.ndarray:
+    def pick(self, begin: int, end: int) -> slice | NDArray[Any]:
         """The positions of these numbers among all that are between them."""
         if self.places is None:
             return slice(None, None, self.step)
-        return self.places[begin:end] - self.places[begin]
+        picked: NDArray[Any] = self.places[begin:end] - self.places[begin]
+        return picked
 
     @property
     def contiguous(self) -> bool:
@@ -125,7 +127,7 @@ Groups = list[tuple[int, int]]
 """Positions that are read together, by their numbers: from the first up to the second."""
 
 
-def read(reader: Reader, key: Sequence[Selector]) -> np.ndarray:
+def read(reader: Reader, key: Sequence[Selector]) -> NDArray[Any]:
     """The selected values."""
     block = _block_of(reader.shape, key)
     if block is not None and _is_direct(reader, block[1]):
@@ -179,7 +181,7 @@ def _axis(selector: Selector, length: int, number: int) -> Axis:
     return Axis(length, place % length, 1, 1, None, 0)
 
 
-def _listed(selector: np.ndarray, length: int, number: int) -> Axis:
+def _listed(selector: NDArray[Any], length: int, number: int) -> Axis:
     if not selector.size:
         return Axis(length, 0, 0, 1)
     if selector.dtype.kind not in "iu":
@@ -213,7 +215,7 @@ def _is_direct(reader: Reader, count: list[int]) -> bool:
             or reader.memory * math.prod(count) <= PIECE_BYTES)
 
 
-def _turned_back(values: np.ndarray, axes: list[Axis]) -> np.ndarray:
+def _turned_back(values: NDArray[Any], axes: list[Axis]) -> NDArray[Any]:
     """The values as they were selected, from those in ascending order."""
     simple: list[Selector] = []
     listed = []
@@ -229,7 +231,7 @@ def _turned_back(values: np.ndarray, axes: list[Axis]) -> np.ndarray:
     return values
 
 
-def _read_by_parts(reader: Reader, axes: list[Axis], count: list[int]) -> np.ndarray:
+def _read_by_parts(reader: Reader, axes: list[Axis], count: list[int]) -> NDArray[Any]:
     groups = _cheapest(reader, axes)
     if groups is None:
         return reader.strided([each.first for each in axes], count,
