@@ -17,10 +17,11 @@ namespace tessel::guard {
 /// A dataset between the call that opened it and the one that ends it.
 struct Dataset {
     std::string path;
-    bool known = false;  // it was seen to be opened
-    FileIdentity file;   // of those that exist when they are opened
+    bool known = false; // it was seen to be opened
+    FileIdentity file;
     bool classic = true; // not based on HDF5
     bool writable = true;
+    bool shared = false; // its header is read again when it is redefined
     bool defining = false;
     bool filling = true;
     bool dead = false; // its end failed

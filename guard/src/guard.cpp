@@ -33,6 +33,7 @@ constexpr int mapped = 0x10;                              // the file is kept in
 constexpr int hdf5 = 0x1000;
 constexpr int noFill = 0x100;
 constexpr double tooLong = 0x1p63;       // elements, which the library takes for a negative number
+constexpr int share = 0x800;             // others change the file, too
 constexpr std::size_t secondDataset = 4; // among the inputs of copy_att
 constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
 
@@ -126,8 +127,9 @@ bool opensForWriting(const tsArray *mode) {
     return name == "WRITE" || name == "NC_WRITE";
 }
 
-/// Synchronising a dataset that is open for reading makes the library read its header again, from
-/// the file that it opened; its name may lead to another one by now.
+/// Synchronising a dataset that is open for reading makes the library read its header again, and so
+/// does the redefinition of one that is shared: from the file that it opened. Its name may lead to
+/// another one by now.
 void lookAtOpenHeader(const FileIdentity &opened) {
     for (const int descriptor : descriptorsOf(opened)) {
         if (const Header found = headerOf(descriptor); found.claim) {
@@ -365,6 +367,7 @@ class Guard : public Watcher {
             dataset.writable = creates || opensForWriting(inputs[2]);
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
+            dataset.shared = (flags & share) != 0;
             if (creates) {
                 dataset.classic =
                     lookAtCreation(flags, inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0);
@@ -381,7 +384,7 @@ class Guard : public Watcher {
             return;
         }
         Dataset *const dataset = datasets().find(*ncid);
-        if (kind == Kind::sync && dataset != nullptr && dataset->classic && !dataset->writable) {
+        if (dataset != nullptr && readsHeaderAgain(*dataset)) {
             lookAtOpenHeader(dataset->file);
         }
         if (kind == Kind::close && dataset != nullptr && dataset->classic && dataset->writable) {
@@ -409,18 +412,22 @@ class Guard : public Watcher {
     void remember(Inputs inputs, const Results &results, const Error *error) noexcept {
         if (kind == Kind::open || kind == Kind::create) {
             if (error == nullptr && !opening.empty()) {
+                Dataset &dataset = opening.mapped();
+                if (kind == Kind::create) { // it is there only now
+                    dataset.file = identityOf(dataset.path);
+                }
                 const auto ncid = static_cast<int>(results[results.size() - 1].number());
                 datasets().add(ncid, std::move(opening));
             }
             return;
         }
-        const auto first = integer(inputs[1]);
         if (kind == Kind::setDefaultFormat) {
             if (error == nullptr) {
-                datasets().defaultFormat = first.value_or(datasets().defaultFormat);
+                datasets().defaultFormat = code(inputs[1]).value_or(datasets().defaultFormat);
             }
             return;
         }
+        const auto first = integer(inputs[1]);
         if (!first) {
             return;
         }
@@ -454,8 +461,13 @@ class Guard : public Watcher {
         } else if (kind == Kind::endDefinition || kind == Kind::tunedEndDefinition) {
             dataset.defining = false;
         } else if (kind == Kind::setFill) {
-            dataset.filling = integer(inputs[2]) != noFill;
+            dataset.filling = code(inputs[2]) != noFill;
         }
+    }
+
+    [[nodiscard]] bool readsHeaderAgain(const Dataset &dataset) const noexcept {
+        return dataset.classic && ((kind == Kind::sync && !dataset.writable) ||
+                                   (kind == Kind::redefine && dataset.shared));
     }
 
     [[nodiscard]] bool isEnd() const noexcept { return kind == Kind::close || kind == Kind::abort; }

@@ -256,13 +256,18 @@ Header headerOf(int descriptor) {
     return found;
 }
 
+FileIdentity identityOf(const std::string &path) noexcept {
+    struct stat status {};
+    return stat(path.c_str(), &status) == 0 ? FileIdentity{status.st_dev, status.st_ino}
+                                            : FileIdentity{};
+}
+
 std::vector<int> descriptorsOf(const FileIdentity &file) {
     std::vector<int> found;
     const auto look = [&](int descriptor) {
         struct stat status {};
         if (fstat(descriptor, &status) == 0 && S_ISREG(status.st_mode) &&
-            file == FileIdentity{status.st_dev, status.st_ino} &&
-            (fcntl(descriptor, F_GETFL) & O_ACCMODE) == O_RDONLY) {
+            file == FileIdentity{status.st_dev, status.st_ino}) {
             found.push_back(descriptor);
         }
     };

@@ -35,8 +35,11 @@ Header headerOf(const std::string &path);
 /// The header of a file that is open.
 Header headerOf(int descriptor);
 
-/// The descriptors that the process has of this file for reading only, whatever became of its name.
-/// Other files of the process are none of a dataset's business.
+/// Which file has this name now; of nothing, if none has.
+FileIdentity identityOf(const std::string &path) noexcept;
+
+/// The descriptors that the process has of this file, whatever became of its name. Other files of
+/// the process are none of a dataset's business.
 std::vector<int> descriptorsOf(const FileIdentity &file);
 
 } // namespace tessel::guard

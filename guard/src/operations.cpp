@@ -7,6 +7,7 @@
 #include <array>
 #include <cmath>
 #include <cstdint>
+#include <cstring>
 #include <limits>
 #include <string_view>
 #include <type_traits>
@@ -98,6 +99,12 @@ std::optional<std::uint64_t> wrapped(const tsArray *array, std::size_t i) {
     }
 }
 
+/// Nothing for what no int holds.
+std::optional<int> truncated(double value) noexcept {
+    constexpr double end = 0x1p31;
+    return value > -end - 1 && value < end ? std::optional(static_cast<int>(value)) : std::nullopt;
+}
+
 struct Reader {
     tsClassID classID;
     std::optional<std::uint64_t> (*read)(const tsArray *, std::size_t);
@@ -141,9 +148,19 @@ std::optional<int> integer(const tsArray *input) {
     if (found == tsINT32) {
         return *static_cast<const std::int32_t *>(tsGetData(input));
     }
-    const double value = *static_cast<const double *>(tsGetData(input));
-    constexpr double end = 0x1p31;
-    return value > -end - 1 && value < end ? std::optional(static_cast<int>(value)) : std::nullopt;
+    return truncated(*static_cast<const double *>(tsGetData(input)));
+}
+
+std::optional<int> code(const tsArray *input) {
+    const tsClassID found = tsGetClassID(input);
+    if (tsIsEmpty(input) || (found != tsDOUBLE && found != tsINT32)) {
+        return std::nullopt;
+    }
+    const std::size_t width = found == tsDOUBLE ? sizeof(double) : sizeof(std::int32_t);
+    double value = 0;
+    std::memcpy(&value, tsGetData(input),
+                std::min(sizeof(value), width * tsGetNumberOfElements(input)));
+    return truncated(value);
 }
 
 std::optional<std::uint64_t> size(const tsArray *input) {

@@ -42,6 +42,10 @@ using Indices = std::vector<std::uint64_t>;
 /// Nothing for what the module refuses.
 std::optional<int> integer(const tsArray *input);
 
+/// A code, as the module reads it: the first eight bytes as a double, of which one int32 has half,
+/// and the others are zero. Nothing for what the module refuses.
+std::optional<int> code(const tsArray *input);
+
 /// A size, as the module reads it: 0 where it is below 1. Nothing for what the module refuses.
 std::optional<std::uint64_t> size(const tsArray *input);
 

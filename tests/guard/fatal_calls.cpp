@@ -9,6 +9,7 @@ namespace {
 using namespace std::string_literals;
 
 constexpr double wraps = -1; // as a count: 2^64-1
+constexpr int share = 2048;
 
 /// A call that must raise this error. Another one goes on.
 template <class Call>
@@ -183,6 +184,32 @@ const Fatal rows[] = {
          open(netcdf, folder,
               "CDF\5" + words({0, 0}) + words({10, 0, 2}) + dimensions + words({0, 0, 0}) +
                   words({11, 0, 1}) + variable + std::string(16, '\0'));
+     }},
+    {"RedefiningASharedHeaderThatWasOverwritten", SIGFPE, "TESSEL:guard:header",
+     "has a variable of the type 12",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         const int ncid = intOf(netcdf("open", folder.file("a.nc"), share + 1));
+         written(folder, "a.nc", variableOfType(12));
+         netcdf("redef", ncid);
+     },
+     41001},
+    {"RedefiningANewSharedHeaderThatWasOverwritten", SIGFPE, "TESSEL:guard:header",
+     "has a variable of the type 12",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), share);
+         written(folder, "a.nc", variableOfType(12));
+         netcdf("redef", ncid);
+     },
+     41001},
+    {"AnElementFarBeyondTheRecordsAfterACodeThatIsOneInteger", SIGXFSZ, "TESSEL:guard:records",
+     "ends at record 4000000000",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         const Array code = Array::numeric(tsINT32, std::array<std::size_t, 1>{1});
+         code.elements<std::int32_t>()[0] = 256; // the module reads a double: 0, which is to fill
+         netcdf("set_fill", ncid, code);
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
      }},
     {"CountsThatWrapInRecords", SIGALRM, "TESSEL:guard:counts",
      "multiply to more than 64 bits hold",
