@@ -94,6 +94,21 @@ TEST(NotFenced, MappedMemoryThatCannotGrow) {
     }
 }
 
+TEST(NotFenced, MappedMemoryWhoseFileIsCutOff) {
+    for (const Module &netcdf : {plainModule(), guardedModule()}) {
+        EXPECT_EQ(endOf([&](const Folder &folder) {
+                      const int made = intOf(netcdf("create", folder.file("a.nc"), 512));
+                      const int x = intOf(netcdf("def_dim", made, "x", 100'000));
+                      netcdf("def_var", made, "v", ncInt, x);
+                      netcdf("close", made);
+                      const int ncid = intOf(netcdf("open", folder.file("a.nc"), 16));
+                      std::filesystem::resize_file(folder.file("a.nc"), 200);
+                      netcdf("get_var_double", ncid, 0);
+                  }),
+                  strsignal(SIGBUS));
+    }
+}
+
 INSTANTIATE_TEST_SUITE_P(Rows, FatalCall, testing::ValuesIn(fatalCalls()),
                          [](const auto &row) { return row.param.name; });
 
