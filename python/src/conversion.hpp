@@ -28,6 +28,9 @@ Array toHost(py::handle value, Lenders &lenders);
 /// The Python value for a host array, None for none. A NumPy array takes over the array's memory.
 py::object toPython(Array array);
 
+/// The class of the objects that keep the memory of results.
+py::object makeOwnerClass();
+
 /// Raises the Error "TESSEL:python:" + word.
 [[noreturn]] void refuse(std::string_view word, const std::string &message);
 
@@ -36,7 +39,9 @@ py::object toPython(Array array);
 void raiseInPython(const py::object &exception);
 void raiseInPython(const Error &error);
 
-/// The classes of the package that the extension makes and recognises.
+/// The classes that the extension makes and recognises. All of them are there before the first
+/// call: a thread that makes one when it is first wanted may let others run meanwhile, which would
+/// wait for it and not let it run.
 struct PythonClasses {
     py::object error;
     py::object raised; ///< makes the error of a call
@@ -45,6 +50,7 @@ struct PythonClasses {
     py::object numpyScalar;
     py::object maskedArray;
     py::object path; ///< Python's own, of a file
+    py::object owner;
 
     /// Known once load has been called, by the extension's initialisation.
     static const PythonClasses &get();

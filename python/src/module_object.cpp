@@ -6,12 +6,14 @@
 
 #include "others_run.hpp"
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <memory>
 #include <memory_resource>
 #include <optional>
 #include <span>
+#include <string>
 #include <structmember.h>
 #include <unordered_map>
 #include <utility>
@@ -51,6 +53,18 @@ class Names {
     [[nodiscard]] bool mayKeep(PyObject *str) const {
         return PyUnicode_CHECK_INTERNED(str) != 0 && names.size() < most;
     }
+
+    /// For Python's search for what nobody can reach: all objects of Python's that are in here.
+    int visitEach(visitproc visit, void *arg) const {
+        for (const auto &[address, name] : names) {
+            Py_VISIT(name.str.ptr());
+            Py_VISIT(name.instead.ptr());
+        }
+        return 0;
+    }
+
+    /// What it held, and nothing is left.
+    [[nodiscard]] Names takeAll() { return std::exchange(*this, Names()); }
 
   private:
     std::unordered_map<PyObject *, Name> names;
@@ -136,14 +150,19 @@ class Inputs {
 /// Makes the value of one result.
 using ToPython = py::object (*)(Array array);
 
-/// A double by itself as an int; anything else as always.
+/// A whole double by itself as an int, where 64 bits hold it; anything else as always.
 py::object toInt(Array array) {
     if (array && array.classID() == tsDOUBLE && array.size() == 1 && array.imaginary() == nullptr) {
-        PyObject *const number = PyLong_FromDouble(array.number());
-        if (number == nullptr) {
-            throw py::error_already_set();
+        const double value = *static_cast<const double *>(array.data());
+        const bool fits = value >= -0x1p63 && value < 0x1p63;
+        const long long whole = fits ? static_cast<long long>(value) : 0;
+        if (static_cast<double>(whole) == value) {
+            PyObject *const number = PyLong_FromLongLong(whole);
+            if (number == nullptr) {
+                throw py::error_already_set();
+            }
+            return py::reinterpret_steal<py::object>(number);
         }
-        return py::reinterpret_steal<py::object>(number);
     }
     return toPython(std::move(array));
 }
@@ -177,23 +196,46 @@ py::tuple tupleOf(Arguments arguments, py::handle first = {}) {
     return tuple;
 }
 
-bool isName(Arguments arguments) {
-    return !arguments.empty() && PyUnicode_CheckExact(arguments[0]);
+/// The name that is called as the module reads it, whatever it is given as: up to the first zero,
+/// in any case. Nothing for what is no text.
+py::object lowerCaseName(py::handle given) {
+    Lenders lenders;
+    Array name;
+    try {
+        name = toHost(given, lenders);
+    } catch (const Error &) {
+        return {}; // the call says it
+    }
+    if (name.classID() != tsCHAR) {
+        return {};
+    }
+    std::string text = name.utf8();
+    text.resize(std::min(text.size(), text.find('\0')));
+    std::transform(text.begin(), text.end(), text.begin(), [](char c) {
+        return c >= 'A' && c <= 'Z' ? static_cast<char>(c + ('a' - 'A')) : c;
+    });
+    return toStr(text);
 }
 
 /// The function of Python's that takes the calls of this name, if any does.
 py::object insteadOf(const ModuleObject &self, Arguments arguments) {
-    if (!self.instead || !isName(arguments)) {
+    if (!self.instead || arguments.empty()) {
         return {};
     }
-    const py::object lower = py::handle(arguments[0]).attr("lower")();
-    return py::reinterpret_borrow<py::object>(
-        PyDict_GetItemWithError(self.instead.ptr(), lower.ptr()));
+    const py::object name = lowerCaseName(arguments[0]);
+    if (!name) {
+        return {};
+    }
+    PyObject *const found = PyDict_GetItemWithError(self.instead.ptr(), name.ptr());
+    if (found == nullptr && PyErr_Occurred() != nullptr) {
+        throw py::error_already_set();
+    }
+    return py::reinterpret_borrow<py::object>(found);
 }
 
 /// The name that was called; nullptr where it is not kept.
 const Name *nameOf(ModuleObject &self, Arguments arguments) {
-    if (!isName(arguments)) {
+    if (arguments.empty() || !PyUnicode_CheckExact(arguments[0])) {
         return nullptr;
     }
     PyObject *const str = arguments[0];
@@ -299,15 +341,33 @@ PyObject *makeNew(PyTypeObject *type, PyObject *arguments, PyObject *named) {
         [&] { return make(type, of(module).module, py::reinterpret_borrow<py::object>(instead)); });
 }
 
+int visit(PyObject *self, visitproc visit, void *arg) {
+    Py_VISIT(Py_TYPE(self));
+    Py_VISIT(of(self).instead.ptr());
+    return of(self).names.visitEach(visit, arg);
+}
+
+/// Lets go of what may lead back here. What is let go of may run code of anybody's, which must not
+/// find it in here any more.
+int letGo(PyObject *self) {
+    const py::object instead = std::exchange(of(self).instead, py::object());
+    const Names names = of(self).names.takeAll();
+    return 0;
+}
+
 void destroy(PyObject *self) {
     PyTypeObject *const type = Py_TYPE(self);
+    PyObject_GC_UnTrack(self);
     ModuleObject &module = of(self);
     if (module.head.weakReferences != nullptr) {
         PyObject_ClearWeakRefs(self);
     }
     std::destroy_at(&module.names);
     std::destroy_at(&module.instead);
-    std::destroy_at(&module.module);
+    {
+        const OthersRun others; // the last one of a module waits for calls in progress
+        std::destroy_at(&module.module);
+    }
     type->tp_free(self);
     Py_DECREF(type);
 }
@@ -352,7 +412,7 @@ What module(*arguments) gives if nothing else takes the calls of that name.)";
 constexpr const char *callIntsDoc = R"(call_ints(module, /, *arguments)
 --
 
-The same, with an int for each result that is a double by itself.)";
+The same, with an int for each result that is a whole double of 64 bits by itself.)";
 
 /// A function as Python's tables have it.
 template <class Pointer, class Function>
@@ -378,16 +438,19 @@ std::array<PyMethodDef, 3> functions = {
 } // namespace
 
 void addModuleClass(py::module_ &extension) {
-    std::array<PyType_Slot, 8> slots = {{{Py_tp_doc, const_cast<char *>(classDoc)},
-                                         {Py_tp_new, as<void *>(makeNew)},
-                                         {Py_tp_dealloc, as<void *>(destroy)},
-                                         {Py_tp_repr, as<void *>(represent)},
-                                         {Py_tp_call, as<void *>(PyVectorcall_Call)},
-                                         {Py_tp_getset, properties.data()},
-                                         {Py_tp_members, members.data()},
-                                         {0, nullptr}}};
+    std::array<PyType_Slot, 10> slots = {{{Py_tp_doc, const_cast<char *>(classDoc)},
+                                          {Py_tp_new, as<void *>(makeNew)},
+                                          {Py_tp_dealloc, as<void *>(destroy)},
+                                          {Py_tp_traverse, as<void *>(visit)},
+                                          {Py_tp_clear, as<void *>(letGo)},
+                                          {Py_tp_repr, as<void *>(represent)},
+                                          {Py_tp_call, as<void *>(PyVectorcall_Call)},
+                                          {Py_tp_getset, properties.data()},
+                                          {Py_tp_members, members.data()},
+                                          {0, nullptr}}};
     PyType_Spec spec = {"tessel._runtime.Module", sizeof(ModuleObject), 0,
-                        Py_TPFLAGS_DEFAULT | Py_TPFLAGS_BASETYPE | Py_TPFLAGS_HAVE_VECTORCALL,
+                        Py_TPFLAGS_DEFAULT | Py_TPFLAGS_BASETYPE | Py_TPFLAGS_HAVE_GC |
+                            Py_TPFLAGS_HAVE_VECTORCALL,
                         slots.data()};
     moduleClass = reinterpret_cast<PyTypeObject *>(PyType_FromSpec(&spec));
     if (moduleClass == nullptr || PyModule_AddFunctions(extension.ptr(), functions.data()) != 0) {

@@ -1,6 +1,7 @@
 // python/src/python_classes.cpp: what the conversions need of the Python side: classes, errors,
 // text.
 #include "conversion.hpp"
+#include "plain_class.hpp"
 
 namespace tessel::python {
 namespace {
@@ -24,7 +25,9 @@ void PythonClasses::load() {
                                 values.attr("Unknown"),
                                 numpy.attr("generic"),
                                 numpy.attr("ma").attr("MaskedArray"),
-                                py::module_::import("pathlib").attr("Path")};
+                                py::module_::import("pathlib").attr("Path"),
+                                makeOwnerClass()};
+    static_cast<void>(NumPy::get()); // looks NumPy's functions up, once
 }
 
 void refuse(std::string_view word, const std::string &message) {

@@ -22,30 +22,9 @@ struct Owner {
     Array array;
 };
 
-/// Made once, and never freed: the interpreter may be gone before this library is.
-PyTypeObject *ownerClass() {
-    static PyTypeObject *const made = [] {
-        const auto destroy = [](PyObject *self) {
-            PyTypeObject *const type = Py_TYPE(self);
-            std::destroy_at(&reinterpret_cast<Owner *>(self)->array);
-            PyObject_Free(self);
-            Py_DECREF(type);
-        };
-        std::array<PyType_Slot, 2> slots = {
-            {{Py_tp_dealloc, reinterpret_cast<void *>(static_cast<destructor>(destroy))},
-             {0, nullptr}}};
-        PyType_Spec spec = {"tessel._runtime.Owner", sizeof(Owner), 0,
-                            Py_TPFLAGS_DEFAULT | Py_TPFLAGS_DISALLOW_INSTANTIATION, slots.data()};
-        return reinterpret_cast<PyTypeObject *>(PyType_FromSpec(&spec));
-    }();
-    if (made == nullptr) {
-        throw py::error_already_set();
-    }
-    return made;
-}
-
 py::object ownerOf(Array array) {
-    Owner *const owner = PyObject_New(Owner, ownerClass());
+    auto *const ownerClass = reinterpret_cast<PyTypeObject *>(PythonClasses::get().owner.ptr());
+    Owner *const owner = PyObject_New(Owner, ownerClass);
     if (owner == nullptr) {
         throw py::error_already_set();
     }
@@ -196,6 +175,25 @@ py::object convert(const Array &array, py::handle owner, std::size_t depth) {
 }
 
 } // namespace
+
+py::object makeOwnerClass() {
+    const auto destroy = [](PyObject *self) {
+        PyTypeObject *const type = Py_TYPE(self);
+        std::destroy_at(&reinterpret_cast<Owner *>(self)->array);
+        PyObject_Free(self);
+        Py_DECREF(type);
+    };
+    std::array<PyType_Slot, 2> slots = {
+        {{Py_tp_dealloc, reinterpret_cast<void *>(static_cast<destructor>(destroy))},
+         {0, nullptr}}};
+    PyType_Spec spec = {"tessel._runtime.Owner", sizeof(Owner), 0,
+                        Py_TPFLAGS_DEFAULT | Py_TPFLAGS_DISALLOW_INSTANTIATION, slots.data()};
+    PyObject *const made = PyType_FromSpec(&spec);
+    if (made == nullptr) {
+        throw py::error_already_set();
+    }
+    return py::reinterpret_steal<py::object>(made);
+}
 
 py::object toPython(Array array) {
     if (!array) {

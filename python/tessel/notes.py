@@ -91,9 +91,11 @@ def _lines_of_function(error: Error, name: str, values: dict[str, Any],
 
 
 def _lines(error: Error, module: Any, arguments: tuple[Any, ...]) -> Iterator[str]:
-    if not arguments or not isinstance(arguments[0], str):
+    if not arguments or not isinstance(arguments[0], (str, bytes)):
         return
     name, *given = arguments
+    if isinstance(name, bytes):  # one character a byte, as for the module
+        name = name.decode("latin-1")
     row = operations.find(name) if isinstance(module, Netcdf) else None
     error.operation = row.short if row else name
     yield f"in {_call(error.operation, row, given)}"

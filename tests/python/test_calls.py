@@ -1,6 +1,7 @@
 """tests/python/test_calls.py: names of operations are kept by the object that they are, and calls
 find the operation that they name, whatever else has had that name's place in memory."""
 
+import gc
 import sys
 import weakref
 from pathlib import Path
@@ -63,9 +64,16 @@ def test_names_are_kept_but_not_without_end() -> None:
     assert kept(["".join(["no_operation_", str(i)]) for i in range(100)]) == 0
 
 
-@pytest.mark.parametrize("opening", ["create", "CREATE", "Nc_Create", "".join(["cre", "ate"])])
-@pytest.mark.parametrize("closing", ["close", "CLOSE", "abort", "".join(["clo", "se"])])
-def test_datasets_are_remembered_by_any_spelling(opening: str, closing: str) -> None:
+def spellings(name: str) -> list[object]:
+    """What the module takes for a name, none of them kept but the first two."""
+    made = "".join([name[:3], name[3:]])
+    return [name, name.upper(), made, Text(name), numpy.str_(name), made.encode(),
+            numpy.array(list(name)), f"{made}\0 and more"]
+
+
+@pytest.mark.parametrize("opening", [*spellings("create"), "Nc_Create"], ids=repr)
+@pytest.mark.parametrize("closing", [*spellings("close"), "abort"], ids=repr)
+def test_datasets_are_remembered_by_any_spelling(opening: object, closing: object) -> None:
     ncid = int(nc(opening, "any.nc", "CLOBBER").item())
     assert netcdf.path_of(ncid) == str(Path("any.nc").absolute())
     nc(closing, ncid)
@@ -94,11 +102,15 @@ def test_instead() -> None:
         return "instead"
 
     module = tessel.Module(nc, {"inq_libvers": instead})
-    for name in ("inq_libvers", "INQ_LibVers", "".join(["inq_", "libvers"])):
+    for name in (*spellings("inq_libvers"), "INQ_LibVers"):
         assert module(name, 1, None) == "instead"
-        assert seen.pop() == (module, name, 1, None) and not seen
+        given = seen.pop()
+        assert (given[0], *given[2:]) == (module, 1, None) and given[1] is name and not seen
         assert _runtime.call(module, name) == nc.inq_libvers()  # the module itself
     assert module("nc_inq_libvers") == nc.inq_libvers()  # another name
+    assert tessel.Module(nc, {None: instead})("inq_libvers") == nc.inq_libvers()
+    for wrong in ((), (3,), ("İnq_libvers",), (object(),)):  # nobody's
+        assert pytest.raises(tessel.Error, module, *wrong)
     assert tessel.Module(module)("inq_libvers") == nc.inq_libvers()  # the same module alone
 
 
@@ -108,6 +120,23 @@ def test_an_error_instead() -> None:
 
     with pytest.raises(ZeroDivisionError):
         tessel.Module(nc, {"inq_libvers": instead})("inq_libvers")
+
+
+class Uncomparable:
+    """A key that is found where "inq_libvers" would be, and does not say whether it is that."""
+
+    def __hash__(self) -> int:
+        return hash("inq_libvers")
+
+    def __eq__(self, _other: object) -> bool:
+        raise ZeroDivisionError
+
+
+def test_an_error_in_search_of_what_is_instead() -> None:
+    module = tessel.Module(nc, {Uncomparable(): print})  # type: ignore[dict-item]
+    for name in spellings("inq_libvers"):
+        with pytest.raises(ZeroDivisionError):
+            module(name)
 
 
 @pytest.mark.parametrize("name", ["inq_libvers", "close"])
@@ -141,14 +170,37 @@ def test_instances_end() -> None:
     assert gone() is None
 
 
+class Derived(tessel.Module):
+    """One with attributes."""
+
+
+@pytest.mark.parametrize("lead_back", [
+    lambda module, functions: functions.update(x=lambda *_: module),
+    lambda module, functions: (functions.update(x=lambda *_: module), module("x"),
+                               functions.clear()),  # what the kept name has is left
+    lambda module, functions: setattr(module, "itself", module),
+])
+def test_instances_that_lead_to_themselves_end(lead_back: object) -> None:
+    functions: dict[str, object] = {}
+    module = Derived(nc, functions)  # type: ignore[arg-type]
+    lead_back(module, functions)  # type: ignore[operator]
+    gone = weakref.ref(module)
+    gc.collect()
+    assert gone() is module
+    del module, functions
+    assert gone() is not None, "nothing led back"
+    gc.collect()
+    assert gone() is None
+
+
 def test_ints() -> None:
-    """Doubles by themselves and nothing else."""
+    """Whole doubles by themselves and nothing else."""
     ncid = nc.create("ints.nc", "CLOBBER")
     x = nc.def_dim(ncid, "x", 2)
     varid = nc.def_var(ncid, "v", nc.param("NC_DOUBLE"), [x, x])
-    nc.put_att_double(ncid, varid, "a", nc.param("NC_DOUBLE"), 2.5)
+    for name in "ac":
+        nc.put_att_double(ncid, varid, name, nc.param("NC_DOUBLE"), 1.0)
     nc.put_att_int(ncid, varid, "b", nc.param("NC_INT"), 2)
-    nc.put_att_double(ncid, varid, "c", nc.param("NC_DOUBLE"), numpy.inf)
 
     def ints(*arguments: object) -> object:
         return _runtime.call_ints(nc, *arguments)
@@ -156,9 +208,14 @@ def test_ints() -> None:
     name, xtype, dimids, natts = ints("inq_var", ncid, varid)  # type: ignore[misc]
     assert (name, xtype, natts) == ("v", 6, 3) and {type(xtype), type(natts)} == {int}
     assert dimids.tolist() == [[x, x]] and dimids.dtype == float
-    assert ints("get_att_double", ncid, varid, "a") == 2  # as int() makes one of it
+    for whole in (-3.0, -2.0**63, 2.0**62):
+        nc.put_att_double(ncid, varid, "a", nc.param("NC_DOUBLE"), whole)
+        found = ints("get_att_double", ncid, varid, "a")
+        assert type(found) is int and found == whole
     assert ints("get_att_int", ncid, varid, "b").tolist() == [[2]]  # type: ignore[attr-defined]
     assert ints("enddef", ncid) is None
-    with pytest.raises(OverflowError):
-        ints("get_att_double", ncid, varid, "c")
+    for other in (2.5, 2.0**63, numpy.inf):
+        nc.put_att_double(ncid, varid, "c", nc.param("NC_DOUBLE"), other)
+        kept = ints("get_att_double", ncid, varid, "c")
+        assert isinstance(kept, numpy.ndarray) and kept.tolist() == [[other]]
     nc.close(ncid)

@@ -9,6 +9,7 @@ from __future__ import annotations
 
 import os
 import random
+import subprocess
 import sys
 import threading
 import time
@@ -279,29 +280,54 @@ def test_other_threads_compute_while_the_library_works(
     assert read > 10
 
 
-def test_loading_waits_without_the_interpreters_lock(tmp_path: Path) -> None:
-    """A thread that loads a module waits for a long read of another one, and the rest goes on."""
-    length = 2**24
-    ncid = netcdf("create", str(tmp_path / "long.nc"), 512)
-    netcdf("def_var", ncid, "v", 6, netcdf("def_dim", ncid, "x", length))
-    netcdf("enddef", ncid)
-    netcdf("put_var_double", ncid, 0, np.zeros(length))
-    reading = threading.Thread(target=lambda: [netcdf("get_vars_double", ncid, 0, 0, length, 1)
-                                               for _ in range(3)])
-    loading = threading.Thread(target=lambda: [tessel.load("netcdf") for _ in range(100)])
-    longest = 0.0
-    reading.start()
-    loading.start()
-    while reading.is_alive():
-        before = time.monotonic()
-        sum(range(1000))
-        longest = max(longest, time.monotonic() - before)
-    loading.join()
-    began = time.monotonic()
-    netcdf("get_vars_double", ncid, 0, 0, length, 1)
-    one_read = time.monotonic() - began
-    netcdf("close", ncid)
-    assert longest < one_read / 2
+WITHIN_A_CALL = """
+import os, sys, threading, time
+import tessel
+from tessel import _runtime
+
+fifo, action = sys.argv[1:]
+nc = tessel.load("netcdf", "off")
+loaded = [_runtime.load_file(os.fsencode(nc.file))]
+os.mkfifo(fifo)
+
+def reading():
+    try:
+        nc("open", fifo, "NOWRITE")
+    except tessel.Error:
+        pass
+
+def loading():
+    _runtime.load_file(os.fsencode(nc.file))
+
+def unloading():
+    loaded.clear()
+
+def started(work):
+    thread = threading.Thread(target=work)
+    thread.start()
+    return thread
+
+def waits(thread):
+    thread.join(0.3)
+    return thread.is_alive()
+
+threads = [started(reading)]
+while not waits(started(lambda: nc("inq_libvers"))):
+    pass
+threads.append(started(globals()[action]))
+assert all(map(waits, threads))
+writer = os.open(fifo, os.O_WRONLY)  # for which the call has waited
+os.close(writer)
+for each in threads:
+    each.join()
+"""
+
+
+@pytest.mark.parametrize("action", ["loading", "unloading"])
+def test_what_waits_for_a_call_lets_others_run(tmp_path: Path, action: str) -> None:
+    """In the program, a call comes to its end only if the main thread gets on."""
+    subprocess.run([sys.executable, "-c", WITHIN_A_CALL, tmp_path / "fifo", action], check=True,
+                   timeout=60)
 
 
 def test_another_binding_under_one_lock(tmp_path: Path) -> None:
@@ -333,3 +359,34 @@ def test_another_binding_under_one_lock(tmp_path: Path) -> None:
     counts = threads.work(1)
     assert counts["theirs"] > WORKERS
     assert counts["ours"] > WORKERS
+
+
+FIRST_RESULTS = """
+import builtins, gc, threading, time
+import tessel
+nc = tessel.load("netcdf")
+
+def others_run(*_):
+    time.sleep(0.002)
+
+imported = builtins.__import__
+builtins.__import__ = lambda *given, **named: (others_run(), imported(*given, **named))[1]
+gc.callbacks.append(others_run)
+gc.set_threshold(1)
+barrier = threading.Barrier(4)
+
+def work():
+    barrier.wait()
+    assert nc("parameter", "NC_DOUBLE").tolist() == [[6]]
+
+threads = [threading.Thread(target=work) for _ in range(4)]
+for each in threads:
+    each.start()
+for each in threads:
+    each.join()
+"""
+
+
+def test_the_first_results_of_several_threads() -> None:
+    """What results are made with is not made by the first of them, while other threads may run."""
+    subprocess.run([sys.executable, "-c", FIRST_RESULTS], check=True, timeout=60)
