@@ -3,10 +3,12 @@
 // A call makes arrays and sees others go. Each thread keeps the rooms of some that went for the
 // next ones, so that most cost neither the heap nor a lock.
 #include "array_storage.hpp"
+#include "large_room.hpp"
 #include "tessel/runtime/module.hpp"
 
 #include <pthread.h>
 
+#include <atomic>
 #include <cstddef>
 #include <new>
 #include <utility>
@@ -35,36 +37,36 @@ void giveBackRooms(void * /*unused*/) {
 }
 
 /// How the end of a thread is learned: by a key of the system's, which can say that there is no
-/// memory. An object that is destroyed with the thread would end the process instead.
+/// memory. An object that is destroyed with the thread would end the process instead. Threads may
+/// outlive what makes and deletes the key, and ask for it.
+pthread_key_t threadEnd = 0;
+std::atomic<bool> threadEndIsThere = false;
+
 class ThreadEnd {
   public:
-    ThreadEnd() noexcept : there(pthread_key_create(&key, giveBackRooms) == 0) {}
+    ThreadEnd() noexcept { threadEndIsThere = pthread_key_create(&threadEnd, giveBackRooms) == 0; }
     ~ThreadEnd() {
-        if (there) {
-            pthread_key_delete(key);
+        if (threadEndIsThere.exchange(false)) {
+            pthread_key_delete(threadEnd);
         }
-        there = false;
+        giveBackRooms(nullptr); // of the thread that unloads this library
     }
     ThreadEnd(const ThreadEnd &) = delete;
     ThreadEnd &operator=(const ThreadEnd &) = delete;
-
-    /// Has the calling thread give its rooms back when it ends; false if it will not.
-    [[nodiscard]] bool isKnown() const noexcept {
-        return there && pthread_setspecific(key, &spare) == 0;
-    }
-
-  private:
-    pthread_key_t key{};
-    bool there;
 };
-const ThreadEnd threadEnd;
+const ThreadEnd makesAndDeletesTheKey;
+
+/// Has the calling thread give its rooms back when it ends; false if it will not.
+bool endIsKnown() noexcept {
+    return threadEndIsThere && pthread_setspecific(threadEnd, &spare) == 0;
+}
 
 /// Whether a room may be kept. Known once for a thread.
 bool mayKeep() noexcept {
     if (spare.count >= most || isChecked()) {
         return false;
     }
-    spare.endKnown = spare.endKnown || threadEnd.isKnown();
+    spare.endKnown = spare.endKnown || endIsKnown();
     return spare.endKnown;
 }
 
@@ -73,8 +75,13 @@ bool mayKeep() noexcept {
 
 void *tsArray::operator new(std::size_t size) {
     using tessel::spare;
-    if (spare.first == nullptr) {
-        return ::operator new(size);
+    if (spare.first == nullptr || tessel::isChecked()) {
+        void *const room =
+            tessel::orWithoutSpares([size] { return ::operator new(size, std::nothrow); });
+        if (room == nullptr) {
+            throw std::bad_alloc();
+        }
+        return room;
     }
     --spare.count;
     return std::exchange(spare.first, *static_cast<void **>(spare.first));

@@ -49,7 +49,7 @@ Header *largeBlock(std::size_t total, Fill fill) noexcept {
 }
 
 Header *heapBlock(std::size_t total, Fill fill) noexcept {
-    void *const memory = std::malloc(total);
+    void *const memory = orWithoutSpares([total] { return std::malloc(total); });
     if (memory == nullptr) {
         return nullptr;
     }

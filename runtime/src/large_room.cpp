@@ -5,6 +5,7 @@
 #include "tessel/runtime/module.hpp"
 
 #include <sys/mman.h>
+#include <sys/resource.h>
 
 #include <array>
 #include <atomic>
@@ -31,6 +32,19 @@ constexpr std::size_t largestSpare = std::size_t{256} << 20U;
 
 /// Where a sanitizer looks for those who use what they gave back, nothing waits.
 constexpr bool anyMayWait = TESSEL_KEEPS_MEMORY != 0;
+
+/// Outside of the object that sets it, which is no more when it is read.
+std::atomic<bool> ended = false;
+
+/// Whether the process may not have all the addresses that there are. Then what waits here would be
+/// missing elsewhere: in the library's heap, which cannot ask for it.
+bool isLimited() noexcept {
+    const auto limits = [](auto resource) {
+        rlimit limit{};
+        return getrlimit(resource, &limit) == 0 && limit.rlim_cur != RLIM_INFINITY;
+    };
+    return limits(RLIMIT_AS) || limits(RLIMIT_DATA);
+}
 
 std::size_t inWholePages(std::size_t bytes) noexcept {
     return (bytes + hugePage - 1) / hugePage * hugePage;
@@ -88,6 +102,9 @@ void keep(LargeRoom room) noexcept {
 /// A room that waits and is large enough, and at most twice as large: what is not used of it stays
 /// the kernel's to take.
 LargeRoom takeSpare(std::size_t bytes) noexcept {
+    if (isChecked()) {
+        return {};
+    }
     for (std::atomic<Spare *> &place : spares) {
         if (Spare *const spare = place.exchange(nullptr)) {
             const LargeRoom room = {spare, spare->size};
@@ -100,7 +117,21 @@ LargeRoom takeSpare(std::size_t bytes) noexcept {
     return {};
 }
 
-/// Gives the kernel all rooms that wait. True if there were any.
+/// The end of this library: blocks that go later go to the kernel.
+class End {
+  public:
+    End() = default;
+    ~End() {
+        ended = true;
+        dropSpares();
+    }
+    End(const End &) = delete;
+    End &operator=(const End &) = delete;
+};
+const End end;
+
+} // namespace
+
 bool dropSpares() noexcept {
     bool any = false;
     for (std::atomic<Spare *> &place : spares) {
@@ -111,8 +142,6 @@ bool dropSpares() noexcept {
     }
     return any;
 }
-
-} // namespace
 
 LargeRoom takeLargeRoom(std::size_t bytes, Fill fill) noexcept {
     if (const LargeRoom spare = takeSpare(bytes); spare.start != nullptr) {
@@ -127,7 +156,7 @@ LargeRoom takeLargeRoom(std::size_t bytes, Fill fill) noexcept {
 }
 
 void giveBack(LargeRoom room) noexcept {
-    if (!anyMayWait || room.size > largestSpare || isChecked()) {
+    if (!anyMayWait || room.size > largestSpare || isChecked() || ended || isLimited()) {
         unmap(room);
         return;
     }
@@ -135,6 +164,9 @@ void giveBack(LargeRoom room) noexcept {
     // anew, and until then the kernel may have the memory.
     madvise(static_cast<unsigned char *>(room.start) + hugePage, room.size - hugePage, MADV_FREE);
     keep(room);
+    if (ended) { // meanwhile
+        dropSpares();
+    }
 }
 
 } // namespace tessel

@@ -1,6 +1,7 @@
 // tests/runtime/memory_test.cpp: where the memory comes from, and that it goes back.
 #include "support.hpp"
 
+#include <dlfcn.h>
 #include <linux/seccomp.h>
 #include <malloc.h>
 #include <sys/prctl.h>
@@ -275,17 +276,97 @@ TEST(Memory, WhatWaitsGoesWhenAddressesRunOut) {
     if (sanitized) {
         GTEST_SKIP() << "none waits";
     }
-    EXPECT_EQ(inChild([] {
-                  writtenArray(64);
-                  limitAddresses();
-                  try {
-                      writtenArray(80);
-                  } catch (const Error &) {
-                      return 1;
-                  }
-                  return 0;
-              }),
-              0);
+    struct Row {
+        const char *what;
+        void (*run)();
+    };
+    // More than the limit leaves, and less than that and what waits.
+    constexpr Row rows[] = {
+        {"a large one", [] { writtenArray(80); }},
+        {"blocks of the heap",
+         [] {
+             std::vector<Array> kept(96);
+             for (Array &array : kept) {
+                 array = Array::logical(std::array<std::size_t, 1>{std::size_t{1} << 20U});
+             }
+         }},
+        {"arrays",
+         [] {
+             std::vector<Array> kept(500'000);
+             for (Array &array : kept) {
+                 array = Array::scalar(1);
+             }
+         }},
+    };
+    for (const Row &row : rows) {
+        SCOPED_TRACE(row.what);
+        EXPECT_EQ(inChild([&] {
+                      writtenArray(64);
+                      limitAddresses();
+                      try {
+                          row.run();
+                      } catch (const Error &) {
+                          return 1;
+                      }
+                      return 0;
+                  }),
+                  0);
+    }
+}
+
+TEST(Memory, NothingWaitsWhereThereIsALimit) {
+    if (sanitized) {
+        GTEST_SKIP() << "none waits";
+    }
+    for (const auto resource : {RLIMIT_AS, RLIMIT_DATA}) {
+        EXPECT_EQ(inChild([&] {
+                      const rlimit limit = {std::size_t{1} << 40U, std::size_t{1} << 40U};
+                      setrlimit(resource, &limit);
+                      const void *const where = writtenArray(8).data();
+                      return mappingFlags(where).empty() ? 0 : 1;
+                  }),
+                  0);
+    }
+}
+
+TEST(Memory, CheckedModeTakesNothingThatWaits) {
+    if (sanitized) {
+        GTEST_SKIP() << "none waits";
+    }
+    const void *const block = writtenArray(8).data();
+    const void *const room = Array::scalar(1).get();
+    setChecked(true);
+    const Array large = writtenArray(8);
+    const Array small = Array::scalar(1);
+    setChecked(false);
+    EXPECT_NE(large.data(), block);
+    EXPECT_NE(small.get(), room);
+}
+
+TEST(Memory, WhatWaitsGoesWithTheHost) {
+    void *const library = dlopen(TESSEL_OWN_HOST, RTLD_NOW | RTLD_LOCAL);
+    ASSERT_NE(library, nullptr) << dlerror();
+    const auto letGo = reinterpret_cast<const void *(*)()>(dlsym(library, "letGoOfLargeArray"));
+    ASSERT_NE(letGo, nullptr);
+    const void *const where = letGo();
+    if (!sanitized) {
+        EXPECT_NE(mappingFlags(where), "");
+    }
+    dlclose(library);
+    EXPECT_EQ(mappingFlags(where), "");
+    EXPECT_EQ(dlopen(TESSEL_OWN_HOST, RTLD_NOW | RTLD_NOLOAD), nullptr);
+}
+
+TEST(Memory, ThreadsThatOutliveTheHostKeepNothing) {
+    static std::optional<bool> usedAnothersKey;
+    void *const library = dlopen(TESSEL_OWN_HOST, RTLD_NOW | RTLD_LOCAL);
+    ASSERT_NE(library, nullptr) << dlerror();
+    const auto tellAfterwards =
+        reinterpret_cast<void (*)(void (*)(bool))>(dlsym(library, "tellAfterwards"));
+    ASSERT_NE(tellAfterwards, nullptr);
+    tellAfterwards([](bool used) { usedAnothersKey = used; });
+    dlclose(library);
+    EXPECT_EQ(usedAnothersKey, false);
 }
 
 /// Nothing under the sanitizers, which look for what is left by themselves.
