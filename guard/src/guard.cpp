@@ -118,13 +118,13 @@ Header lookAtOpening(const std::string &path, int flags) {
 /// Whether a file that is opened with this mode may be written to.
 bool opensForWriting(const tsArray *mode) {
     constexpr int write = 1;
-    if (tsGetClassID(mode) != tsCHAR) {
+    std::optional<std::string> name = text(mode);
+    if (!name) {
         return (integer(mode).value_or(0) & write) != 0;
     }
-    std::string name = utf8Of(mode);
-    std::transform(name.begin(), name.end(), name.begin(),
+    std::transform(name->begin(), name->end(), name->begin(),
                    [](unsigned char c) { return std::toupper(c); });
-    return name == "WRITE" || name == "NC_WRITE";
+    return *name == "WRITE" || *name == "NC_WRITE";
 }
 
 /// Synchronising a dataset that is open for reading makes the library read its header again, and so
@@ -354,7 +354,7 @@ class Guard : public Watcher {
 
     void look(Inputs inputs, const Ask &ask) {
         if (kind == Kind::open || kind == Kind::create) {
-            auto name = fileName(inputs[1]);
+            auto name = text(inputs[1]);
             if (!name) {
                 return;
             }

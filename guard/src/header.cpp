@@ -218,10 +218,19 @@ class Walk {
     std::size_t offsetSize = 4;
 };
 
-/// A file that is open for reading, if it can be.
+/// Whether a path leads to a regular file. To open anything else may wait, as a pipe does for
+/// whoever writes to it, or do something.
+bool isRegular(const std::string &path) noexcept {
+    struct stat status {};
+    return stat(path.c_str(), &status) == 0 && S_ISREG(status.st_mode);
+}
+
+/// A regular file that is open for reading, if it can be. It may be something else by the time that
+/// it is opened, which then does not wait.
 struct File {
     explicit File(const std::string &path)
-        : descriptor(::open(path.c_str(), O_RDONLY | O_CLOEXEC)) {}
+        : descriptor(isRegular(path) ? ::open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK)
+                                     : -1) {}
     ~File() {
         if (descriptor >= 0) {
             ::close(descriptor);

@@ -187,7 +187,7 @@ std::optional<Indices> indices(const tsArray *input) {
     return values;
 }
 
-std::optional<std::string> fileName(const tsArray *input) {
+std::optional<std::string> text(const tsArray *input) {
     if (tsGetClassID(input) != tsCHAR) {
         return std::nullopt;
     }

@@ -53,7 +53,8 @@ std::optional<std::uint64_t> size(const tsArray *input);
 /// truncated and negative values wrap around. Nothing for what the module refuses.
 std::optional<Indices> indices(const tsArray *input);
 
-/// A file name as the library gets it: up to the first zero.
-std::optional<std::string> fileName(const tsArray *input);
+/// A file name, or the name of a mode, as the library gets it: up to the first zero. Nothing for
+/// what is no text.
+std::optional<std::string> text(const tsArray *input);
 
 } // namespace tessel::guard

@@ -136,8 +136,8 @@ TEST(Closing, SynchronisesWhatIsOpenForWriting) {
     const Folder folder;
     const Module netcdf = guardedModule();
     netcdf("close", newDataset(netcdf, folder.file("a.nc")));
-    const Array modes[] = {Array::text("WRITE"), Array::text("nc_Write"), Array::scalar(1),
-                           Array::scalar(1)};
+    const Array modes[] = {Array::text("WRITE"), Array::text("nc_Write"),
+                           Array::text("WRITE\0 and more"s), Array::scalar(1)};
     for (const Array &mode : modes) {
         const int ncid = intOf(netcdf("open", folder.file("a.nc"), mode));
         netcdf("put_var1_double", ncid, 1, Array::row({0, 1000}), 7); // 80 kB

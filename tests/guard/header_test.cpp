@@ -2,6 +2,9 @@
 // merely wrong, which the library says itself.
 #include "support.hpp"
 
+#include <sys/stat.h>
+#include <unistd.h>
+
 #include <cstdint>
 #include <initializer_list>
 #include <ostream>
@@ -121,6 +124,16 @@ TEST_P(Header, IsLookedAt) {
 
 INSTANTIATE_TEST_SUITE_P(Claims, Header, testing::ValuesIn(claims),
                          [](const auto &row) { return row.param.name; });
+
+/// The module refuses the mode before the library sees the pipe.
+TEST(Pipe, IsNotOpened) {
+    const Folder folder;
+    ASSERT_EQ(mkfifo(folder.file("pipe").c_str(), 0600), 0);
+    alarm(20); // to open it would wait for whoever writes to it
+    EXPECT_EQ(identifierOf([&] { guardedModule()("open", folder.file("pipe"), "BAD"); }),
+              "TESSEL:netcdf:unrecognizedFileMode");
+    alarm(0);
+}
 
 } // namespace
 } // namespace tessel::test
