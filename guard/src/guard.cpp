@@ -13,6 +13,7 @@
 #include <algorithm>
 #include <array>
 #include <cctype>
+#include <cerrno>
 #include <cstddef>
 #include <cstdint>
 #include <filesystem>
@@ -329,6 +330,9 @@ class Guard : public Watcher {
         if (kind != Kind::other) {
             look(inputs, ask);
         }
+        // After a write that failed, the library takes whatever error the process has met since for
+        // one of its next write's.
+        errno = 0;
     }
 
     void after(Inputs inputs, const Results &results, const Error *error) noexcept override {

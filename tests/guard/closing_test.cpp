@@ -5,6 +5,7 @@
 #include <unistd.h>
 
 #include <array>
+#include <cerrno>
 #include <cstddef>
 #include <fstream>
 #include <utility>
@@ -188,6 +189,32 @@ TEST(Synchronising, LooksAtTheFileThatIsOpenWhateverItsName) {
     EXPECT_EQ(sync(writing), "") << "what is open for writing is not read again";
     netcdf("close", writing);
     netcdf("close", replaced);
+}
+
+/// What a write raises that follows a closing without room, and an error of something else.
+std::string writtenAfterAnError(const Module &netcdf, const Folder &folder) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int t = intOf(netcdf("def_dim", ncid, "t", 0));
+    const int varid = intOf(netcdf("def_var", ncid, "v", ncDouble, t));
+    constexpr double beyondTheDisk = 1 << 17;
+    netcdf("_enddef", ncid, 0, 4, 0, beyondTheDisk);
+    std::string raised;
+    {
+        const FullDisk full;
+        EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:netcdf:close:fileTooLarge");
+        errno = ENOENT;
+        raised = identifierOf([&] { netcdf("put_var1_double", ncid, varid, 2, 1); });
+    }
+    errno = 0;
+    netcdf("close", ncid);
+    return raised;
+}
+
+TEST(Writing, AfterAnErrorIsNotTakenForIt) {
+    const Folder folder;
+    EXPECT_EQ(writtenAfterAnError(plainModule(), folder),
+              "TESSEL:netcdf:putVar1:noSuchFileOrDirectory");
+    EXPECT_EQ(writtenAfterAnError(guardedModule(), folder), "");
 }
 
 /// As long as it lives, no file can be opened.
