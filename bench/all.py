@@ -66,6 +66,29 @@ PROGRAMS = [
 ]
 
 
+def state() -> str:
+    """Which state of the project is measured."""
+    git = ["git", "-C", str(PROJECT)]
+    commit = subprocess.run([*git, "rev-parse", "--short", "HEAD"], check=False, text=True,
+                            capture_output=True).stdout.strip()
+    changed = subprocess.run([*git, "diff", "--quiet", "HEAD", "--", ":!docs"], check=False)
+    return (commit or "no commit") + (", changed" if changed.returncode else "")
+
+
+def measured_at(program: Program, folder: Path) -> Path:
+    """The file that says which state the program's numbers are of."""
+    return program.numbers(folder).with_suffix(".state")
+
+
+def states(folder: Path) -> str:
+    """One line: the state that everything was measured in, or each program's."""
+    found = {each.name: measured_at(each, folder).read_text() for each in PROGRAMS}
+    if len(set(found.values())) == 1:
+        return f"Measured in one run, of commit {found.popitem()[1]}."
+    return "Measured in several runs: " + "; ".join(
+        f"{name} of {commit}" for name, commit in found.items()) + "."
+
+
 def run(programs: list[Program], built: Path, folder: Path, quick: bool) -> list[str]:
     """Runs them, with what they say in the folder as well; gives the names of those that measured
     what they must not."""
@@ -81,6 +104,7 @@ def run(programs: list[Program], built: Path, folder: Path, quick: bool) -> list
                 log.seek(0)
                 sys.exit(f"failed\n{log.read()}")
         print(f"{time.monotonic() - start:8.0f} s", flush=True)
+        measured_at(program, folder).write_text(state())
         if status == UNEXPECTED:
             unexpected.append(f"{program.name}: see {log.name}")
     return unexpected
@@ -105,7 +129,7 @@ def main() -> int:
     unexpected = run([] if options.tables else chosen, options.built, folder, options.quick)
     results = Results({each.name: each.numbers(folder) for each in PROGRAMS
                        if each.name in {row.program for row in ROWS}})
-    text = f"{PICTURE}\n\n{table(results)}"
+    text = f"{PICTURE}\n\n{states(folder)}\n\n{table(results)}"
     series = growth.all_series(names["bench_scaling"].numbers(folder))
     of_growth = growth.table(series)
     print(text, of_growth, sep="\n\n")
