@@ -313,6 +313,24 @@ const Row rows[] = {
          story.tell("close", [&] { netcdf()("close", ncid); });
          story.tell("open", [&] { netcdf()("open", story.file("log.nc"), "NOWRITE"); });
      }},
+    {"TheFileOfAWriterIsReplaced", // what it writes goes to the old one, of which nobody has the name
+     {"append: done", "sync: done", "close: done", "3 records of log.nc: intact"},
+     [](Story &story) {
+         const int ncid = story.openLog("log.nc");
+         story.makeLog("aside.nc");
+         std::filesystem::rename(story.file("aside.nc"), story.file("log.nc"));
+         story.appendAndClose(ncid);
+         story.look("log.nc", 3);
+     }},
+    {"TheFileOfAWriterIsCutOff", // nobody tells the writer: what its buffer has not is gone
+     {"append: done", "sync: done", "close: done", "2 records of log.nc: intact", "4 records of log.nc: another value in record 2, column 2499"},
+     [](Story &story) {
+         const int ncid = story.openLog("log.nc");
+         std::filesystem::resize_file(story.file("log.nc"), roomForThree - log::recordBytes);
+         story.appendAndClose(ncid);
+         story.look("log.nc", 2);
+         story.look("log.nc", 4);
+     }},
     {"TheMemoryIsLimited",
      {"get_var_double: TESSEL:host:outOfMemory",
       "get_vara_float: TESSEL:host:outOfMemory",

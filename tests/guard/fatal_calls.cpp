@@ -211,7 +211,7 @@ const Fatal rows[] = {
          netcdf("set_fill", ncid, code);
          netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
      }},
-    {"CountsThatWrapInRecords", SIGALRM, "TESSEL:guard:counts",
+    {"CountsThatWrapInRecords", SIGPROF, "TESSEL:guard:counts",
      "multiply to more than 64 bits hold",
      [](const Module &netcdf, const Folder &folder) {
          writeStrided(netcdf, folder, "put_vars_double", 1, Array::row({1, 0}),

@@ -3,6 +3,7 @@
 #include "fatal_calls.hpp"
 
 #include <sys/resource.h>
+#include <sys/time.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -37,7 +38,8 @@ std::string endOf(const std::function<void(const Folder &)> &calls) {
         const rlimit none = {0, 0};
         setrlimit(RLIMIT_FSIZE, &room);
         setrlimit(RLIMIT_CORE, &none);
-        alarm(2);
+        const itimerval twoSeconds = {{}, {2, 0}}; // of the processor, whatever else it does
+        setitimer(ITIMER_PROF, &twoSeconds, nullptr);
         const std::string identifier = identifierOf([&] { calls(folder); });
         _exit(identifier.empty() ? survivedCode : raisedCode);
     }
