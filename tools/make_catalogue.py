@@ -31,6 +31,7 @@ ONLY_THE_CALL_KNOWS = {
     "std::to_string(dims.size())": "<the number>",
     "typeName(value)": "<the type>",
     "typeName(key)": "<the type>",
+    "+ given +": "<the names>",
 }
 
 

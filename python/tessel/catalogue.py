@@ -833,7 +833,7 @@ GUARD: dict[str, str] = {
 
 CALLED: dict[str, str] = {
     "TESSEL:python:namedArgument":
-        "Operations take their arguments by position.",
+        "In this form, operations take their arguments by position, not as <the names>.",
 }
 """What Python makes no call of."""
 
