@@ -9,18 +9,18 @@
 
 #include <pybind11/pybind11.h>
 
-#include <cxxabi.h>
 #include <unistd.h>
 
 namespace tessel::python {
 
 /// What `work` gives, in which no object of C++ may need to be destroyed when it does not come
-/// back.
+/// back. It calls functions of Python's, out of which no exception of C++ comes: what is caught is
+/// the unwinding.
 template <class Work>
 auto orStop(const Work &work) {
     try {
         return work();
-    } catch (const abi::__forced_unwind &) {
+    } catch (...) {
         while (true) {
             pause();
         }

@@ -33,6 +33,14 @@ void *operator new(std::size_t bytes) {
     return memory;
 }
 
+void *operator new(std::size_t bytes, const std::nothrow_t & /*none*/) noexcept {
+    try {
+        return operator new(bytes);
+    } catch (const std::bad_alloc &) {
+        return nullptr;
+    }
+}
+
 void operator delete(void *memory) noexcept {
     if (memory != nullptr) {
         --allocations.alive;
