@@ -97,7 +97,7 @@ inline int newDataset(const Module &netcdf, const std::string &file, int flags =
 }
 
 /// In define mode, with a variable of these lengths in a file of 64-bit data.
-inline int definingVariable(const Module &netcdf, const Folder &folder, int type,
+inline int definingVariable(const Module &netcdf, const Folder &folder, double type,
                             std::initializer_list<double> lengths) {
     const int ncid = intOf(netcdf("create", folder.file("a.nc"), 32));
     const Array dimids = Array::numeric(tsDOUBLE, std::array{std::size_t{1}, lengths.size()});
