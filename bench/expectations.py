@@ -93,7 +93,7 @@ REASONS = {
     "get_vars, one element": Reason(STRIDED, 280e-9),
     "put_vars, one element": Reason(STRIDED, 280e-9),
     "get_att, one element": Reason(TWICE, 420e-9),
-    **{f"Python: {each}, anywhere in the file, {form}": Reason(FILLED, 1 / 12)
+    **{f"Python: {each}, anywhere in the file, {form}": Reason(FILLED, 1 / 8)
        for each in ("one element", "ten elements") for form in ("call", "method")},
     **{f"Python: whole {each}": Reason(NOISE, 1.03) for each in ("read", "write, to a new file")},
     **{f"{each}, text of 64 MiB": Reason(ZEROS, 2.3) for each in ("get_var", "get_vara")},

@@ -48,9 +48,12 @@ void copyStep(const tsChar *from, char *to) noexcept {
                                 _mm_and_si128(loaded(from + step / 2), low)));
 }
 
+#endif
+
 /// A copy by steps, of large blocks; what is before the first and behind the last step is small.
 template <class From, class To, class Each>
 void copy(const From *from, std::size_t count, To *to, Each each) noexcept {
+#ifdef __SSE2__
     if (count >= large) {
         const std::size_t before = unaligned(to);
         std::transform(from, from + before, to, each);
@@ -63,14 +66,9 @@ void copy(const From *from, std::size_t count, To *to, Each each) noexcept {
         to += at;
         count -= at;
     }
-    std::transform(from, from + count, to, each);
-}
-#else
-template <class From, class To, class Each>
-void copy(const From *from, std::size_t count, To *to, Each each) noexcept {
-    std::transform(from, from + count, to, each);
-}
 #endif
+    std::transform(from, from + count, to, each);
+}
 
 } // namespace
 
