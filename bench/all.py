@@ -84,9 +84,9 @@ def states(folder: Path) -> str:
     """One line: the state that everything was measured in, or each program's."""
     found = {each.name: measured_at(each, folder).read_text() for each in PROGRAMS}
     if len(set(found.values())) == 1:
-        return f"Measured in one run, of commit {found.popitem()[1]}."
-    return "Measured in several runs: " + "; ".join(
-        f"{name} of {commit}" for name, commit in found.items()) + "."
+        return f"Measured at commit {found.popitem()[1]}."
+    return "Measured at several commits: " + "; ".join(
+        f"{name} at {commit}" for name, commit in found.items()) + "."
 
 
 def run(programs: list[Program], built: Path, folder: Path, quick: bool) -> list[str]:

@@ -24,18 +24,7 @@ class NameIndex {
 
     /// The row of exactly this name; nullptr for any other.
     [[nodiscard]] constexpr const Row *find(const char *name) const {
-        Hash hash;
-        const char *end = name;
-        for (; *end != '\0'; ++end) {
-            hash.add(*end);
-        }
-        const std::string_view wanted(name, end);
-        for (std::size_t at = hash.slot(); !slots[at].name.empty(); at = next(at)) {
-            if (slots[at].name == wanted) {
-                return slots[at].row;
-            }
-        }
-        return nullptr;
+        return slots[slotOf(name)].row;
     }
 
   private:
@@ -43,39 +32,33 @@ class NameIndex {
     /// gap. A power of two, and sparse enough that gaps are frequent.
     static constexpr std::size_t slotCount = std::bit_ceil(8 * rows);
 
-    /// The hash of a name, a character at a time. What comes later waits for what came before, so
-    /// each step is short, and the one multiplication stands at the end.
-    class Hash {
-      public:
-        constexpr void add(char c) { value = std::rotl(value, 5) ^ static_cast<unsigned char>(c); }
-        [[nodiscard]] constexpr std::size_t slot() const {
-            return ((value * 0x9E3779B97F4A7C15U) >> 32U) % slotCount;
-        }
-
-      private:
-        std::uint64_t value = 0;
-    };
-
     struct Slot {
         std::string_view name;
         const Row *row = nullptr;
     };
 
-    static constexpr std::size_t next(std::size_t slot) { return (slot + 1) % slotCount; }
+    /// The slot of a name, or the gap where it would be. The hash is made a character at a time.
+    /// What comes later waits for what came before, so each step is short, and the one
+    /// multiplication stands at the end.
+    [[nodiscard]] constexpr std::size_t slotOf(const char *name) const {
+        std::uint64_t hash = 0;
+        const char *end = name;
+        for (; *end != '\0'; ++end) {
+            hash = std::rotl(hash, 5) ^ static_cast<unsigned char>(*end);
+        }
+        const std::string_view wanted(name, end);
+        std::size_t slot = ((hash * 0x9E3779B97F4A7C15U) >> 32U) % slotCount;
+        while (!slots[slot].name.empty() && slots[slot].name != wanted) {
+            slot = (slot + 1) % slotCount;
+        }
+        return slot;
+    }
 
-    constexpr void insert(std::string_view name, const Row &row) {
-        Hash hash;
-        for (const char c : name) {
-            hash.add(c);
+    constexpr void insert(const char *name, const Row &row) {
+        Slot &slot = slots[slotOf(name)];
+        if (slot.name.empty()) { // the first row of a name is the one that counts
+            slot = {name, &row};
         }
-        std::size_t at = hash.slot();
-        while (!slots[at].name.empty()) {
-            if (slots[at].name == name) {
-                return; // the first row of a name is the one that counts
-            }
-            at = next(at);
-        }
-        slots[at] = {name, &row};
     }
 
     std::array<Slot, slotCount> slots;

@@ -448,11 +448,11 @@ void addModuleClass(py::module_ &extension) {
                                           {Py_tp_getset, properties.data()},
                                           {Py_tp_members, members.data()},
                                           {0, nullptr}}};
-    PyType_Spec spec = {"tessel._runtime.Module", sizeof(ModuleObject), 0,
+    PyType_Spec type = {"tessel._runtime.Module", sizeof(ModuleObject), 0,
                         Py_TPFLAGS_DEFAULT | Py_TPFLAGS_BASETYPE | Py_TPFLAGS_HAVE_GC |
                             Py_TPFLAGS_HAVE_VECTORCALL,
                         slots.data()};
-    moduleClass = reinterpret_cast<PyTypeObject *>(PyType_FromSpec(&spec));
+    moduleClass = reinterpret_cast<PyTypeObject *>(PyType_FromSpec(&type));
     if (moduleClass == nullptr || PyModule_AddFunctions(extension.ptr(), functions.data()) != 0) {
         throw py::error_already_set();
     }

@@ -186,9 +186,9 @@ py::object makeOwnerClass() {
     std::array<PyType_Slot, 2> slots = {
         {{Py_tp_dealloc, reinterpret_cast<void *>(static_cast<destructor>(destroy))},
          {0, nullptr}}};
-    PyType_Spec spec = {"tessel._runtime.Owner", sizeof(Owner), 0,
+    PyType_Spec type = {"tessel._runtime.Owner", sizeof(Owner), 0,
                         Py_TPFLAGS_DEFAULT | Py_TPFLAGS_DISALLOW_INSTANTIATION, slots.data()};
-    PyObject *const made = PyType_FromSpec(&spec);
+    PyObject *const made = PyType_FromSpec(&type);
     if (made == nullptr) {
         throw py::error_already_set();
     }

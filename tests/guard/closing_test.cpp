@@ -16,19 +16,10 @@ namespace {
 
 using namespace std::string_literals;
 
-/// In define mode, which it cannot leave: the fill value has two values instead of one.
-int unclosable(const Module &netcdf, const std::string &file) {
-    const int ncid = intOf(netcdf("create", file, 0));
-    const int x = intOf(netcdf("def_dim", ncid, "x", 3));
-    netcdf("def_var", ncid, "v", ncInt, x);
-    netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
-    return ncid;
-}
-
 TEST(Closing, ThatFailsWhileDefiningLeavesTheDatasetAsItWas) {
     const Folder folder;
     const Module netcdf = guardedModule();
-    const int ncid = unclosable(netcdf, folder.file("a.nc"));
+    const int ncid = unclosable(netcdf, folder);
     const auto close = [&] { netcdf("close", ncid); };
     EXPECT_EQ(identifierOf(close), "TESSEL:netcdf:close:invalidDataType");
     EXPECT_EQ(identifierOf(close), "TESSEL:netcdf:close:invalidDataType");
@@ -42,16 +33,14 @@ TEST(Closing, ThatFailsWhileDefiningLeavesTheDatasetAsItWas) {
 TEST(Closing, WhileDefiningCanBeRepeatedWhenTheDiskWasFull) {
     const Folder folder;
     const Module netcdf = guardedModule();
-    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
-    const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
-    const int varid = intOf(netcdf("def_var", ncid, "v", ncDouble, x));
+    const int ncid = definingVariable(netcdf, folder, ncDouble, {20000});
     const auto close = [&] { netcdf("close", ncid); };
     {
         const FullDisk full;
         EXPECT_EQ(identifierOf(close), "TESSEL:netcdf:close:fileTooLarge");
         EXPECT_EQ(identifierOf(close), "TESSEL:netcdf:close:fileTooLarge");
     }
-    EXPECT_EQ(netcdf("inq_varid", ncid, "v")[0].number(), varid) << "it is open still";
+    EXPECT_EQ(netcdf("inq_varid", ncid, "v")[0].number(), 0) << "it is open still";
     EXPECT_EQ(identifierOf(close), "");
     EXPECT_EQ(std::filesystem::file_size(folder.file("a.nc")) / 1000, 160U) << "it is filled";
 }
@@ -59,7 +48,7 @@ TEST(Closing, WhileDefiningCanBeRepeatedWhenTheDiskWasFull) {
 TEST(ClosedDatasets, AreRefusedToEveryOperation) {
     const Folder folder;
     const Module netcdf = guardedModule();
-    const int ncid = unclosable(plainModule(), folder.file("a.nc"));
+    const int ncid = unclosable(plainModule(), folder);
     EXPECT_EQ(identifierOf([&] { netcdf("close", ncid); }), "TESSEL:netcdf:close:invalidDataType");
 
     const int other = newDataset(netcdf, folder.file("b.nc"));
@@ -85,9 +74,7 @@ TEST(ClosedDatasets, AreRefusedToEveryOperation) {
 TEST(Closing, CanBeRepeatedWhenTheDiskWasFull) {
     const Folder folder;
     const Module netcdf = guardedModule();
-    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
-    const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
-    netcdf("def_var", ncid, "v", ncDouble, x);
+    const int ncid = definingVariable(netcdf, folder, ncDouble, {20000});
     netcdf("set_fill", ncid, 256);
     netcdf("enddef", ncid);
     netcdf("put_var1_double", ncid, 0, 0, 7);
@@ -106,9 +93,7 @@ TEST(Closing, CanBeRepeatedWhenTheDiskWasFull) {
 /// A file of 160 kB, whose last value is changed, is closed on a full disk, and again when there is
 /// room. What the first closing raised, and the value then.
 std::pair<std::string, double> closedOnAFullDisk(const Module &netcdf, const Folder &folder) {
-    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
-    const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
-    netcdf("def_var", ncid, "v", ncDouble, x);
+    const int ncid = definingVariable(netcdf, folder, ncDouble, {20000});
     netcdf("enddef", ncid);
     netcdf("sync", ncid);
     netcdf("put_var1_double", ncid, 0, 19999, 7);

@@ -24,13 +24,9 @@ void wantError(std::string_view identifier, const Call &call) {
     }
 }
 
-/// A variable of another variable's length whose fill value has two values instead of one: the
-/// dataset cannot leave define mode, and not be closed.
-int unclosable(const Module &netcdf, const Folder &folder) {
-    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
-    const int x = intOf(netcdf("def_dim", ncid, "x", 3));
-    netcdf("def_var", ncid, "v", ncInt, x);
-    netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
+/// Closed once, which failed.
+int closedInVain(const Module &netcdf, const Folder &folder) {
+    const int ncid = unclosable(netcdf, folder);
     wantError("TESSEL:netcdf:close:invalidDataType", [&] { netcdf("close", ncid); });
     return ncid;
 }
@@ -136,18 +132,16 @@ const Fatal rows[] = {
     {"CloseAfterACloseThatFailed", SIGSEGV, "TESSEL:netcdf:close:invalidDataType",
      "Close operation failed, library error message \"NetCDF: Not a valid data type",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("close", unclosable(netcdf, folder));
+         netcdf("close", closedInVain(netcdf, folder));
      }},
     {"AbortAfterACloseThatFailed", SIGSEGV, "", "",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("abort", unclosable(netcdf, folder));
+         netcdf("abort", closedInVain(netcdf, folder));
      }},
     {"CloseAgainAfterAChangeOnAFullDisk", SIGSEGV, "TESSEL:netcdf:close:fileTooLarge",
      "Close operation failed, library error message \"File too large\"",
      [](const Module &netcdf, const Folder &folder) {
-         const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
-         const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
-         netcdf("def_var", ncid, "v", ncDouble, x);
+         const int ncid = definingVariable(netcdf, folder, ncDouble, {20000});
          netcdf("set_fill", ncid, noFill);
          netcdf("enddef", ncid);
          netcdf("rename_var", ncid, 0, "w");
@@ -166,12 +160,12 @@ const Fatal rows[] = {
      41001},
     {"ALengthThatMultipliesToZero", SIGFPE, "TESSEL:guard:lengths", R"("b" is 2^63 or longer)",
      [](const Module &netcdf, const Folder &folder) {
-         definingVariable(netcdf, folder, ncChar, {2, 0x1p63, 2});
+         definingVariable(netcdf, folder, ncChar, {2, 0x1p63, 2}, data64);
      }},
     {"ALengthThatMultipliesToZeroWhenDefinitionsEnd", SIGFPE, "TESSEL:guard:lengths",
      "take the length for a negative number",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {0, 0x1p63, 2}));
+         netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {0, 0x1p63, 2}, data64));
      }},
     {"OpenOfALengthThatMultipliesToZero", SIGFPE, "TESSEL:guard:header",
      "has a variable over a dimension of 9223372036854775808 elements",

@@ -47,11 +47,11 @@ const Passing rows[] = {
      }},
     {"LengthsThatAreTooLargeForTheLibrary", "TESSEL:netcdf:endDef:formatSizeConstraintsViolated",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {2, 0x1p62, 2}));
+         netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {2, 0x1p62, 2}, data64));
      }},
     {"ALengthOfWhichNoVariableIs", "",
      [](const Module &netcdf, const Folder &folder) {
-         const int ncid = definingVariable(netcdf, folder, ncDouble, {2});
+         const int ncid = definingVariable(netcdf, folder, ncDouble, {2}, data64);
          netcdf("def_dim", ncid, "z", 0x1p63);
          netcdf("enddef", ncid);
      }},

@@ -82,6 +82,7 @@ constexpr double ncDouble = 6;
 constexpr double noFill = 256; // of set_fill
 constexpr double ncInt = 4;
 constexpr double ncChar = 2;
+constexpr int data64 = 32; // of create
 
 /// A dataset in data mode: the fixed variable 0 over x (10), and the record variable 1 over t and
 /// x.
@@ -96,10 +97,10 @@ inline int newDataset(const Module &netcdf, const std::string &file, int flags =
     return ncid;
 }
 
-/// In define mode, with a variable of these lengths in a file of 64-bit data.
+/// In define mode, with the variable 0 of these lengths.
 inline int definingVariable(const Module &netcdf, const Folder &folder, double type,
-                            std::initializer_list<double> lengths) {
-    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 32));
+                            std::initializer_list<double> lengths, int flags = 0) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), flags));
     const Array dimids = Array::numeric(tsDOUBLE, std::array{std::size_t{1}, lengths.size()});
     auto at = dimids.elements<double>().rbegin(); // the host's order
     std::string name = "a";
@@ -108,6 +109,13 @@ inline int definingVariable(const Module &netcdf, const Folder &folder, double t
         ++name[0];
     }
     netcdf("def_var", ncid, "v", type, dimids);
+    return ncid;
+}
+
+/// In define mode, which it cannot leave: the fill value has two values instead of one.
+inline int unclosable(const Module &netcdf, const Folder &folder) {
+    const int ncid = definingVariable(netcdf, folder, ncInt, {3});
+    netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
     return ncid;
 }
 
