@@ -23,8 +23,9 @@ struct Dataset {
     bool writable = true;
     bool shared = false; // its header is read again when it is redefined
     bool defining = false;
+    bool modeInDoubt = false; // it may have left define mode
     bool filling = true;
-    bool dead = false; // its end failed
+    bool dead = false; // its closing failed
 
     /// Writes below this record fill nothing. Grows with what is written.
     std::uint64_t records = 0;

@@ -168,10 +168,24 @@ void settle(int ncid, Dataset &dataset, const Ask &ask) {
         }
     };
     if (dataset.defining) {
+        dataset.modeInDoubt = true;
         step("enddef");
+        dataset.modeInDoubt = false;
         dataset.defining = false;
     }
     step("sync");
+}
+
+/// An end of the definitions that fails may have left define mode. Synchronising tells, which in
+/// define mode does nothing but fail.
+void settleMode(int ncid, Dataset &dataset, const Ask &ask) {
+    dataset.modeInDoubt = false;
+    dataset.defining = false;
+    try {
+        ask("sync", ncid);
+    } catch (const Error &error) {
+        dataset.defining = error.identifier().ends_with(":operationNotAllowedInDefineMode");
+    }
 }
 
 /// Whether so much memory can be mapped.
@@ -391,6 +405,9 @@ class Guard : public Watcher {
         if (dataset != nullptr && readsHeaderAgain(*dataset)) {
             lookAtOpenHeader(dataset->file);
         }
+        if (dataset != nullptr && dataset->modeInDoubt && kind != Kind::abort) {
+            settleMode(*ncid, *dataset, ask);
+        }
         if (kind == Kind::close && dataset != nullptr && dataset->classic && dataset->writable) {
             settle(*ncid, *dataset, ask);
         }
@@ -436,19 +453,25 @@ class Guard : public Watcher {
             return;
         }
         Dataset *const dataset = datasets().find(*first);
-        if (isEnd() && dataset != nullptr) {
+        if (dataset == nullptr) {
+            return;
+        }
+        if (isEnd()) {
             rememberEnd(*first, *dataset, error);
-        } else if (error == nullptr && dataset != nullptr) {
+        } else if (error == nullptr) {
             rememberChange(inputs, *dataset);
+        } else if (endsDefinitions()) {
+            dataset->modeInDoubt = dataset->defining && dataset->classic;
         }
     }
 
-    /// A dataset whose end failed may be used when it is as it was: a classic one that was settled
-    /// before it was closed. An abort ends one in any case.
-    static void rememberEnd(int ncid, Dataset &dataset, const Error *error) noexcept {
-        const bool gone = error == nullptr || error->identifier().ends_with(":notNetcdfID");
-        const bool reached = !gone && error->identifier().starts_with("TESSEL:netcdf:");
-        if (reached && (!dataset.known || !dataset.classic || dataset.defining)) {
+    /// A dataset whose closing failed may be used when it is as it was: a classic one that was
+    /// settled before it was closed. An abort that the library was asked for ends one in any case.
+    void rememberEnd(int ncid, Dataset &dataset, const Error *error) const noexcept {
+        const bool reached = error != nullptr && error->identifier().starts_with("TESSEL:netcdf:");
+        const bool gone = error == nullptr || error->identifier().ends_with(":notNetcdfID") ||
+                          (kind == Kind::abort && reached);
+        if (!gone && reached && (!dataset.known || !dataset.classic)) {
             dataset.dead = true;
             datasets().anyDead = true;
         } else if (gone || !dataset.known) {
@@ -462,7 +485,7 @@ class Guard : public Watcher {
         } else if (kind == Kind::redefine) {
             dataset.defining = true;
             dataset.hasRecords.clear(); // variables may come, and dimensions be known anew
-        } else if (kind == Kind::endDefinition || kind == Kind::tunedEndDefinition) {
+        } else if (endsDefinitions()) {
             dataset.defining = false;
         } else if (kind == Kind::setFill) {
             dataset.filling = code(inputs[2]) != noFill;
@@ -472,6 +495,10 @@ class Guard : public Watcher {
     [[nodiscard]] bool readsHeaderAgain(const Dataset &dataset) const noexcept {
         return dataset.classic && ((kind == Kind::sync && !dataset.writable) ||
                                    (kind == Kind::redefine && dataset.shared));
+    }
+
+    [[nodiscard]] bool endsDefinitions() const noexcept {
+        return kind == Kind::endDefinition || kind == Kind::tunedEndDefinition;
     }
 
     [[nodiscard]] bool isEnd() const noexcept { return kind == Kind::close || kind == Kind::abort; }

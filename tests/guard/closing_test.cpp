@@ -45,6 +45,66 @@ TEST(Closing, WhileDefiningCanBeRepeatedWhenTheDiskWasFull) {
     EXPECT_EQ(std::filesystem::file_size(folder.file("a.nc")) / 1000, 160U) << "it is filled";
 }
 
+/// A dataset whose definitions were ended without room: the library has left define mode, and says
+/// that it failed.
+int endedWithoutRoom(const Module &netcdf, const Folder &folder) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+    const int t = intOf(netcdf("def_dim", ncid, "t", 0));
+    netcdf("def_var", ncid, "v", ncDouble, t);
+    netcdf("def_var", ncid, "filled", ncInt, Array::numeric(tsDOUBLE, std::array{std::size_t{0}}));
+    constexpr double beyondTheDisk = 1 << 17;
+    EXPECT_EQ(identifierOf([&] { netcdf("_enddef", ncid, 0, beyondTheDisk, 2, 4); }),
+              "TESSEL:netcdf:pEndDef:fileTooLarge");
+    return ncid;
+}
+
+TEST(EndOfDefinitions, ThatFailedMayHaveLeftDefineMode) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    int ncid = 0;
+    {
+        const FullDisk full;
+        ncid = endedWithoutRoom(netcdf, folder);
+        EXPECT_EQ(identifierOf([&] { netcdf("put_var1_double", ncid, 0, 4e9, 1); }),
+                  "TESSEL:guard:records");
+    }
+    EXPECT_EQ(identifierOf([&] { netcdf("_enddef", ncid, 0, 0, 0, 0); }),
+              "TESSEL:netcdf:pEndDef:operationNotAllowedInDataMode");
+    EXPECT_EQ(identifierOf([&] { netcdf("put_var1_double", ncid, 0, 1, 7); }), "");
+    EXPECT_EQ(netcdf("get_var1_double", ncid, 0, 1)[0].number(), 7);
+    netcdf("close", ncid);
+}
+
+TEST(EndOfDefinitions, ThatFailedMayNotHaveLeftDefineMode) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    const int ncid = unclosable(netcdf, folder);
+    const int t = intOf(netcdf("def_dim", ncid, "t", 0));
+    netcdf("def_var", ncid, "w", ncInt, t);
+    for (const char *operation : {"enddef", "close"}) {
+        EXPECT_EQ(identifierOf([&] { netcdf(operation, ncid); }),
+                  std::string("TESSEL:netcdf:") + (operation == "close"s ? "close" : "endDef") +
+                      ":invalidDataType");
+        EXPECT_EQ(identifierOf([&] { netcdf("put_var1_double", ncid, 1, 4e9, 1); }),
+                  "TESSEL:netcdf:putVar1:operationNotAllowedInDefineMode");
+        EXPECT_EQ(identifierOf([&] { netcdf("_enddef", ncid, 0, 0, 0, 0); }),
+                  "TESSEL:guard:alignment");
+    }
+    netcdf("del_att", ncid, 0, "_FillValue");
+    netcdf("close", ncid);
+}
+
+TEST(Abort, ThatFailedHasEndedTheDataset) {
+    for (const Module &netcdf : {plainModule(), guardedModule()}) {
+        const Folder folder;
+        const FullDisk full;
+        const int ncid = endedWithoutRoom(netcdf, folder);
+        netcdf("put_var1_double", ncid, 0, 1, 7);
+        EXPECT_EQ(identifierOf([&] { netcdf("abort", ncid); }), "TESSEL:netcdf:abort:fileTooLarge");
+        EXPECT_EQ(identifierOf([&] { netcdf("inq", ncid); }), "TESSEL:netcdf:inq:notNetcdfID");
+    }
+}
+
 TEST(ClosedDatasets, AreRefusedToEveryOperation) {
     const Folder folder;
     const Module netcdf = guardedModule();

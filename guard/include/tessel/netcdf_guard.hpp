@@ -9,6 +9,7 @@
 //   TESSEL:guard:mode        a mode flag that makes create or open follow an invalid pointer
 //   TESSEL:guard:closed      anything with a dataset that is based on HDF5, or was opened without
 //                            the guard, and whose closing failed: its memory may be freed
+//   TESSEL:guard:lengths     a variable over a dimension of 2^63 elements or more
 //   TESSEL:guard:counts      a write of counts that multiply to more than 64 bits hold
 //   TESSEL:guard:records     a write that would first fill more than GuardOptions::fillLimit
 //   TESSEL:guard:header      a file whose header claims what it cannot hold, or what would overflow
