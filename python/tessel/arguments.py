@@ -12,6 +12,10 @@
   or tuple of them, nested like the array that `numpy.array` makes of it, become the member's class
   when that is exact. Where a digit would be lost, the call is refused ("TESSEL:python:notExact")
   and says how to round on purpose.
+- Text: a str that an attribute is to hold becomes UTF-8, which is what reading one decodes. In a
+  variable a character is one byte, so text for one may have the characters of ASCII, and those that
+  reading gives for bytes above 127; others, of which the module would store the low byte, are
+  refused ("TESSEL:python:notOneByte"), as they are in arrays of characters. bytes are what they are.
 
 Everything else, bool included, goes on as it is, and the module judges it.
 """
@@ -20,6 +24,7 @@ from __future__ import annotations
 
 import operator
 import os
+import re
 from collections.abc import Iterable
 from typing import Any
 
@@ -27,6 +32,9 @@ import numpy
 
 from tessel import paths, wording
 from tessel.errors import Error
+
+_NO_BYTE = re.compile("[^\0-\x7f\uff80-\uffff]")
+"""A character that is neither one of ASCII nor what reading a variable gives for a byte."""
 
 
 def file_path(value: Any) -> Any:
@@ -87,6 +95,39 @@ def numbers(value: Any, dtype: numpy.dtype[Any]) -> Any:
                             f"{wording.abridged(each)} is not exact as {dtype.name}; pass an array "
                             "of that dtype to have it rounded.")
     return made.reshape(objects.shape)
+
+
+def attribute_text(value: Any) -> Any:
+    """The bytes of text for an attribute; else the value itself, if no character of it is lost."""
+    if not isinstance(value, str):
+        return text_of_bytes(value)
+    try:
+        return value.encode()
+    except UnicodeEncodeError:
+        raise Error("TESSEL:python:notText",
+                    "The text has half of a surrogate pair.") from None
+
+
+def text_of_bytes(value: Any) -> Any:
+    """The value itself; an error for text and arrays of characters of which one is no byte."""
+    lost = _lost(value)
+    if lost is None:
+        return value
+    raise Error("TESSEL:python:notOneByte",
+                f"{lost!r} (U+{ord(lost):04X}) is not one byte; give the bytes that the text is to "
+                'be, such as text.encode("latin-1").')
+
+
+def _lost(value: Any) -> str | None:
+    """A character that would not be itself any more as one byte."""
+    if isinstance(value, str):
+        found = _NO_BYTE.search(value)
+        return found[0] if found else None
+    if isinstance(value, numpy.ndarray) and value.dtype.kind == "U" and value.itemsize == 4:
+        points = value.view(f"{value.dtype.byteorder}u4")
+        wrong = points[(points > 0x7f) & ((points < 0xff80) | (points > 0xffff))]
+        return chr(wrong.flat[0]) if wrong.size else None
+    return None
 
 
 def _put(made: numpy.ndarray[Any, Any], i: int, value: float) -> bool:

@@ -904,6 +904,7 @@ PACKAGE: tuple[str, ...] = (
     "TESSEL:python:notAClassicFile",
     "TESSEL:python:notARegularFile",
     "TESSEL:python:notExact",
+    "TESSEL:python:notOneByte",
     "TESSEL:python:notRepresentable",
     "TESSEL:python:notText",
     "TESSEL:python:nothingToDraw",

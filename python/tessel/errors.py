@@ -58,8 +58,8 @@ BUILT_INS: dict[type[Exception], str] = {
         alignment closed counts lengths mode records
         badBlockSize badDimensions badEncoding badFormat badMode badModuleName badOutputCount
         badShape badGuard badPath characterTooLarge differentFields dimensionsTooLarge missingInput
-        nestedTooDeeply notExact nothingToDraw notText readOnlyArray recordsWithoutVariables
-        shapeTooLarge tooManyDimensions valueDoesNotFit
+        nestedTooDeeply notExact nothingToDraw notOneByte notText readOnlyArray
+        recordsWithoutVariables shapeTooLarge tooManyDimensions valueDoesNotFit
         """,
     OverflowError: """
         mathResultNotRepresentable packUpSizetScalar integerTooLarge notRepresentable

@@ -8,7 +8,8 @@ from collections.abc import Callable
 from dataclasses import dataclass
 
 from tessel.kinds import (ATTRIBUTE, COUNT, INDEX, NCID, NO_VARIABLE,
-                          NOT_OPEN, OWNER, START, STRIDE, VARID, XTYPE, data_kind, data_result)
+                          NOT_OPEN, OWNER, START, STRIDE, TEXT_OF_ATTRIBUTE, TEXT_OF_VARIABLE, VARID, XTYPE,
+                          data_kind, data_result)
 from tessel.operation import Argument, Errors, Operation, Result
 
 
@@ -109,15 +110,18 @@ def _write(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, 
         mine = tag
         given = arguments
         found = errors
+        kind = TEXT_OF_VARIABLE if of.is_text else data_kind(of.dtype, of.host_class)
         if of.is_text and name == "put_att":  # the one member with a frame of its own
-            mine, given = "putAttText", tuple(each for each in arguments if each is not XTYPE)
+            kind, mine, given = TEXT_OF_ATTRIBUTE, "putAttText", tuple(each for each in arguments if each is not XTYPE)
             found = tuple((identifier.replace(":putAtt:", ":putAttText:"), cause)
                           for identifier, cause in errors)
         empty = () if may_be_empty else (("TESSEL:netcdf:emptyVariableData", "data is empty"),)
-        data = Argument("data", data_kind(of.dtype, of.host_class), size)
+        about_text = (_WRITTEN_AS[kind],) if kind in _WRITTEN_AS else ()
         return Operation(
-            short=short, long=f"nc_{short}", purpose=of.filled(purpose), notes=notes,
-            arguments=(NCID, OWNER if name == "put_att" else VARID, *given, data), results=(),
+            short=short, long=f"nc_{short}", purpose=of.filled(purpose),
+            notes=" ".join((notes, *about_text)), results=(),
+            arguments=(NCID, OWNER if name == "put_att" else VARID, *given,
+                       Argument("data", kind, size)),
             errors=((f"TESSEL:netcdf:{mine}:badInputParameterCount", "the number of arguments"),
                     *empty,
                     (f"TESSEL:netcdf:{short}:badDatatype",
@@ -135,6 +139,17 @@ _WHOLE = """One dimension for each of the variable's, the fastest first; n-by-1 
 _BLOCK = "In the shape that `count` says; n-by-1 for one dimension."
 _ROW = " A single row is a str; a byte above 127 is a character above U+FF7F."
 
+_WRITTEN_AS = {
+    TEXT_OF_ATTRIBUTE: """A str is written as UTF-8, which is what get_att_text decodes; bytes are
+        written as they are. The call form, `nc("put_att_text", ...)`, writes the low byte of each
+        character, and so do the host and C++.""",
+    TEXT_OF_VARIABLE: """A character is one byte in a variable: text may have the characters of
+        ASCII, and those above U+FF7F that reading gives for bytes above 127. Give other text as
+        bytes, such as text.encode("latin-1"). The call form writes the low byte of each character,
+        whatever it is, and so do the host and C++.""",
+}
+"""What becomes of text in Python, by its kind."""
+
 _VARIABLE = '>>> varid = nc.inq_varid(ncid, "{external}")\n'
 
 FAMILIES: dict[str, Callable[[Member], Operation]] = {
@@ -143,7 +158,8 @@ FAMILIES: dict[str, Callable[[Member], Operation]] = {
         purpose="Read the values of an attribute as {class}.",
         notes="The library converts from the attribute's own type.",
         shape="A row, 1-by-n for n values; 0-by-0 when there are none.",
-        text_shape="The text before the first NUL.",
+        text_shape="""The text before the first NUL, decoded as UTF-8; a byte that is no part of valid
+            UTF-8 is the character of the same code, as in Latin-1.""",
         text_row=True,
         errors=_errors("getAtt", NOT_OPEN, NO_VARIABLE,
                        ("attributeNotFound", "there is no attribute of that name")),
@@ -207,8 +223,8 @@ FAMILIES: dict[str, Callable[[Member], Operation]] = {
                 '>>> nc.put_att_{type}(ncid, varid, "limits", nc.param("{external}"), {d15})\n'
                 '>>> nc.get_att_{type}(ncid, varid, "limits").tolist()\n[[{v1}, {v5}]]',
         text_example=">>> nc.redef(ncid)\n" + _VARIABLE +
-                     '>>> nc.put_att_text(ncid, varid, "long_name", "letters")\n'
-                     '>>> nc.get_att_text(ncid, varid, "long_name")\n\'letters\''),
+                     '>>> nc.put_att_text(ncid, varid, "units", "°C")\n'
+                     '>>> nc.get_att_text(ncid, varid, "units")\n\'°C\''),
     "put_var": _write(
         "put_var", "putVar",
         purpose="Write all values of a variable from {class}.",

@@ -61,12 +61,22 @@ POSITIONS = Kind(
      ("TESSEL:netcdf:indexArgumentHasNaN", "has an element that is no number")))
 
 
+def _text_kind(conversion: str, *errors: tuple[str, str]) -> Kind:
+    """Text to write."""
+    return Kind("str | bytes | NDArray[numpy.str_]", "str, bytes or array of characters", "char",
+                f"{{name}} if type({{name}}) is bytes else {conversion}({{name}})", errors)
+
+
+_NOT_ONE_BYTE = ("TESSEL:python:notOneByte",
+                 "has a character that is neither one of ASCII nor above U+FF7F")
+TEXT_OF_VARIABLE = _text_kind("text_of_bytes", _NOT_ONE_BYTE)
+TEXT_OF_ATTRIBUTE = _text_kind(
+    "attribute_text", ("TESSEL:python:notText", "is a str with half of a surrogate pair"),
+    (_NOT_ONE_BYTE[0], f"is an array and {_NOT_ONE_BYTE[1]}"))
+
+
 def data_kind(dtype: str, host_class: str) -> Kind:
-    """Data to write: an array of the dtype, or Python's numbers that are exact in it; text without
-    a dtype."""
-    if not dtype:
-        return Kind("str | bytes | NDArray[numpy.str_]", "str, bytes or array of characters",
-                    "char", "{name}", ())
+    """Numbers to write: an array of the dtype, or Python's own that are exact in it."""
     return Kind(f"Numbers | NDArray[numpy.{dtype}]", f"array of {dtype}, or numbers exact in it",
                 host_class, f"{{name}} if type({{name}}) is ndarray else "
                 f"numbers({{name}}, dtypes['{dtype}'])",

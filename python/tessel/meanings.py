@@ -413,6 +413,9 @@ _PYTHON = {
     "notExact": (
         "A number would lose digits in the class that it is for.",
         "Pass a NumPy array of that dtype to have it rounded on purpose."),
+    "notOneByte": (
+        "A character is none that a variable holds as one byte and gives back.",
+        "Give bytes; which ones, only you know: text.encode(\"latin-1\"), or another encoding."),
     "notRepresentable": (
         "An integer in a list is not exact as a double.", "Use a NumPy array of 64-bit integers."),
     "notText": ("Text has half of a surrogate pair.", "Look at how the text was decoded."),

@@ -37,7 +37,8 @@ from numpy.typing import NDArray
 
 from tessel import errors, paths, reference
 from tessel._runtime import Module, call, call_ints
-from tessel.arguments import code, file_path, identifiers, integer, numbers, vector
+from tessel.arguments import (attribute_text, code, file_path, identifiers, integer, numbers,
+                              text_of_bytes, vector)
 from tessel.operation import Operation
 from tessel.operations import OPERATIONS
 
@@ -137,13 +138,14 @@ def _id(value: Any) -> int:
 _SCOPE: dict[str, Any] = {
     "Any": Any, "Indices": Indices, "NDArray": NDArray, "Numbers": Numbers,
     "PLAIN": (list, tuple, ndarray), "SupportsIndex": SupportsIndex, "__name__": __name__,
-    "call": call, "call_ints": call_ints, "code": code, "constant": _constant,
+    "attribute_text": attribute_text, "call": call, "call_ints": call_ints, "code": code, "constant": _constant,
     "Error": errors.Error, "explained": errors.explained,
     "dtypes": {name: numpy.dtype(name) for name in
                ("float64", "float32", "int32", "int16", "int8", "uint8")},
     "file_path": file_path, "forget": _forget, "identifiers": identifiers, "ids": _ids,
     "integer": integer, "known": _known, "ndarray": ndarray, "numbers": numbers, "numpy": numpy,
-    "paths": paths, "remember": _remember, "vector": vector,
+    "paths": paths, "remember": _remember,
+    "text_of_bytes": text_of_bytes, "vector": vector,
 }
 
 

@@ -61,6 +61,9 @@ _OWN = {
                              "takes no other: <the path>",
     "TESSEL:python:notExact": "<the number> is not exact as <the dtype>; pass an array of that "
                               "dtype to have it rounded.",
+    "TESSEL:python:notOneByte": "<the character> is not one byte; give the bytes that the text is "
+                                "to be, such as text.encode(\"latin-1\").",
+    "TESSEL:python:notText": "The text has half of a surrogate pair.",
 }
 
 EVERY_CALL = ("tooFewArguments", "firstArgNotChar", "invalidOperation")

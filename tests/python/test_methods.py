@@ -448,6 +448,80 @@ def test_arrays_of_other_classes_are_refused(ncid: int, data: object) -> None:
     assert nc.get_var_int(ncid, 3).ravel("F").tolist() == [0, 1, 2, 3, 4, 5]
 
 
+@pytest.mark.parametrize("text", ["°C", "日本", "µm", "Größe 𝄞", "a\uff80", "\x80\xff", "é" * 5000,
+                                  "plain", ""])
+def test_text_of_attributes_comes_back(ncid: int, text: str) -> None:
+    """As UTF-8, which every other program takes it for; also as a str of NumPy's."""
+    nc.redef(ncid)
+    for given in (text, numpy.str_(text)):
+        nc.put_att_text(ncid, -1, "text", given)
+        assert nc.get_att_text(ncid, -1, "text") == nc("get_att_text", ncid, -1, "text") == text
+        assert nc.inq_att(ncid, -1, "text").len == len(text.encode())
+    nc.nc_put_att_text(ncid, -1, "text", text.encode())
+    assert nc.get_att_text(ncid, -1, "text") == text
+
+
+def test_bytes_of_attributes_are_what_they_are(ncid: int) -> None:
+    nc.redef(ncid)
+    for given in (b"\xb0C", numpy.array(["\uffb0", "C"])):
+        nc.put_att_text(ncid, -1, "text", given)
+        assert nc.inq_att(ncid, -1, "text").len == 2
+        assert nc.get_att_text(ncid, -1, "text") == "°C"  # no UTF-8, and so Latin-1
+    nc("put_att_text", ncid, -1, "text", "日本")  # the call form: the low bytes
+    assert nc.get_att_text(ncid, -1, "text") == "å,"
+
+
+# Calls that write six characters, or one, to the sample's variable "char", whose number is 1.
+TEXTS = [
+    lambda text: ("put_var_text", text), lambda text: ("put_vara_text", [0, 0], [3, 2], text),
+    lambda text: ("put_vars_text", [0, 0], [3, 2], [1, 1], text),
+    lambda text: ("put_var1_text", [0, 0], text[-1:] if isinstance(text, (str, bytes))
+                  else text.ravel()[-1:])]
+
+
+@pytest.mark.parametrize("texts", TEXTS)
+@pytest.mark.parametrize("wrong", ["\x80", "é", "日", "\uff7f", "\ud800", "𝄞"])
+def test_characters_that_are_no_byte(ncid: int, texts: typing.Callable, wrong: str) -> None:
+    """The module would store the low byte of each: another character, without a word."""
+    text = "abcde" + wrong
+    array = numpy.array(list(text))
+    for given in (text, numpy.str_(text), array, array.reshape(2, 3), array.astype(">U1")):
+        short, *places, data = texts(given)
+        with pytest.raises(ValueError, match="is not one byte; give the bytes") as caught:
+            getattr(nc, short)(ncid, 1, *places, data)
+        error = typing.cast(tessel.Error, caught.value)
+        assert error.identifier == "TESSEL:python:notOneByte" and error.operation == short
+        assert error.message.startswith(f"{wrong!r} (U+{ord(wrong):04X}) ")
+        [note] = error.__notes__
+        assert note.endswith("\nvarid 1: char char(x=3, y=2)")
+    assert "".join(nc.get_var_text(ncid, 1).ravel("F")) == "abcdef"
+    nc.redef(ncid)
+    with pytest.raises(ValueError, match="is not one byte"):
+        nc.put_att_text(ncid, -1, "text", array)
+
+
+@pytest.mark.parametrize("texts", TEXTS)
+def test_bytes_of_variables_come_back(ncid: int, texts: typing.Callable) -> None:
+    """As bytes, and as the characters that reading gives for them, in a str and in an array."""
+    for read in ("abcde\uff80", "abcde\uffff", "\0\x7f\x01\uffe4de"):
+        written = bytes(ord(each) & 0xff for each in read)
+        for given in (read, written, numpy.array(list(read)), numpy.array(list(read), ">U1")):
+            nc.put_var_text(ncid, 1, "......")
+            short, *places, data = texts(given)
+            getattr(nc, short)(ncid, 1, *places, data)
+            found = nc.get_var_text(ncid, 1).ravel("F").tolist()
+            assert found == ([read[-1], *"....."] if short == "put_var1_text"
+                             else numpy.array(list(read)).tolist())
+
+
+def test_text_that_has_no_utf8(ncid: int) -> None:
+    nc.redef(ncid)
+    with pytest.raises(ValueError, match="half of a surrogate pair") as caught:
+        nc.put_att_text(ncid, -1, "text", "a\udc80")
+    assert caught.value.identifier == "TESSEL:python:notText"
+    assert caught.value.operation == "put_att_text"
+
+
 def test_the_array_itself_goes_to_the_library(ncid: int, monkeypatch: pytest.MonkeyPatch) -> None:
     """No copy: what the method hands on is the object that it was given."""
     seen = []
