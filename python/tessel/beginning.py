@@ -9,13 +9,10 @@ _LENGTH = 512
 _HDF5 = b"\x89HDF\r\n\x1a\n"
 
 FORMATS: tuple[tuple[int, bytes, str], ...] = (
-    (0, b"CDF\x01", "begins like a netCDF file of the classic format, and what follows is damaged "
-                    "or cut off"),
-    (0, b"CDF\x02", "begins like a netCDF file of the 64-bit offset format, and what follows is "
-                    "damaged or cut off"),
-    (0, b"CDF\x05", "begins like a netCDF file of the 64-bit data format, and what follows is "
-                    "damaged or cut off"),
-    (0, _HDF5, "begins like an HDF5 file (as netCDF-4 files do), and is damaged or no dataset"),
+    (0, b"CDF\x01", "begins like a netCDF file of the classic format"),
+    (0, b"CDF\x02", "begins like a netCDF file of the 64-bit offset format"),
+    (0, b"CDF\x05", "begins like a netCDF file of the 64-bit data format"),
+    (0, _HDF5, "begins like an HDF5 file (as netCDF-4 files do)"),
     (0, b"\x0e\x03\x13\x01", "looks like an HDF4 file"),
     (0, b"\x1f\x8b", "is compressed by gzip: decompress it first (gunzip)"),
     (0, b"\x1f\x9d", "is compressed by compress: decompress it first (uncompress)"),
@@ -35,6 +32,13 @@ FORMATS: tuple[tuple[int, bytes, str], ...] = (
 )
 """Where a format has its mark, the mark, and what the file is then."""
 
+_DAMAGED = ", and what follows is damaged or cut off"
+REFUSED: dict[bytes, str] = {
+    b"CDF\x01": _DAMAGED, b"CDF\x02": _DAMAGED, b"CDF\x05": _DAMAGED,
+    _HDF5: ", and is damaged or no dataset",
+}
+"""What is wrong with a file of a format that the library reads, when it did not."""
+
 TEXTS: tuple[tuple[bytes, str], ...] = (
     (b"<!doctype html", "is a web page, perhaps what a server said instead of the file"),
     (b"<html", "is a web page, perhaps what a server said instead of the file"),
@@ -44,18 +48,19 @@ TEXTS: tuple[tuple[bytes, str], ...] = (
 """How a text begins, in lower case and without blanks before it, and what the file is then."""
 
 
-def described(path: str) -> str:
-    """What a file looks like, to be read after "it"."""
+def described(path: str, refused: bool = True) -> str:
+    """What a file looks like, to be read after "it"; which the library refused, or nobody gave to
+    it."""
     try:
         with open(path, "rb") as file:
             first = file.read(_LENGTH)
             size = os.fstat(file.fileno()).st_size
     except OSError as reason:
         return f"cannot be read ({reason.strerror})"
-    return recognised(first, size)
+    return recognised(first, size, refused)
 
 
-def recognised(first: bytes, size: int) -> str:
+def recognised(first: bytes, size: int, refused: bool = True) -> str:
     """What a file of this size looks like that begins so."""
     if not first:
         return "is empty"
@@ -65,7 +70,7 @@ def recognised(first: bytes, size: int) -> str:
             return f"is an HDF5 file that was cut off: {size} of {end} bytes are there"
     for offset, mark, what in FORMATS:
         if first.startswith(mark, offset):
-            return f"{what} ({size} bytes)"
+            return f"{what}{REFUSED.get(mark, '') if refused else ''} ({size} bytes)"
     for mark in (b"CDF\x01", _HDF5):
         if size < len(mark) and mark.startswith(first):
             return f"was cut off after {size} bytes"

@@ -918,5 +918,6 @@ PACKAGE: tuple[str, ...] = (
     "TESSEL:python:unsupportedResult",
     "TESSEL:python:unsupportedType",
     "TESSEL:python:valueDoesNotFit",
+    "TESSEL:python:variableNotFound",
 )
 """Every identifier of the Python package."""

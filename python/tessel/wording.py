@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import reprlib
 import unicodedata
+from collections.abc import Mapping
 from typing import Any
 
 import numpy as np
@@ -36,6 +37,15 @@ class _Short(reprlib.Repr):
         """An int; Python itself refuses to write one of thousands of digits."""
         bits = value.bit_length()
         return super().repr_int(value, level) if bits < 200 else f"<int of {bits} bits>"
+
+    def repr_instance(self, value: Any, level: int) -> str:
+        """What has dimensions by name, such as a dataset of xarray's, by those; and what Python
+        writes on several lines, on one."""
+        sizes = getattr(value, "sizes", None)
+        if not isinstance(sizes, Mapping):
+            return " ".join(super().repr_instance(value, level).split())
+        lengths = ", ".join(f"{name}: {length}" for name, length in sizes.items())
+        return f"<{type(value).__name__} ({lengths})>"
 
 
 _short = _Short()

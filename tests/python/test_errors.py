@@ -17,6 +17,7 @@ import numpy
 import pytest
 import tessel
 import tessel.sample
+import xarray
 from made_files import generate
 from tessel import beginning, errors, netcdf, notes, wording
 from tessel.errors import BUILT_INS, CLASSES, SYSTEM_ERRORS, WITHOUT_BUILT_IN, Error
@@ -496,6 +497,11 @@ def test_an_id_used_again_keeps_its_new_path(monkeypatch: pytest.MonkeyPatch) ->
     (numpy.zeros((0, 3)), "<float64 array of shape (0, 3)>"),
     (["x" * 70], "['" + "x" * 22 + "..." + "x" * 23 + "']"),
     ([[1, 2], (3,)], "[[1, 2], (3,)]"), ([[[5]]], "[[[...]]]"), ({"a": [1]}, "{'a': [1]}"),
+    (xarray.Dataset({"a": ("x", [1] * 9)}), "<Dataset (x: 9)>"),
+    ([xarray.DataArray([[1], [2]])], "[<DataArray (dim_0: 2, dim_1: 1)>]"),
+    (xarray.Dataset({f"v{i}": (f"x{i}", [1]) for i in range(9)}),
+     "<Dataset (x0: 1, x1: 1, x2: 1, x3: 1, x4: 1, x5: 1, x6: 1, x..."),
+    ([numpy.eye(2)], "[array([[1., 0.], [0., 1.]])]"),
     pytest.param(10**10000, "<int of 33220 bits>", id="no int that Python writes"),
     pytest.param([10**10000], "[<int of 33220 bits>]", id="a list of such"),
     (numpy.array([[1] * 99, None], object), "<object array of shape (2,): "
@@ -637,7 +643,10 @@ def test_a_dataset_that_was_cut_off(ncid: int) -> None:
 @pytest.mark.parametrize("offset, mark, what", beginning.FORMATS)
 def test_every_mark(offset: int, mark: bytes, what: str) -> None:
     first = b"\xff" * offset + mark + b"\xff" * 9
-    assert beginning.recognised(first, len(first)) == f"{what} ({len(first)} bytes)"
+    wrong = beginning.REFUSED.get(mark, "")
+    assert beginning.recognised(first, len(first)) == f"{what}{wrong} ({len(first)} bytes)"
+    assert beginning.recognised(first, len(first), False) == f"{what} ({len(first)} bytes)"
+    assert bool(wrong) == ("netCDF" in what)
 
 
 @pytest.mark.parametrize("mark, what", beginning.TEXTS)

@@ -274,7 +274,8 @@ def test_a_real_file_of_another_format(tmp_path: Path) -> None:
     path = tmp_path / "four.nc"
     with netCDF4.Dataset(path, "w") as file:
         file.title = "four"
-    with pytest.raises(OSError, match="none of them"):
+    with pytest.raises(OSError, match=r"none of them: it begins like an HDF5 file \(as netCDF-4 "
+                                      r"files do\) \(\d+ bytes\)\.$"):
         xarray.open_dataset(path, engine="tessel")
     with xarray.open_dataset(path) as dataset:
         assert dataset.title == "four"
@@ -291,6 +292,15 @@ def test_what_is_no_file(tmp_path: Path) -> None:
         with pytest.raises(OSError) as raised:
             xarray.open_dataset(path, engine="tessel")
         assert raised.value.word == "notAClassicFile"
+        assert str(raised.value).endswith(": it is a folder." if path is tmp_path else " of them.")
+    page = tmp_path / "page.nc"
+    page.write_text("<!DOCTYPE html><title>Not found")
+    with pytest.raises(OSError, match="none of them: it is a web page, perhaps what a server"):
+        xarray.open_dataset(page, engine="tessel")
+    pipe = tmp_path / "pipe.nc"
+    os.mkfifo(pipe)
+    with pytest.raises(OSError, match=r"none of them\.$"):  # to read it would be to wait
+        xarray.open_dataset(pipe, engine="tessel")
     for none in (3, io.BytesIO(b"CDF\1")):
         with pytest.raises(TypeError, match="A path is a str"):
             xarray.open_dataset(none, engine="tessel")

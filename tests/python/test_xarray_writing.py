@@ -373,7 +373,7 @@ def test_widths_of_texts_that_differ(tmp_path: Path) -> None:
     (xr.Dataset({"x": 1}), {"encoding": {"x": {"zlib": True}}}, ValueError, "unexpected encoding"),
     (xr.Dataset({"x": "a"}), {"encoding": {"x": {"dtype": str}}}, ValueError,
      "unexpected encoding"),
-    (xr.Dataset({"x": 1}), {"encoding": {"y": {}}}, KeyError, "y"),
+    (xr.Dataset({"x": 1}), {"encoding": {"y": {}}}, KeyError, "no variables"),
     (xr.Dataset({"x": (("a"), [b"b"], {"_FillValue": 1})}), {}, TypeError, "_FillValue"),
     (xr.Dataset({"x": (("a"), [b"b"], {"_FillValue": "XY"})}), {}, ValueError, "_FillValue"),
 ], ids=itertools.count())
@@ -614,6 +614,65 @@ def test_a_file_is_replaced_while_it_is_read(tmp_path: Path) -> None:
     expected = everything()
     xr.testing.assert_identical(read(path, "netcdf4"),
                                 expected.assign(new=expected["f8_3"] * 2))
+
+
+@pytest.mark.parametrize("array", [
+    xr.DataArray([1.0, 2.0], dims="x", name="speed"),
+    xr.DataArray([1.0, 2.0], dims="x"),  # without a name
+    xr.DataArray([1.0, 2.0], dims="x", name="x"),
+    xr.DataArray([1.0, 2.0], {"height": 2.0}, "x", name="height"),
+    xr.DataArray([3, 4], {"x": [3, 4]}, "x", name="x")], ids=lambda each: None)
+def test_an_array_with_labels(tmp_path: Path, array: xr.DataArray) -> None:
+    """As xarray itself writes it, and reads it back, name and all."""
+    ours, theirs = tmp_path / "ours.nc", tmp_path / "theirs.nc"
+    to_netcdf(array, ours)
+    array.to_netcdf(theirs, engine="netcdf4", format="NETCDF3_64BIT")
+    assert dump(ours) == dump(theirs)
+    for engine in ENGINES:
+        with xr.open_dataarray(ours, engine=engine) as back:
+            assert back.name == array.name
+            xr.testing.assert_identical(back.load(), array)
+    assert array.attrs == {}
+
+
+def test_an_array_with_an_encoding(tmp_path: Path) -> None:
+    array = xr.DataArray([1.5, 2.5], dims="x", name="speed")
+    to_netcdf(array, tmp_path / "x.nc", unlimited_dims="x",
+              encoding={"speed": {"dtype": "i2", "scale_factor": 0.5, "_FillValue": -9}})
+    raw = read(tmp_path / "x.nc", "scipy", decode_cf=False)
+    assert raw.speed.values.tolist() == [3, 5] and raw.encoding["unlimited_dims"] == {"x"}
+
+
+@pytest.mark.parametrize("wrong", [{"a": 1}, np.arange(3), None, xr.Variable("x", [1]),
+                                   pd.Series([1])], ids=lambda each: type(each).__name__)
+def test_what_is_no_dataset(tmp_path: Path, wrong: Any) -> None:
+    with pytest.raises(TypeError, match="is an xarray.Dataset or an xarray.DataArray") as raised:
+        to_netcdf(wrong, tmp_path / "x.nc")
+    assert isinstance(raised.value, tessel.Error) and type(wrong).__name__ in str(raised.value)
+    assert not list(tmp_path.iterdir())
+
+
+@pytest.mark.parametrize("wrong, word, message", [
+    ({"zz": {}, "x": {}, "yy": {"dtype": "i2"}}, "variableNotFound", r"no variables \['zz', 'yy'\]"),
+    ({"x": 3}, "badEncoding", "encoding of x must be castable to a dict, .* and is 3"),
+    ({"x": "foo"}, "badEncoding", "and is 'foo'"),
+    (["x"], "unsupportedType", "a dict with a dict for each variable")], ids=lambda each: None)
+def test_an_encoding_of_what_is_not_there(tmp_path: Path, wrong: Any, word: str,
+                                          message: str) -> None:
+    made = xr.Dataset({"x": (("t", "u"), [[1, 2]])})
+    with pytest.raises(tessel.Error, match=message) as raised:
+        to_netcdf(made, tmp_path / "x.nc", encoding=wrong)
+    assert raised.value.word == word and not list(tmp_path.iterdir())
+    [note] = raised.value.__notes__
+    assert note.startswith("in tessel.xarray.to_netcdf(dataset=<Dataset (t: 1, u: 2)>, path=")
+
+
+def test_a_value_that_is_the_marker_is_missing(tmp_path: Path) -> None:
+    """Whoever fills values in beforehand wants that, so it is no error."""
+    made = xr.Dataset({"x": ("t", [-9.0, 1.0, np.nan])})
+    to_netcdf(made, tmp_path / "x.nc", encoding={"x": {"dtype": "i2", "_FillValue": -9}})
+    for engine in ENGINES:
+        np.testing.assert_array_equal(read(tmp_path / "x.nc", engine).x, [np.nan, 1, np.nan])
 
 
 def test_the_writer_takes_numbers_in_any_layout(tmp_path: Path) -> None:

@@ -24,6 +24,11 @@ ensure_dtype_not_object = _found("ensure_dtype_not_object", "conventions", "back
 _validate_dataset_names = _found("_validate_dataset_names", "backends.api", "backends.writers")
 _validate_attrs = _found("_validate_attrs", "backends.api", "backends.writers")
 
+DATAARRAY_NAME: str = _found("DATAARRAY_NAME", "backends.api", "backends.writers")
+DATAARRAY_VARIABLE: str = _found("DATAARRAY_VARIABLE", "backends.api", "backends.writers")
+"""The attribute with the name of a DataArray whose variable is not called so, and what that is
+called instead."""
+
 
 def validate(dataset: xarray.Dataset) -> None:
     """Looks at the names and the attributes as xarray does before it writes."""

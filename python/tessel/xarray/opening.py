@@ -27,7 +27,7 @@ from functools import cached_property
 from typing import Any, NamedTuple
 
 import tessel
-from tessel import _faults, integrity
+from tessel import _faults, beginning, integrity
 from tessel.dataset import Dataset
 
 _LAYOUT_BEGIN, _LAYOUT_END = 8, 2**16
@@ -254,9 +254,14 @@ def _not_ours(path: str) -> tessel.Error:
 
 
 def not_classic(who_does_what: str, path: str) -> tessel.Error:
-    """The error for a file that is in neither of the two formats."""
+    """The error for a file that is in neither of the two formats, and what it is instead."""
+    instead = ""
+    if os.path.isdir(path):
+        instead = ": it is a folder"
+    elif os.path.isfile(path):
+        instead = f": it {beginning.described(path, refused=False)}"
     return refusal("notAClassicFile", f"{who_does_what} files of the classic and of the 64-bit "
-                   "offset format, and this is none of them.", path)
+                   f"offset format, and this is none of them{instead}.", path)
 
 
 def refusal(word: str, message: str, path: str) -> tessel.Error:

@@ -29,12 +29,13 @@ FORMATS = {"NETCDF3_64BIT": "64bit-offset", "NETCDF3_64BIT_OFFSET": "64bit-offse
 
 
 @notes.told
-def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
+def to_netcdf(dataset: xarray.Dataset | xarray.DataArray, path: paths.Path, mode: str = "w",
               format: str | None = None, *,  # pylint: disable=redefined-builtin
               unlimited_dims: Hashable | Iterable[Hashable] | None = None,
               encoding: Mapping[Any, Mapping[str, Any]] | None = None,
               progress: Progress | None = None, block_bytes: int = BLOCK_BYTES) -> None:
-    """Writes a dataset into a file of the classic or of the 64-bit offset format.
+    """Writes a dataset into a file of the classic or of the 64-bit offset format. A DataArray is
+    written as xarray's own `to_netcdf` does it, for `xarray.open_dataarray` to read.
 
         >>> packed = {"dtype": "int16", "scale_factor": 0.01, "_FillValue": -999}
         >>> tessel.xarray.to_netcdf(dataset, "sst.nc", encoding={"sst": packed})
@@ -55,7 +56,9 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
     in blocks of `block_bytes`. `progress` is told the bytes that are done, and all bytes, before
     the first block and after each.
     """
-    elsewhere.validate(dataset)
+    whole = _dataset(dataset)
+    elsewhere.validate(whole)
+    _want_names(whole, encoding)
     form = _format(format)
     if mode not in ("w", "a"):
         raise tessel.Error("TESSEL:python:badMode",
@@ -71,9 +74,47 @@ def to_netcdf(dataset: xarray.Dataset, path: paths.Path, mode: str = "w",
             shutil.copyfile(target, temporary)
         with Reopened(temporary) if adding else NewDataset(temporary, form) as made:
             store = WritingStore(made, size)
-            dataset.dump_to_store(store, writer=writer, encoding=encoding,
-                                  unlimited_dims=_unlimited(dataset, unlimited_dims))
+            whole.dump_to_store(store, writer=writer, encoding=encoding,
+                                unlimited_dims=_unlimited(whole, unlimited_dims))
             writer.write(made, tell, size)
+
+
+def _dataset(given: Any) -> xarray.Dataset:
+    """The dataset that is to be written."""
+    if isinstance(given, xarray.Dataset):
+        return given
+    if not isinstance(given, xarray.DataArray):
+        raise tessel.Error("TESSEL:python:unsupportedType",
+                           "What is written is an xarray.Dataset or an xarray.DataArray, not of the "
+                           f"type {type(given).__name__}.")
+    # A variable that has no name, or that of one of its coordinates, gets one by which xarray knows
+    # what it was called.
+    if given.name is not None and given.name not in (*given.coords, *given.dims):
+        return given.to_dataset()
+    made = given.to_dataset(name=elsewhere.DATAARRAY_VARIABLE)
+    if given.name is not None:
+        made.attrs[elsewhere.DATAARRAY_NAME] = given.name
+    return made
+
+
+def _want_names(dataset: xarray.Dataset, encoding: Any) -> None:
+    """Raises the error for an encoding of what is not there, or that is none."""
+    given = {} if encoding is None else encoding
+    if not isinstance(given, Mapping):
+        raise tessel.Error("TESSEL:python:unsupportedType",
+                           "encoding is a dict with a dict for each variable, as in "
+                           '{"sst": {"dtype": "int16"}}.')
+    for name, each in given.items():
+        try:
+            dict(each)
+        except (TypeError, ValueError):
+            raise tessel.Error("TESSEL:python:badEncoding",
+                               f"The encoding of {name} must be castable to a dict, such as "
+                               f'{{"dtype": "int16"}}, and is {wording.abridged(each)}.') from None
+    missing = [each for each in given if each not in dataset.variables]
+    if missing:
+        raise tessel.Error("TESSEL:python:variableNotFound", "The dataset has no variables "
+                           f"{wording.abridged(missing)}, for which there is an encoding.")
 
 
 def _format(name: str | None) -> str:
