@@ -21,8 +21,9 @@ from pathlib import Path
 from typing import NamedTuple
 
 import growth
+import profiles
 from chart import draw
-from expectations import ROWS, missed_without_reason, table
+from expectations import ROWS, missed_without_reason, outcomes, table
 from measuring import UNEXPECTED, put_between_marks
 from results import Results
 
@@ -139,6 +140,11 @@ def main() -> int:
         return 0
     put_between_marks(DOCS / "performance.md", "bench/all", text)
     put_between_marks(DOCS / "measurements.md", "bench/all, growth", of_growth)
+    missed = [each for each in outcomes(results) if not each.met]
+    found = profiles.all_of(missed, options.built, folder / "profiles.json",
+                            anew=not options.tables)
+    put_between_marks(DOCS / "performance.md", "bench/all, profiles",
+                      profiles.table(missed, found))
     draw(results, DOCS / "performance.svg")
     unexpected += [f"grows faster than its work: {each.what}, {each.counted}"
                    for each in series if each.grows]

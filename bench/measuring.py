@@ -10,7 +10,8 @@ import random
 import statistics
 import sys
 import time
-from collections.abc import Callable, Mapping, Sequence
+from collections.abc import Callable, Iterator, Mapping, Sequence
+from contextlib import contextmanager
 from pathlib import Path
 from typing import NamedTuple, NoReturn
 
@@ -35,8 +36,10 @@ class Measured(NamedTuple):
     """The shortest time, which other work on the machine disturbs least."""
 
 
-def options_of(doc: str) -> argparse.Namespace:
-    """The command line of a measuring program: what to write, and whether to measure at all."""
+def options_of(doc: str, more: Callable[[argparse.ArgumentParser], object] = lambda parser: None,
+               ) -> argparse.Namespace:
+    """The command line of a measuring program: what to write, and whether to measure at all; and
+    what `more` adds to it."""
     parser = argparse.ArgumentParser(description=doc.splitlines()[0])
     parser.add_argument("--write", type=Path, metavar="DOCUMENT",
                         help="put the table between the marks in this document")
@@ -44,6 +47,7 @@ def options_of(doc: str) -> argparse.Namespace:
                         help="write the rows to this file, in seconds")
     parser.add_argument("--quick", action="store_true",
                         help="do everything once, on small data; the numbers say nothing")
+    more(parser)
     options = parser.parse_args()
     if options.quick and options.write:
         parser.error("numbers that say nothing belong into no document")
@@ -97,6 +101,19 @@ def measure(sides: Sequence[Work], repetitions: int, times: int = 1,
                      statistics.median(theirs / ours for theirs, ours in zip(each, taken[0])),
                      min(each))
             for each in taken]
+
+
+@contextmanager
+def telling_perf(folder: Path) -> Iterator[None]:
+    """Lets perf look at what is done meanwhile (profiles.py)."""
+    with (folder / "control").open("w") as control, (folder / "answer").open() as answer:
+        def tell(what: str) -> None:
+            control.write(what + "\n")
+            control.flush()
+            answer.readline()
+        tell("enable")
+        yield
+        tell("disable")
 
 
 def put_between_marks(document: Path, program: str, text: str) -> None:

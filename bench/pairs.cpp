@@ -109,9 +109,13 @@ std::string table(const std::vector<Pair> &pairs, const Statistics &statistics) 
     for (const Pair &pair : pairs) {
         const std::string median = statistics.compared(pair, "median");
         if (!median.empty()) {
-            text += "| " + pair.name + " | " + (pair.block ? "ms" : "ns") + " | " + median + " | " +
-                    statistics.compared(pair, "shortest") + " |" +
-                    (anySteps ? " " + statistics.comparedWithSteps(pair) + " |" : "") + "\n";
+            text.append("| ").append(pair.name).append(pair.block ? " | ms | " : " | ns | ");
+            text.append(median).append(" | ").append(statistics.compared(pair, "shortest"));
+            text.append(" |");
+            if (anySteps) {
+                text.append(1, ' ').append(statistics.comparedWithSteps(pair)).append(" |");
+            }
+            text.append(1, '\n');
         }
     }
     return text;
@@ -133,6 +137,47 @@ void write(const std::string &document, const std::string &title, const std::str
     std::ofstream(document) << all;
 }
 
+/// Takes an option and its value out of the command line; gives the value, or nothing.
+std::string taken(std::vector<char *> &arguments, std::string_view option) {
+    const auto found = std::find(arguments.begin(), arguments.end(), option);
+    if (found == arguments.end() || found + 1 == arguments.end()) {
+        return {};
+    }
+    std::string value = *(found + 1);
+    arguments.erase(found, found + 2);
+    return value;
+}
+
+/// Lets perf look at what is done while this is there (profiles.py), if it waits by the pipes of a
+/// folder.
+class Perf {
+  public:
+    explicit Perf(const std::string &folder) {
+        if (!folder.empty()) {
+            control.open(std::filesystem::path(folder) / "control");
+            answer.open(std::filesystem::path(folder) / "answer");
+            tell("enable");
+        }
+    }
+    ~Perf() {
+        if (control.is_open()) {
+            tell("disable");
+        }
+    }
+    Perf(const Perf &) = delete;
+    Perf &operator=(const Perf &) = delete;
+
+  private:
+    void tell(const char *what) {
+        control << what << std::endl;
+        std::string line;
+        std::getline(answer, line);
+    }
+
+    std::ofstream control;
+    std::ifstream answer;
+};
+
 } // namespace
 
 bool isQuick(int argc, char **argv) {
@@ -141,12 +186,8 @@ bool isQuick(int argc, char **argv) {
 
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs) {
     std::vector<char *> arguments(argv, argv + argc);
-    std::string document;
-    const auto option = std::find(arguments.begin(), arguments.end(), std::string("--write"));
-    if (option != arguments.end() && option + 1 != arguments.end()) {
-        document = *(option + 1);
-        arguments.erase(option, option + 2);
-    }
+    const std::string document = taken(arguments, "--write");
+    const std::string pipes = taken(arguments, "--perf");
     const bool quick = isQuick(argc, argv);
     std::erase(arguments, std::string_view("--quick"));
     const bool part = std::any_of(argv, argv + argc, [](std::string_view argument) {
@@ -171,7 +212,14 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         }
     }
     Statistics statistics;
-    benchmark::RunSpecifiedBenchmarks(&statistics);
+    if (!pipes
+             .empty()) { // memory that is used for the first time is in no profile, as in no median
+        benchmark::RunSpecifiedBenchmarks();
+    }
+    {
+        const Perf perf(pipes);
+        benchmark::RunSpecifiedBenchmarks(&statistics);
+    }
     benchmark::Shutdown();
     const std::string text = table(pairs, statistics);
     std::printf("\n%s", text.c_str());

@@ -37,8 +37,9 @@ struct Pair {
 /// that does other work besides disturbs least; it is also compared with the second references,
 /// where there are any. `--write FILE` puts the table into a document as well, between the marks
 /// "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; `--quick` does everything twice only, to show
-/// that it works; the rest of the command line goes to Google Benchmark, which keeps all
-/// repetitions in the file that `--benchmark_out` names. Gives back main's status.
+/// that it works; `--perf FOLDER` is for profiles.py; the rest of the command line goes to Google
+/// Benchmark, which keeps all repetitions in the file that `--benchmark_out` names. Gives back
+/// main's status.
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
 
 /// Whether `--quick` is on the command line, so that a program can do with less.

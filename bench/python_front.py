@@ -2,6 +2,7 @@
 """Measures tessel, netCDF4-python and SciPy (Debian's packages) in one run, on the same files.
 
 usage: python_front.py [--write DOCUMENT] [--json FILE] [--quick]
+       python_front.py --row NAME --perf FOLDER
 
 Each row is one piece of work done by each side. The sides take turns, in another order in each
 repetition. A time is the median of all repetitions; how many times faster one side is, is the
@@ -13,7 +14,7 @@ Before anything is measured, the sides must give the same values and write the s
 
 --write puts the table between the marks in the document. --quick does everything once, on small
 data, and prints its table: it shows that the program works, and its numbers say nothing. Run it on
-a machine that does nothing else.
+a machine that does nothing else. --row does our side of one row over and over, for profiles.py.
 """
 
 from __future__ import annotations
@@ -21,6 +22,7 @@ from __future__ import annotations
 import platform
 import random
 import tempfile
+import time
 from collections.abc import Callable
 from functools import partial
 from pathlib import Path
@@ -32,13 +34,14 @@ import scipy
 from scipy.io import netcdf_file
 
 import tessel
-from measuring import NOISE, Measured, Work, give_out, measure, options_of
+from measuring import NOISE, Measured, Work, give_out, measure, options_of, telling_perf
 
 FORMAT = "NETCDF3_64BIT_OFFSET"
 MAPPED = 16  # the library's mode flag for mapping a file, which is none of its named constants
 TEN = 10
 EXPECTED = {"call": 30, "method": 20}  # times faster, where the call itself is what costs
 ANYWHERE = {"call": 20, "method": 20}
+PROFILED = 2  # seconds
 
 Places = list[tuple[int, int, int]]
 
@@ -292,12 +295,28 @@ def circumstances() -> str:
             f"{netCDF4.getlibversion().split()[0]}.")
 
 
+def repeat(bench: Bench, name: str, folder: Path) -> None:
+    """Our side of a row, for perf."""
+    work = next(row.tessel for row in bench.rows() if row.name == name)
+    bench.remove_new()
+    with telling_perf(folder):
+        end = time.monotonic() + PROFILED
+        while time.monotonic() < end:
+            work()
+            bench.remove_new()
+
+
 def main() -> None:
-    options = options_of(__doc__)
+    options = options_of(__doc__, lambda parser: (
+        parser.add_argument("--row", help="the row to be done over and over"),
+        parser.add_argument("--perf", type=Path, metavar="FOLDER", help="the pipes of perf")))
     length, times, repetitions = (2, 10, 1) if options.quick else (256, 1000, 45)
     with tempfile.TemporaryDirectory() as folder:
         bench = Bench(Path(folder), length, times)
         try:
+            if options.row:
+                repeat(bench, options.row, options.perf)
+                return
             bench.check()
             lines, rows = table(bench, repetitions)
         finally:

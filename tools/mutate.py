@@ -8,7 +8,8 @@ argument or statement changed, but for what only the compiler runs. It is built,
 the conformance suite are run until something fails, which kills the mutant. What does not compile
 is no mutant and not counted. The list is repeatable by its seed; survivors are printed with their
 change. `--write` puts the result into a document, between the marks
-"<!-- tools/mutate.py: begin -->" and "<!-- tools/mutate.py: end -->".
+"<!-- tools/mutate.py: begin -->" and "<!-- tools/mutate.py: end -->". With `--list` it writes nothing, and fails when the document names
+other changes that are never made than are left out here.
 """
 
 import argparse
@@ -289,9 +290,18 @@ def report(options: argparse.Namespace, possible: int, verdicts: dict[Mutant, st
              f"{outcome['killed']} were killed ({100 * outcome['killed'] / max(judged, 1):.1f} %).",
              "The survivors:" if survivors else "None survived.", ""]
     lines += [f"- `{describe(mutant)}`" for mutant in survivors] + [""] * bool(survivors)
-    lines += ["Never made, since nobody who calls the module could see them:", ""]
-    lines += [f"- `{each.file}`, {each.kind} in `{each.text.strip()}`"
-              f"{f', `{each.old}`' if each.old else ''}: {each.reason}" for each in EQUIVALENT]
+    return filled(lines) + "\n" + never_made()
+
+
+def never_made() -> str:
+    """What a document says of the changes that are not tried."""
+    return filled(["Never made, since nobody who calls the module could see them:", "",
+                   *(f"- `{each.file}`, {each.kind} in `{each.text.strip()}`"
+                     f"{f', `{each.old}`' if each.old else ''}: {each.reason}"
+                     for each in EQUIVALENT)])
+
+
+def filled(lines: list[str]) -> str:
     return "\n".join(textwrap.fill(line, 100, subsequent_indent="  ", break_long_words=False,
                                    break_on_hyphens=False) for line in lines)
 
@@ -309,6 +319,9 @@ def main() -> int:
                      options.count, options.seed)
     if options.list:
         print(*map(describe, mutants), sep="\n")
+        if options.write and never_made() not in options.write.read_text():
+            print(f"{options.write} names other changes that are never made", file=sys.stderr)
+            return 1
         return 0
     verdicts: dict[Mutant, str] = {}
     start = time.monotonic()
