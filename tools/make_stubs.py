@@ -21,6 +21,8 @@ from collections.abc import Callable
 from pathlib import Path
 from typing import Any
 
+version: str
+
 class Module:
     def __new__(
         cls, module: Module, instead: dict[str, Callable[..., Any]] = ...

@@ -42,6 +42,7 @@ py::object guarded(py::handle module, bool remote) {
 
 PYBIND11_MODULE(_runtime, extension) {
     extension.doc() = "Loading modules and calling them; use the package tessel.";
+    extension.attr("version") = TESSEL_VERSION;
     PythonClasses::load();
     py::register_local_exception_translator(translate);
     addModuleClass(extension);

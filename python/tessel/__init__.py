@@ -79,6 +79,9 @@ from tessel.values import Function, Unknown
 __all__ = ["Error", "Function", "Module", "Netcdf", "Unknown", "check", "copy", "load",
            "progress_bar", "read"]
 
+__version__: str = _runtime.version
+"""The version of this package, as `tessel --version` says it."""
+
 Guard = Literal["on", "remote", "off"]
 """How much the netCDF library is kept from: see `load`."""
 

@@ -9,7 +9,6 @@ import os
 import platform
 import sys
 from collections.abc import Callable, Iterator
-from importlib import metadata
 from typing import Any, get_args
 
 import numpy as np
@@ -92,8 +91,10 @@ def _ops(options: argparse.Namespace) -> None:
         return
     operation = operations.find(options.name)
     if operation is None:
+        near = operations.near(options.name)
         raise tessel.Error("TESSEL:python:unknownOperation",
-                           f"There is no operation {options.name}; tessel ops lists all.")
+                           f"There is no operation {options.name}; {near}{'; ' if near else ''}"
+                           "tessel ops lists all.")
     print(reference.text_of(operation), end="")
 
 
@@ -130,12 +131,8 @@ class _Version(argparse.Action):
 
     @staticmethod
     def _print() -> None:
-        try:
-            version = metadata.version("tessel")
-        except metadata.PackageNotFoundError:  # it runs without having been installed
-            version = "of an unknown version"
         library = tessel.load("netcdf", guard="off").inq_libvers().partition(" ")[0]
-        print(f"tessel {version}, netCDF library {library}, NumPy {np.__version__}, "
+        print(f"tessel {tessel.__version__}, netCDF library {library}, NumPy {np.__version__}, "
               f"Python {platform.python_version()}")
 
 

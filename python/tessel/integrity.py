@@ -103,11 +103,20 @@ class Extent(NamedTuple):
     record: int
     """From each record to the next."""
 
+    counted: bool = True
+    """Whether the header says how many records there are."""
+
 
 def extent(dataset: Dataset) -> Extent | None:
     """The same, with what else is known then."""
     found, there = _measured(dataset)
     if found is not None and there < found.least:
+        if not found.counted:
+            raise tessel.Error("TESSEL:python:fileTooShort",
+                               "The file does not say how many records it has: the number in its "
+                               "header is -1, as in a stream that is still being written, and the "
+                               "library would take that for as many as there can be.",
+                               path=dataset.place)
         raise tessel.Error("TESSEL:python:fileTooShort",
                            f"The file is cut off: it has {there} bytes, and what is in it needs "
                            f"{found.least}.", path=dataset.place)
@@ -202,7 +211,8 @@ class _Header:
             total += repeated * variable.size
             if repeated and variable.size and begin is not None:
                 ends.append(begin + (repeated - 1) * step + variable.size)
-        return Extent(self.length, max(total, *ends), begins, step)
+        return Extent(self.length, max(total, *ends), begins, step,
+                      header[_WORD:_WORD + self._form.count] != b"\xff" * self._form.count)
 
     def _beginning(self, variable: _Variable, header: bytes) -> int | None:
         """Where a variable begins; None where the header is not as the inquiries say."""

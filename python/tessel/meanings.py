@@ -395,8 +395,9 @@ _PYTHON = {
     "fileChanged": (
         "The file is not the one that the array was made from any more.", "Open it anew."),
     "fileTooShort": (
-        "The file is shorter than what its header describes: it was cut off.",
-        "Get the file again; check=False reads what there is."),
+        "The file is shorter than what its header describes: it was cut off, or nobody has put the "
+        "number of records into its header.",
+        "Get the file again, from a writer that has closed it; check=False reads what there is."),
     "integerTooLarge": (
         "An integer is beyond 64 bits and no double holds it.", "Use a smaller one."),
     "maskedArray": (

@@ -48,7 +48,7 @@ def explain(error: Error, module: Any, arguments: tuple[Any, ...]) -> None:
 
 def _add(error: Error, lines: Iterator[str]) -> None:
     """Adds a note of these lines."""
-    text = "\n".join(map(wording.printable, lines))
+    text = "\n".join(map(wording.printable, filter(None, lines)))
     if text:
         error.add_note(text)
 
@@ -99,6 +99,8 @@ def _lines(error: Error, module: Any, arguments: tuple[Any, ...]) -> Iterator[st
     row = operations.find(name) if isinstance(module, Netcdf) else None
     error.operation = row.short if row else name
     yield f"in {_call(error.operation, row, given)}"
+    if row is None and isinstance(module, Netcdf):
+        yield operations.near(name)
     if row is not None:
         values = dict(zip((each.name for each in row.arguments), given))
         if "path" in values:

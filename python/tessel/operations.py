@@ -6,6 +6,8 @@ The methods of `tessel.netcdf.Netcdf`, their docstrings and the type stubs all c
 
 from __future__ import annotations
 
+import difflib
+
 from tessel.families import family
 from tessel.kinds import (ANYTHING, ATTRIBUTE, CODE, CONSTANT, DIMENSION_LIST, DIMENSIONS, DIMID,
                           IDENTIFIER, MODE, NAME, NAMES, NCID, NO_VARIABLE, NOT_OPEN, NUMBER,
@@ -18,6 +20,8 @@ EXAMPLE_BEGINNING = """\
 >>> ncid = tessel.sample.dataset(nc)
 """
 """What the example of every operation begins with."""
+
+_MOST_NEAR = 8
 
 _NEW_NCID = Result("ncid", NUMBER, "The dataset, until it is closed.")
 _HINT = Argument("chunksizehint", SIZE, "A hint for the size of the library's buffer; 0: its own.")
@@ -309,6 +313,21 @@ OPERATIONS: tuple[Operation, ...] = (
 
 BY_NAME: dict[str, Operation] = {name: each for each in OPERATIONS for name in each.names}
 """The operations by each of their names."""
+
+
+def near(name: str) -> str:
+    """The names that may have been meant, to be read after a sentence: those of a family, those
+    that begin so, or similar ones; nothing if there are none."""
+    meant = name.lower().removeprefix("nc_")
+    names = [each.short for each in OPERATIONS]
+    found = (meant and ([each for each in names if each.startswith(f"{meant}_")]
+                        or [each for each in names if each.startswith(meant)])
+             or difflib.get_close_matches(meant, names, _MOST_NEAR))
+    if not found:
+        return ""
+    more = f" and {len(found) - _MOST_NEAR} more" if len(found) > _MOST_NEAR else ""
+    return f"there are {', '.join(found[:_MOST_NEAR])}{more}" if len(found) > 1 \
+        else f"there is {found[0]}"
 
 
 def find(name: str) -> Operation | None:

@@ -17,6 +17,7 @@ from tessel.aside import written_aside
 from tessel.dataset import TEXT, Dataset, Variable, host_order
 from tessel.new_dataset import FORMATS, NewDataset
 from tessel.paths import Path
+from tessel.terminal import ProgressBar, progress_bar
 
 Progress = Callable[[int, int], object]
 """Is told the bytes of values that are done, and those that there are."""
@@ -102,9 +103,14 @@ def copy(source: Path, target: Path,
 def _ignore(_done: int, _total: int) -> None:
     """The progress that nobody wants to know."""
 
+_BAR_MAKERS: tuple[object, ...] = (progress_bar, ProgressBar)
+
 
 def listener(progress: Progress | None) -> Progress:
-    """Who is told the progress; an error for what cannot be told anything."""
+    """Who is told the progress; an error for what cannot be told anything. What makes a progress bar
+    stands for one."""
+    if any(progress is each for each in _BAR_MAKERS):
+        return progress_bar()
     if progress is not None and not callable(progress):
         raise _bad_type("progress", "a function of two numbers", progress)
     return progress or _ignore

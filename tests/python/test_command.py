@@ -286,6 +286,21 @@ def test_ops(capsys):
         "There is no operation frob; tessel ops lists all."
 
 
+@pytest.mark.parametrize("name, near", [
+    ("get_var", "there are get_var_double, get_var_float, get_var_int, get_var_short, "
+                "get_var_schar, get_var_uchar, get_var_text"),
+    ("nc_get_var_dbl", "there are get_var_double, "), ("NC_INQ_VARI", "there is inq_varid"),
+    ("get", "there are get_att_double, "), ("get", ", get_constant_names and 28 more")])
+def test_operations_of_a_similar_name(capsys, name, near):
+    line = one_line(run(capsys, "ops", name))
+    assert line.startswith(f"There is no operation {name}; there ")
+    assert near in line and line.endswith("; tessel ops lists all.")
+    nc = tessel.load("netcdf")
+    with pytest.raises(tessel.Error) as raised:
+        nc(name, 1)
+    assert raised.value.__notes__ == [f"in {name}(1)\n{line.split('; ')[1]}"]
+
+
 # In general
 
 @pytest.mark.parametrize("arguments", [["--help"], *([each, "--help"] for each in
@@ -450,7 +465,7 @@ def test_version(capsys):
     status, output, errors = run(capsys, "--version")
     assert (status, errors) == (0, "")
     library = tessel.load("netcdf").inq_libvers().split()[0]
-    assert re.fullmatch(rf"tessel \d+\.\d+\.\d+, netCDF library {re.escape(library)}, "
+    assert re.fullmatch(rf"tessel {re.escape(tessel.__version__)}, netCDF library {re.escape(library)}, "
                         rf"NumPy {re.escape(np.__version__)}, Python \d+\.\d+\.\S+\n", output)
 
 

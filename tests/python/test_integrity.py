@@ -186,6 +186,27 @@ def test_real_file_cut(tmp_path, missing):
     assert raised.value.__notes__ == [f"in tessel.check(path={wording.abridged(cut)})\nfile: {cut}"]
 
 
+@pytest.mark.parametrize("kind, count", [("classic", 4), ("64-bit offset", 4), ("cdf5", 8)])
+def test_a_stream_that_does_not_count_its_records(tmp_path, kind, count):
+    """It is not cut off, and the size that so many records would need tells nobody anything."""
+    path = Path(generate(tmp_path / "f.nc", """dimensions: t = UNLIMITED ; x = 3 ;
+        variables: double a(t, x) ; short b(x) ; data: a = 1, 2, 3, 4, 5, 6 ; b = 7, 8, 9 ;""", kind))
+    data = bytearray(path.read_bytes())
+    data[4:4 + count] = b"\xff" * count
+    path.write_bytes(data)
+    for refused in (lambda: tessel.check(path), lambda: tessel.read(path, "b")):
+        with pytest.raises(tessel.Error) as raised:
+            refused()
+        assert raised.value.identifier == TOO_SHORT and raised.value.path == str(path)
+        assert raised.value.message.startswith("The file does not say how many records it has: the "
+                                               "number in its header is -1, as in a stream")
+    assert tessel.read(path, "b", check=False).ravel().tolist() == [7, 8, 9]
+    data[4:4 + count] = (1000).to_bytes(count, "big")  # a count like any other
+    path.write_bytes(data)
+    with pytest.raises(tessel.Error, match="The file is cut off: it has"):
+        tessel.check(path)
+
+
 def test_what_the_library_does_with_a_cut_file_and_who_refuses_it(tmp_path):
     path = Path(generate(tmp_path / "f.nc", """dimensions: x = 4 ; variables: int a(x) ;
         data: a = 1, 2, 3, 4 ;"""))

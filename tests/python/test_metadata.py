@@ -9,6 +9,7 @@ from importlib import metadata
 from pathlib import Path
 
 import numpy as np
+import tessel
 
 COMPATIBILITY = Path(__file__).parents[2] / "docs" / "compatibility.md"
 
@@ -29,6 +30,11 @@ def test_what_is_imported() -> None:
     assert tuple(map(int, needs["numpy"][0].split("."))) == versions["NumPy"]
     assert tuple(map(int, needs["xarray"][0].split("."))) == versions["xarray"]
     assert versions["NumPy"] <= tuple(map(int, np.__version__.split(".")))
+
+
+def test_the_version() -> None:
+    """The extension was compiled with the one that the metadata have."""
+    assert tessel.__version__ == metadata.version("tessel")
 
 
 def test_the_python_that_it_was_compiled_for() -> None:

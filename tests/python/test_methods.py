@@ -604,6 +604,14 @@ def test_members_do_not_share_anything() -> None:
     assert len(functions) == 203 and copy.copy(functions[0]) is functions[0]
 
 
+def test_a_similar_name_is_suggested() -> None:
+    """By Python itself, which finds the methods; one that is no method costs the others nothing."""
+    run = subprocess.run([sys.executable, "-c", "import tessel\ntessel.load('netcdf').get_var_dbl"],
+                         text=True, capture_output=True, check=False)
+    assert run.stderr.endswith("AttributeError: 'Netcdf' object has no attribute 'get_var_dbl'. "
+                               "Did you mean: 'get_var_double'?\n")
+
+
 def test_help_runs() -> None:
     text = subprocess.run([sys.executable, "-c", "import tessel; help(tessel.Netcdf)"], text=True,
                           capture_output=True, check=True).stdout

@@ -3,6 +3,7 @@
 
 from __future__ import annotations
 
+import io
 import itertools
 import math
 import os
@@ -20,6 +21,7 @@ import tessel
 from made_files import (EVERYTHING, MIB, NOFILL, OFFSET64, generate, netcdf, open_descriptors,
                         run_tool, sparse)
 from tessel.dataset import Dataset
+from tessel.terminal import ProgressBar
 from tessel.transfer import blocks
 
 BLOCK_SIZES = [1, 7, 40, 100, 1000, 16 * MIB]
@@ -155,6 +157,18 @@ def test_wrong_types(everything, tmp_path, call, message):
     assert raised.value.message == message
     assert raised.value.operation in ("read", "copy")
     assert os.listdir(tmp_path) == ["everything.nc"]
+
+
+@pytest.mark.parametrize("maker", [tessel.progress_bar, ProgressBar])
+def test_what_makes_a_progress_bar_stands_for_one(everything, tmp_path, monkeypatch, maker):
+    shown = io.StringIO()
+    monkeypatch.setattr(shown, "isatty", lambda: True)
+    monkeypatch.setattr(sys, "stderr", shown)
+    tessel.copy(everything, tmp_path / "copy.nc", progress=maker)
+    assert shown.getvalue().count("100 %") == 1
+    assert same(tessel.read(tmp_path / "copy.nc", "r3", progress=maker),
+                tessel.read(everything, "r3"))
+    assert shown.getvalue().count("100 %") == 2
 
 
 def test_numbers_may_be_of_any_class(everything):
