@@ -103,6 +103,7 @@ def copy(source: Path, target: Path,
 def _ignore(_done: int, _total: int) -> None:
     """The progress that nobody wants to know."""
 
+
 _BAR_MAKERS: tuple[object, ...] = (progress_bar, ProgressBar)
 
 
