@@ -1,72 +1,25 @@
 // tests/guard/fatal_test.cpp: each call that the library does not survive, in a process of its own
 // without the guard, where it ends badly, and with the guard, where it is an error or succeeds.
+#include "ending.hpp"
 #include "fatal_calls.hpp"
 
-#include <sys/resource.h>
-#include <sys/time.h>
-#include <sys/wait.h>
-#include <unistd.h>
-
 #include <csignal>
-#include <cstdint>
-#include <cstdio>
 #include <cstring>
-#include <functional>
 
 namespace tessel::test {
 namespace {
 
-constexpr int survivedCode = 100;
-constexpr int raisedCode = 101;
-
 class FatalCall : public testing::TestWithParam<Fatal> {};
-
-std::string exitWith(int status) {
-    return "exit with " + std::to_string(status);
-}
-
-/// How a process ends that makes calls: it is given two seconds, and little room on the disk.
-std::string endOf(const std::function<void(const Folder &)> &calls) {
-    const Folder folder;
-    const pid_t child = fork();
-    if (child == 0) {
-        std::freopen("/dev/null", "w", stderr);
-        for (const int signal : {SIGSEGV, SIGBUS, SIGFPE, SIGABRT}) {
-            std::signal(signal, SIG_DFL); // a sanitizer would exit
-        }
-        const rlimit room = {std::size_t{64} << 20U, std::size_t{64} << 20U};
-        const rlimit none = {0, 0};
-        setrlimit(RLIMIT_FSIZE, &room);
-        setrlimit(RLIMIT_CORE, &none);
-        const itimerval twoSeconds = {{}, {2, 0}}; // of the processor, whatever else it does
-        setitimer(ITIMER_PROF, &twoSeconds, nullptr);
-        const std::string identifier = identifierOf([&] { calls(folder); });
-        _exit(identifier.empty() ? survivedCode : raisedCode);
-    }
-    int status = 0;
-    waitpid(child, &status, 0);
-    if (WIFSIGNALED(status)) {
-        return strsignal(WTERMSIG(status));
-    }
-    return exitWith(WEXITSTATUS(status));
-}
-
-/// True where a sanitizer sees what overflows before it does harm, and ends the process with 1.
-#ifdef __SANITIZE_ADDRESS__
-constexpr bool sanitized = true;
-#else
-constexpr bool sanitized = false;
-#endif
 
 TEST_P(FatalCall, IsFatalWithoutTheGuard) {
     const auto call = [](const Folder &folder) { GetParam().call(plainModule(), folder); };
     const std::string end = endOf(call);
     if (libraryRelease >= GetParam().mended) {
-        EXPECT_TRUE(end == exitWith(survivedCode) || end == exitWith(raisedCode)) << end;
+        EXPECT_TRUE(end == survived || end == raised) << end;
         return;
     }
     const std::string expected = strsignal(GetParam().signal);
-    EXPECT_TRUE(end == expected || (sanitized && end == exitWith(1))) << end;
+    EXPECT_TRUE(end == expected || (sanitized && end == "exit with 1")) << end;
 }
 
 TEST_P(FatalCall, IsHarmlessWithTheGuard) {
