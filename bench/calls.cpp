@@ -2,6 +2,7 @@
 //
 // The file is made in a temporary folder: a variable of 256 MiB in the 64-bit-offset format.
 #include "pairs.hpp"
+#include "tessel/netcdf_guard.hpp"
 #include "tessel/runtime.hpp"
 
 #include <netcdf.h>
@@ -17,6 +18,7 @@
 #include <cstdio>
 #include <span>
 #include <stdexcept>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -29,6 +31,7 @@ using bench::Pair;
 constexpr std::size_t largeBytes = std::size_t{256} << 20U;
 constexpr std::size_t largeElements = largeBytes / sizeof(double);
 constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / 1024 / 512};
+constexpr std::array<std::size_t, 3> first = {0, 0, 0}; // the place of an element
 constexpr const char *dimension = "time";
 constexpr const char *variable = "large";
 constexpr const char *attribute = "units";
@@ -37,7 +40,7 @@ constexpr const char *attribute = "units";
 class Dataset {
   public:
     Dataset() {
-        const std::string file = folder.file("large.nc");
+        const std::string file = folder.file(fileName);
         int writing = 0;
         check(nc_create(file.c_str(), NC_64BIT_OFFSET, &writing));
         std::array<int, 3> dims{};
@@ -61,6 +64,12 @@ class Dataset {
         }
         begin = facts.st_size - static_cast<off_t>(largeBytes);
     }
+
+    /// The file, opened once more through a module, for writing.
+    [[nodiscard]] int openedBy(const Module &module) const {
+        return static_cast<int>(module("open", folder.file(fileName), "WRITE")[0].number());
+    }
+
     ~Dataset() {
         nc_close(ncid);
         close(descriptor);
@@ -74,6 +83,7 @@ class Dataset {
     off_t begin = 0;     ///< of the numbers in it
 
   private:
+    static constexpr const char *fileName = "large.nc";
     bench::TemporaryFolder folder;
 };
 
@@ -116,14 +126,6 @@ void addInquiries(std::vector<Pair> &pairs, const Module &netcdf, const Dataset 
              benchmark::DoNotOptimize(name);
          },
          called(netcdf, Array::text("inq_dim"), Array::scalar(data.ncid), Array::scalar(0))});
-    pairs.push_back({"inq_varid",
-                     [&data] {
-                         int varid = 0;
-                         check(nc_inq_varid(data.ncid, variable, &varid));
-                         benchmark::DoNotOptimize(varid);
-                     },
-                     called(netcdf, Array::text("inq_varid"), Array::scalar(data.ncid),
-                            Array::text(variable))});
     pairs.push_back({"inq_var",
                      [&data] {
                          std::array<char, NC_MAX_NAME + 1> name;
@@ -168,7 +170,47 @@ void addAttributeInquiries(std::vector<Pair> &pairs, const Module &netcdf, const
                             Array::scalar(data.varid), Array::scalar(0))});
 }
 
-std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
+/// An inquiry, and one element read and written, with and without the guard, in a dataset that was
+/// opened through the module in question, so that the guard knows it. What the guard costs a call
+/// is the difference.
+void addGuarded(std::vector<Pair> &pairs, const Module &netcdf, const Module &guarded,
+                const Dataset &data) {
+    for (const auto &[suffix, module] :
+         {std::pair("", &netcdf), std::pair(", guarded", &guarded)}) {
+        const int ncid = data.openedBy(*module);
+        const auto add = [&, &with = *module, suffix = suffix](
+                             const std::string &operation, const auto &function, auto... inputs) {
+            pairs.push_back(
+                {operation + suffix, function,
+                 called(with, Array::text(operation), Array::scalar(ncid), std::move(inputs)...)});
+        };
+        add(
+            "inq_varid",
+            [ncid] {
+                int varid = 0;
+                check(nc_inq_varid(ncid, variable, &varid));
+                benchmark::DoNotOptimize(varid);
+            },
+            Array::text(variable));
+        add(
+            "get_var1_double",
+            [ncid, varid = data.varid] {
+                double value = 0;
+                check(nc_get_var1_double(ncid, varid, first.data(), &value));
+                benchmark::DoNotOptimize(value);
+            },
+            Array::scalar(data.varid), Array::row({0, 0, 0}));
+        add(
+            "put_var1_double",
+            [ncid, varid = data.varid] {
+                const double value = 0;
+                check(nc_put_var1_double(ncid, varid, first.data(), &value));
+            },
+            Array::scalar(data.varid), Array::row({0, 0, 0}), Array::scalar(0));
+    }
+}
+
+std::vector<Pair> pairsOf(const Module &netcdf, const Module &guarded, const Dataset &data) {
     const auto direct = [&data] {
         int dimid = 0;
         check(nc_inq_dimid(data.ncid, dimension, &dimid));
@@ -203,6 +245,7 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
     };
     addInquiries(pairs, netcdf, data);
     addAttributeInquiries(pairs, netcdf, data);
+    addGuarded(pairs, netcdf, guarded, data);
     pairs.push_back({"get_var_double of 256 MiB", readDirect, read, true});
     pairs.push_back({"get_var_double of 256 MiB, beside pread with byte swap",
                      [&data] { readPlainly(data); }, read, true});
@@ -213,8 +256,9 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Dataset &data) {
 
 int main(int argc, char **argv) try {
     const Module netcdf(TESSEL_NETCDF_MODULE);
+    const Module guarded = netcdf.watchedBy(netcdfGuard());
     const Dataset data;
-    return bench::measure(argc, argv, "bench_calls", pairsOf(netcdf, data));
+    return bench::measure(argc, argv, "bench_calls", pairsOf(netcdf, guarded, data));
 } catch (const std::exception &error) {
     std::fprintf(stderr, "bench_calls: %s\n", error.what());
     return 1;

@@ -50,7 +50,8 @@ def calls(axes: Axes, rows: Sequence[Outcome]) -> None:
     axes.barh(places, [each.ours * 1e9 - below for each, below in zip(rows, library)],
               left=library, color=MODULE, label="added by the module and the host")
     limits(axes, [below + each.row.limit.value * 1e9 for each, below in zip(rows, library)])
-    rows_of(axes, "A call", "nanoseconds", [each.row.what.split(",")[0] for each in rows])
+    rows_of(axes, "A call", "nanoseconds",
+            [each.row.what.removesuffix(", one element") for each in rows])
     axes.legend(loc="lower right", framealpha=1)
 
 

@@ -8,7 +8,7 @@ from typing import NamedTuple
 
 from results import Results
 
-NUMBERS = ("double", "float", "short")
+NUMBERS = ("double", "float", "int", "short", "schar", "uchar")
 TYPES = (*NUMBERS, "text")
 FAMILIES = ("get_var", "get_var1", "get_vara", "get_vars", "get_att",
             "put_var", "put_var1", "put_vara", "put_vars", "put_att")
@@ -76,6 +76,9 @@ MORE_FUNCTIONS = ("the operation asks the library more than the reference does, 
 TWICE = ("the library looks the attribute up by its name once for its type and length and once for "
          "its values; see [One element](#one-element)")
 STRIDED = MORE_FUNCTIONS + "; the library's strided functions take longer after other code"
+NAMED = "the guard looks at the name of the operation, too; see [With the guard](#with-the-guard)"
+WATCHED = ("the guard finds the dataset, and reads the position of the write, before the module "
+           "does so itself; see [With the guard](#with-the-guard)")
 ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters are "
          "zeros before they are anything else; see [Blocks of text](#blocks-of-text)")
 UNCOPIED = ("nothing is copied or added on this way, and the same row lies on either side of one "
@@ -93,6 +96,8 @@ REASONS = {
     "get_vars, one element": Reason(STRIDED, 280e-9),
     "put_vars, one element": Reason(STRIDED, 280e-9),
     "get_att, one element": Reason(TWICE, 420e-9),
+    "get_var1_double, guarded": Reason(NAMED, 160e-9),
+    "put_var1_double, guarded": Reason(WATCHED, 280e-9),
     **{f"Python: {each}, anywhere in the file, {form}": Reason(FILLED, 1 / 8)
        for each in ("one element", "ten elements") for form in ("call", "method")},
     **{f"Python: whole {each}": Reason(NOISE, 1.03) for each in ("read", "write, to a new file")},
@@ -125,6 +130,9 @@ ROWS = (
     *(of_family(each, "one", TYPES, added(120)) for each in FAMILIES),
     *(Row(each.split(",")[0], DIRECT, added(150), "bench_calls", (each,))
       for each in INQUIRIES),
+    *(Row(what, DIRECT, added(most), "bench_calls", (what,), REASONS.get(what))
+      for what, most in (("inq_varid, guarded", 150), ("get_var1_double, guarded", 120),
+                         ("put_var1_double, guarded", 120))),
     Row("get_var_double of 256 MiB", LIKE_MEMORY, times(1.01), "bench_calls",
         ("get_var_double of 256 MiB",), REASONS["get_var_double of 256 MiB"]),
     *(of_family(each, "64MiB", NUMBERS, times(1.01), LIKE_MEMORY) for each in BLOCKS),

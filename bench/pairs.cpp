@@ -16,8 +16,6 @@
 namespace tessel::bench {
 namespace {
 
-constexpr int repetitions = 25;
-constexpr int slowRepetitions = 5;
 constexpr double shortestTime = 0.02; ///< of a repetition of something short, in seconds
 
 double shortest(const std::vector<double> &all) {
@@ -88,8 +86,7 @@ void add(const std::string &name, const std::function<void()> &work, const Pair 
                 work();
             }
         });
-    const int all = pair.slow ? slowRepetitions : repetitions;
-    registered->Repetitions(quick ? 2 : all)->DisplayAggregatesOnly()->UseRealTime();
+    registered->Repetitions(quick ? 2 : pair.repetitions)->DisplayAggregatesOnly()->UseRealTime();
     registered->ComputeStatistics("shortest", shortest);
     if (pair.block) {
         registered->Iterations(1)->Unit(benchmark::kMillisecond);

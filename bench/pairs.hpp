@@ -16,6 +16,8 @@
 
 namespace tessel::bench {
 
+constexpr int usualRepetitions = 25;
+
 /// Something done through the module, and the reference that does the same by the library alone.
 struct Pair {
     std::string name;
@@ -27,7 +29,7 @@ struct Pair {
     /// that it has to make, and all memory that it has to fill, without the module.
     std::function<void()> steps = nullptr;
 
-    bool slow = false; ///< takes so long that it is worth fewer repetitions
+    int repetitions = usualRepetitions; ///< fewer, where each takes long
 
     std::function<void()> before = nullptr; ///< comes before each repetition, unmeasured
 };

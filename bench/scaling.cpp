@@ -29,6 +29,7 @@ using Work = std::function<void()>;
 
 /// From so many elements on, one iteration is a measurement, and with more, few of them have to do.
 constexpr std::size_t blockElements = 100'000'000;
+constexpr int fewRepetitions = 5;
 
 const Numbers sizes = {1,       10,        100,        1'000,       10'000,
                        100'000, 1'000'000, 10'000'000, 100'000'000, 1'000'000'000};
@@ -42,10 +43,17 @@ const Numbers openDatasets = {1, 10, 100, 500};
 /// The measurements, a series at a time.
 class Series {
   public:
-    void add(const char *what, const char *counted, std::size_t count, Work library, Work module,
-             bool block = false) {
+    void add(const char *what, const char *counted, std::size_t count, Work library, Work module) {
         pairs.push_back({std::string(what) + ", " + counted + ": " + std::to_string(count),
-                         std::move(library), std::move(module), block});
+                         std::move(library), std::move(module)});
+    }
+
+    /// A read or a write of so many elements.
+    void addTransfer(const char *what, std::size_t size, Work library, Work module) {
+        add(what, "elements", size, std::move(library), std::move(module));
+        Pair &added = pairs.back();
+        added.block = size >= blockElements;
+        added.repetitions = size > blockElements ? fewRepetitions : bench::usualRepetitions;
     }
 
     std::vector<Pair> pairs;
@@ -114,39 +122,34 @@ struct Datasets {
 
 // ---- the size of the data -----------------------------------------------------------------------
 
-void addReads(Series &series, const Module &netcdf, const Dataset &data) {
-    for (const std::size_t size : sizes) {
+void addReads(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted) {
+    for (const std::size_t size : wanted) {
         const int varid = data.variable(numbered("v", size), NC_BYTE,
                                         {data.dimension(numbered("x", size), size)});
         const auto library = [&data, varid, size] {
             const Array memory = Array::numeric(tsINT8, std::array<std::size_t, 2>{size, 1});
             check(nc_get_var_schar(data.ncid, varid, static_cast<signed char *>(memory.data())));
         };
-        series.add("get_var_schar", "elements", size, library,
-                   called(netcdf, Array::text("get_var_schar"), Array::scalar(data.ncid),
-                          Array::scalar(varid)),
-                   size >= blockElements);
-        series.pairs.back().slow = size > blockElements;
+        series.addTransfer("get_var_schar", size, library,
+                           called(netcdf, Array::text("get_var_schar"), Array::scalar(data.ncid),
+                                  Array::scalar(varid)));
     }
     data.endDefinition();
 }
 
-void addWrites(Series &series, const Module &netcdf, const Dataset &data) {
-    for (const std::size_t size : sizes) {
-        if (size > blockElements) {
-            continue; // the disk would have to hold it
-        }
+void addWrites(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted) {
+    // All of them write from the same memory.
+    const auto values = std::make_shared<std::vector<signed char>>(wanted.back(), 'x');
+    for (const std::size_t size : wanted) {
         const int varid = data.variable(numbered("v", size), NC_BYTE,
                                         {data.dimension(numbered("x", size), size)});
-        const auto values = std::make_shared<std::vector<signed char>>(size, 'x');
-        series.add(
-            "put_var_schar", "elements", size,
+        series.addTransfer(
+            "put_var_schar", size,
             [&data, varid, values] { check(nc_put_var_schar(data.ncid, varid, values->data())); },
             called(netcdf, Array::text("put_var_schar"), Array::scalar(data.ncid),
                    Array::scalar(varid),
                    Array::borrowed(tsINT8, std::array<std::size_t, 2>{size, 1}, values->data(),
-                                   values)),
-            size >= blockElements);
+                                   values)));
     }
     data.endDefinition();
 }
@@ -383,17 +386,18 @@ int main(int argc, char **argv) try {
     Datasets datasets;
     Others others(datasets.folder.file("others"));
     Series series;
-    addReads(series, netcdf, datasets.file("read"));
-    addWrites(series, netcdf, datasets.file("written"));
+    Numbers wanted = sizes;
+    if (bench::isQuick(argc, argv)) {
+        wanted.pop_back();
+    }
+    addReads(series, netcdf, datasets.file("read"), wanted);
+    addWrites(series, netcdf, datasets.file("written"), wanted);
     addAttributeReads(series, netcdf, datasets.inMemory());
     addElements(series, netcdf, datasets.file("dimensions"));
     addDefinitions(series, netcdf, datasets.inMemory());
     addVariables(series, netcdf, guarded, datasets);
     addAttributes(series, netcdf, datasets);
     addOpen(series, netcdf, guarded, others);
-    if (bench::isQuick(argc, argv)) {
-        std::erase_if(series.pairs, [](const Pair &pair) { return pair.slow; });
-    }
     return bench::measure(argc, argv, "bench_scaling", series.pairs);
 } catch (const std::exception &error) {
     std::fprintf(stderr, "bench_scaling: %s\n", error.what());
