@@ -10,8 +10,10 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <csignal>
+#include <cstdint>
 #include <fstream>
 #include <ostream>
 #include <span>
@@ -135,6 +137,90 @@ void readTooMuch(Story &story) {
     story.tell("get_var_text", [&] { netcdf()("get_var_text", ncid, chars[0]); });
     story.tell("get_var1_double", [&] { netcdf()("get_var1_double", ncid, bytes[0], 7); });
     story.tell("close", [&] { netcdf()("close", ncid); });
+}
+
+/// The addresses that the process has taken, in bytes.
+rlim_t addressesTaken() {
+    rlim_t pages = 0;
+    std::ifstream("/proc/self/statm") >> pages;
+    return pages * static_cast<rlim_t>(sysconf(_SC_PAGESIZE));
+}
+
+std::string shown(double whole) {
+    return std::to_string(static_cast<long>(whole));
+}
+
+/// Writes with less memory than a second copy of the values takes. Numbers are handed to the
+/// library as they are, text goes through bytes of the module's, attributes and what is kept in
+/// memory through the library's.
+void writeTooMuch(Story &story) {
+    constexpr std::size_t elements = 40'000'000;
+    constexpr rlim_t little = rlim_t{16} << 20U;
+    constexpr double keptInMemory = 8;
+    constexpr double ncByte = 1;
+    constexpr double ncChar = 2;
+    constexpr double ncDouble = 6;
+    const Array text = Array::text(std::string(elements, 'a'));
+    const Array numbers = Array::numeric(tsINT8, std::array{elements, std::size_t{1}});
+    std::fill_n(numbers.elements<std::int8_t>().data(), elements, std::int8_t{7});
+    const Array doubles = Array::numeric(tsDOUBLE, std::array{elements / 8, std::size_t{1}});
+    const auto count = static_cast<double>(elements);
+
+    const auto make = [&](const std::string &name, double flags) {
+        const int ncid = idOf(netcdf()("create", story.file(name), flags));
+        netcdf()("set_fill", ncid, 256);
+        const Results x = netcdf()("def_dim", ncid, "x", count);
+        netcdf()("def_var", ncid, "text", ncChar, x[0]);
+        netcdf()("def_var", ncid, "bytes", ncByte, x[0]);
+        return ncid;
+    };
+    const int ncid = make("large.nc", 0);
+    netcdf()("put_att_text", ncid, -1, "small", "a");
+    netcdf()("enddef", ncid);
+    const int kept = make("kept.nc", keptInMemory);
+    netcdf()("enddef", kept);
+
+    const rlim_t before = addressesTaken();
+    const auto leave = [&](rlim_t most) {
+        const rlimit few = {most, RLIM_INFINITY};
+        setrlimit(RLIMIT_AS, &few);
+    };
+    const auto noteMemory = [&] {
+        story.note("memory", addressesTaken() < before + little ? "as before" : "more");
+    };
+    leave(before + little);
+    story.tell("put_var_text", [&] { netcdf()("put_var_text", ncid, 0, text); });
+    story.tell("put_vara_text", [&] { netcdf()("put_vara_text", ncid, 0, 0, count, text); });
+    story.tell("put_vars_text", [&] { netcdf()("put_vars_text", ncid, 0, 0, count, 1, text); });
+    story.tell("put_var1_text", [&] { netcdf()("put_var1_text", ncid, 0, 7, "b"); });
+    story.tell("put_var_schar", [&] { netcdf()("put_var_schar", ncid, 1, numbers); });
+    story.tell("put_var_schar in memory", [&] { netcdf()("put_var_schar", kept, 1, numbers); });
+    netcdf()("redef", ncid);
+    story.tell("put_att_text", [&] { netcdf()("put_att_text", ncid, -1, "large", text); });
+    story.tell("put_att_double",
+               [&] { netcdf()("put_att_double", ncid, -1, "large", ncDouble, doubles); });
+    leave(before + little + elements); // for the module's bytes, and not for the library's
+    story.tell("put_att_text with more",
+               [&] { netcdf()("put_att_text", ncid, -1, "large", text); });
+    noteMemory();
+    leave(before + little);
+    story.tell("put_att_text again", [&] { netcdf()("put_att_text", ncid, -1, "small", "b"); });
+    story.tell("enddef", [&] { netcdf()("enddef", ncid); });
+    noteMemory();
+    leave(RLIM_INFINITY);
+    story.tell("put_var_text again", [&] { netcdf()("put_var_text", ncid, 0, text); });
+    story.tell("close", [&] { netcdf()("close", ncid); });
+    story.tell("put_var_schar in memory again",
+               [&] { netcdf()("put_var_schar", kept, 1, numbers); });
+    story.tell("close in memory", [&] { netcdf()("close", kept); });
+    story.tell("abort in memory", [&] { netcdf()("abort", kept); });
+
+    const int read = idOf(netcdf()("open", story.file("large.nc"), "NOWRITE"));
+    story.note("attributes", shown(netcdf()("inq", read)[2].number()));
+    story.note("the attribute", netcdf()("get_att_text", read, -1, "small")[0].utf8());
+    story.note("the last letter", netcdf()("get_var1_text", read, 0, count - 1)[0].utf8());
+    story.note("the last number",
+               shown(netcdf()("get_var1_double", read, 1, count - 1)[0].number()));
 }
 
 struct Row {
@@ -339,6 +425,31 @@ const Row rows[] = {
       "get_var1_double: done",
       "close: done"},
      readTooMuch, true},
+    {"TheMemoryIsLimitedForWrites",
+     {"put_var_text: TESSEL:netcdf:put_var_text:memoryAllocationFailure",
+      "put_vara_text: TESSEL:netcdf:put_vara_text:memoryAllocationFailure",
+      "put_vars_text: TESSEL:netcdf:put_vars_text:memoryAllocationFailure",
+      "put_var1_text: done",
+      "put_var_schar: done",
+      "put_var_schar in memory: TESSEL:netcdf:putVar:memoryAllocationFailure",
+      "put_att_text: TESSEL:netcdf:put_att_text:memoryAllocationFailure",
+      "put_att_double: TESSEL:netcdf:putAtt:memoryAllocationFailure",
+      "put_att_text with more: TESSEL:netcdf:putAttText:memoryAllocationFailure",
+      "memory: as before",
+      "put_att_text again: done",
+      "enddef: done",
+      "memory: as before",
+      "put_var_text again: done",
+      "close: done",
+      // The library does not go on with what it could not make longer.
+      "put_var_schar in memory again: TESSEL:netcdf:putVar:unknownErrorStatus",
+      "close in memory: TESSEL:netcdf:close:unknownErrorStatus",
+      "abort in memory: done",
+      "attributes: 1",
+      "the attribute: b",
+      "the last letter: a",
+      "the last number: 7"},
+     writeTooMuch, true},
 };
 // clang-format on
 

@@ -1,9 +1,13 @@
 // tests/threads/stress.cpp: many threads over one module, on files of their own and on the same
-// ones. Usage: threads_stress [SECONDS]
+// ones. Usage: threads_stress [--guard] [SECONDS]
 //
 // Every value is a function of where it stands, so each thread can check all that it reads without
-// knowing what the others do. What is wrong is printed, and then the program fails.
+// knowing what the others do. With --guard the module is behind its guard, as it is in Python, and
+// the threads also make calls that it refuses, each of which must be its own thread's: one would
+// end the process if another thread's call took its place. What is wrong is printed, and then the
+// program fails.
 #include "support/process.hpp"
+#include "tessel/netcdf_guard.hpp"
 #include "tessel/runtime.hpp"
 
 #include <algorithm>
@@ -14,12 +18,15 @@
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <iterator>
 #include <mutex>
 #include <random>
 #include <set>
+#include <span>
 #include <stdexcept>
 #include <string>
+#include <string_view>
 #include <thread>
 #include <vector>
 
@@ -70,11 +77,18 @@ Array lengths(std::size_t first, std::size_t second) {
 
 /// What all threads use.
 struct Scene {
-    Module netcdf{TESSEL_NETCDF_MODULE};
+    explicit Scene(bool behindGuard)
+        : guarded(behindGuard),
+          netcdf(guarded ? Module(TESSEL_NETCDF_MODULE).watchedBy(tessel::netcdfGuard())
+                         : Module(TESSEL_NETCDF_MODULE)) {}
+
+    bool guarded;
+    Module netcdf;
     tessel::test::Folder folder;
     Ids ids;
     std::string commonFile = folder.file("common.nc");
-    double readId = 0;  ///< commonFile, open for reading
+    std::string claimingFile = folder.file("claims.nc"); ///< more dimensions than it has bytes
+    double readId = 0;                                   ///< commonFile, open for reading
     double writeId = 0; ///< a dataset in which each thread has a row of its own
 
     /// A file with one variable of double, id 0; open, out of define mode.
@@ -208,14 +222,47 @@ void errors(Worker &worker) {
     wantError("TESSEL:netcdf:InvalidOperation", [&] { netcdf("no_such_operation"); });
 }
 
+/// What the guard refuses, some of it by what it knows of a dataset of this thread's.
+void refusals(Worker &worker) {
+    Scene &scene = worker.scene;
+    const Module &netcdf = scene.netcdf;
+    const std::string path = scene.folder.file(std::to_string(worker.number) + "-records.nc");
+    constexpr double userFormat = 64;
+    wantError("TESSEL:guard:mode", [&] { netcdf("create", path, userFormat); });
+    wantError("TESSEL:guard:header", [&] { scene.open(scene.claimingFile); });
+
+    const double id = scene.ids.note(netcdf("create", path, "CLOBBER")[0].number());
+    const Results t = netcdf("def_dim", id, "t", 0);
+    const Results v = netcdf("def_var", id, "v", netcdf("parameter", "DOUBLE")[0], t[0]);
+    wantError("TESSEL:guard:alignment", [&] { netcdf("_enddef", id, 0, 0, 0, 4); });
+    netcdf("enddef", id);
+    wantError("TESSEL:guard:records", [&] { netcdf("put_var1_double", id, v[0], 4e9, 1); });
+    const auto record = static_cast<double>(worker.below(100));
+    netcdf("put_var1_double", id, v[0], record, record);
+    want(netcdf("inq_dim", id, t[0])[1].number() == record + 1, "there are other records");
+
+    netcdf("close", id);
+
+    // Definitions that cannot be ended: there are two fill values instead of one.
+    const double other = scene.ids.note(netcdf("create", path, "CLOBBER")[0].number());
+    const Results x = netcdf("def_dim", other, "x", 3);
+    netcdf("def_var", other, "v", netcdf("parameter", "INT")[0], x[0]);
+    netcdf("put_att_double", other, 0, "_FillValue", netcdf("parameter", "INT")[0],
+           Array::row({1, 2}));
+    for (int times = 0; times < 2; ++times) {
+        wantError("TESSEL:netcdf:close:invalidDataType", [&] { netcdf("close", other); });
+    }
+    netcdf("abort", other);
+}
+
 struct Action {
     const char *name;
     void (*run)(Worker &);
 };
-constexpr std::array actions = {
+constexpr std::array allActions = {
     Action{"ownFile", ownFile},       Action{"commonDataset", commonDataset},
     Action{"commonFile", commonFile}, Action{"commonRows", commonRows},
-    Action{"errors", errors},
+    Action{"errors", errors},         Action{"refusals", refusals}, // by the guard
 };
 
 /// Arrays made, moved and destroyed without any call, as other threads of a program do.
@@ -235,7 +282,9 @@ double compute() {
 /// The threads, the time they have, and what they count and find wrong.
 class Run {
   public:
-    Run(Scene &shared, std::chrono::duration<double> time) : scene(shared), limit(time) {}
+    Run(Scene &shared, std::chrono::duration<double> time)
+        : scene(shared), limit(time),
+          actions(std::span(allActions).first(allActions.size() - (scene.guarded ? 0U : 1U))) {}
 
     /// True if nothing was wrong and each action was done.
     bool finish() {
@@ -292,8 +341,9 @@ class Run {
 
     Scene &scene;
     std::chrono::duration<double> limit;
+    std::span<const Action> actions;
     std::atomic<bool> done = false;
-    std::array<std::atomic<std::size_t>, actions.size()> counts{};
+    std::array<std::atomic<std::size_t>, allActions.size()> counts{};
     std::atomic<std::size_t> computed = 0;
     std::mutex mutex;
     std::vector<std::string> faults;
@@ -307,8 +357,10 @@ void wantAllClosed(Scene &scene) {
     }
 }
 
-bool stress(double seconds) {
-    Scene scene;
+bool stress(bool guarded, double seconds) {
+    Scene scene(guarded);
+    constexpr std::string_view claims("CDF\1\0\0\0\0\0\0\0\x0A\x7F\xFF\xFF\xFF", 16);
+    std::ofstream(scene.claimingFile, std::ios::binary) << claims;
     const std::size_t before = tessel::test::openDescriptors();
     const double made = scene.create(scene.commonFile, rows);
     scene.fill(made, rows, 0);
@@ -329,7 +381,9 @@ bool stress(double seconds) {
 } // namespace
 
 int main(int argc, char **argv) try {
-    return stress(argc > 1 ? std::stod(argv[1]) : 5) ? 0 : 1;
+    const bool guarded = argc > 1 && std::string_view(argv[1]) == "--guard";
+    const int seconds = guarded ? 2 : 1;
+    return stress(guarded, argc > seconds ? std::stod(argv[seconds]) : 5) ? 0 : 1;
 } catch (const std::exception &error) {
     std::printf("fault: %s\n", error.what());
     return 1;
