@@ -16,6 +16,7 @@ from __future__ import annotations
 import contextlib
 import ctypes
 import ctypes.util
+import math
 import tempfile
 from collections.abc import Iterator
 from pathlib import Path
@@ -170,7 +171,9 @@ def main() -> None:
             lines.append(f"| {way.name} | {' | '.join(map(shown, found.values()))} |")
         took = looking(path, places)
         rows["looking"] = {"tessel": Measured(took, 1, took)}
-        lines += ["", f"To see whether the file is still what it was takes {shown(took)}."]
+        lines += ["", f"The file has {shape[0]} records of {shape[1]} by {shape[2]} floats, "
+                      f"{math.prod(shape) * 4 / 1e6:.0f} MB. To see whether it is still what it "
+                      f"was takes {shown(took)}."]
     give_out(options, "bench/open_modes.py", "\n".join(lines), rows)
 
 

@@ -288,9 +288,10 @@ def table(bench: Bench, repetitions: int) -> tuple[list[str], dict[str, dict[str
     return lines, rows
 
 
-def circumstances() -> str:
-    """What was measured with."""
-    return (f"Python {platform.python_version()}, NumPy {np.__version__}, SciPy "
+def circumstances(bench: Bench) -> str:
+    """What was measured, and with what."""
+    return (f"The whole variable is {bench.data.nbytes / 2**20:.0f} MiB. "
+            f"Python {platform.python_version()}, NumPy {np.__version__}, SciPy "
             f"{scipy.__version__}, netCDF4-python {netCDF4.__version__}, netCDF library "
             f"{netCDF4.getlibversion().split()[0]}.")
 
@@ -319,9 +320,10 @@ def main() -> None:
                 return
             bench.check()
             lines, rows = table(bench, repetitions)
+            said = circumstances(bench)
         finally:
             bench.close()
-    give_out(options, "bench/python_front.py", "\n".join([*lines, "", circumstances()]), rows)
+    give_out(options, "bench/python_front.py", "\n".join([*lines, "", said]), rows)
 
 
 if __name__ == "__main__":
