@@ -91,6 +91,11 @@ void lookAtName(std::string_view path, const GuardOptions &options) {
     }
 }
 
+/// Whether it was the module that raised an error, and not the host.
+bool isModules(const Error &error) noexcept {
+    return error.identifier().starts_with("TESSEL:netcdf:");
+}
+
 /// Looks at what the module answers. Where it refuses, as for a dataset or a variable that there is
 /// not, it will refuse the call itself.
 template <class Look>
@@ -98,7 +103,7 @@ void unlessRefused(const Look &look) {
     try {
         look();
     } catch (const Error &error) {
-        if (!std::string_view(error.identifier()).starts_with("TESSEL:netcdf:")) {
+        if (!isModules(error)) {
             throw;
         }
     }
@@ -155,7 +160,7 @@ void settle(int ncid, Dataset &dataset, const Ask &ask) {
             const std::string_view identifier = error.identifier();
             const std::string_view message = error.message();
             const std::string_view word = identifier.substr(identifier.rfind(':') + 1);
-            if (!identifier.starts_with("TESSEL:netcdf:")) {
+            if (!isModules(error)) {
                 throw;
             }
             // Nothing to do: the module was called without its guard meanwhile.
@@ -179,13 +184,17 @@ void settle(int ncid, Dataset &dataset, const Ask &ask) {
 /// An end of the definitions that fails may have left define mode. Synchronising tells, which in
 /// define mode does nothing but fail.
 void settleMode(int ncid, Dataset &dataset, const Ask &ask) {
-    dataset.modeInDoubt = false;
-    dataset.defining = false;
+    bool defining = false;
     try {
         ask("sync", ncid);
     } catch (const Error &error) {
-        dataset.defining = error.identifier().ends_with(":operationNotAllowedInDefineMode");
+        if (!isModules(error)) {
+            throw;
+        }
+        defining = error.identifier().ends_with(":operationNotAllowedInDefineMode");
     }
+    dataset.defining = defining;
+    dataset.modeInDoubt = false;
 }
 
 /// Whether so much memory can be mapped.
@@ -468,7 +477,7 @@ class Guard : public Watcher {
     /// A dataset whose closing failed may be used when it is as it was: a classic one that was
     /// settled before it was closed. An abort that the library was asked for ends one in any case.
     void rememberEnd(int ncid, Dataset &dataset, const Error *error) const noexcept {
-        const bool reached = error != nullptr && error->identifier().starts_with("TESSEL:netcdf:");
+        const bool reached = error != nullptr && isModules(*error);
         const bool gone = error == nullptr || error->identifier().ends_with(":notNetcdfID") ||
                           (kind == Kind::abort && reached);
         if (!gone && reached && (!dataset.known || !dataset.classic)) {
