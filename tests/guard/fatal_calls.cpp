@@ -11,19 +11,6 @@ using namespace std::string_literals;
 constexpr double wraps = -1; // as a count: 2^64-1
 constexpr int share = 2048;
 
-/// A call that must raise this error. Another one goes on.
-template <class Call>
-void wantError(std::string_view identifier, const Call &call) {
-    try {
-        call();
-        ADD_FAILURE() << "the call succeeds, and should raise " << identifier;
-    } catch (const Error &error) {
-        if (error.identifier() != identifier) {
-            throw;
-        }
-    }
-}
-
 /// Closed once, which failed.
 int closedInVain(const Module &netcdf, const Folder &folder) {
     const int ncid = unclosable(netcdf, folder);

@@ -37,6 +37,19 @@ std::string identifierOf(const Call &call) {
     return "";
 }
 
+/// A call that must raise this error. Another one goes on.
+template <class Call>
+void wantError(std::string_view identifier, const Call &call) {
+    try {
+        call();
+        ADD_FAILURE() << "the call succeeds, and should raise " << identifier;
+    } catch (const Error &error) {
+        if (error.identifier() != identifier) {
+            throw;
+        }
+    }
+}
+
 /// As long as it lives, files cannot grow beyond 64 KiB.
 class FullDisk {
   public:

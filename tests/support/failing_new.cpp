@@ -21,8 +21,7 @@ constinit thread_local Allocations allocations;
 } // namespace
 
 void *operator new(std::size_t bytes) {
-    if (allocations.counting && ++allocations.made == allocations.failing) {
-        allocations.met = true;
+    if (tessel::test::Failing::next()) {
         throw std::bad_alloc();
     }
     void *const memory = std::malloc(std::max<std::size_t>(bytes, 1));
@@ -68,6 +67,14 @@ Failing::~Failing() {
 
 void Failing::count(bool on) {
     allocations.counting = on;
+}
+
+bool Failing::next() {
+    if (allocations.counting && ++allocations.made == allocations.failing) {
+        allocations.met = true;
+        return true;
+    }
+    return false;
 }
 
 bool Failing::met() {

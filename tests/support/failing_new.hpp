@@ -6,7 +6,8 @@
 
 namespace tessel::test {
 
-/// Counts the allocations of this thread within its life, and fails the n-th; none if n is 0.
+/// Counts the allocations of this thread within its life, and fails the n-th; none if n is 0. Those
+/// that a module asks the host for are among them in programs with failing_host.cpp.
 class Failing {
   public:
     explicit Failing(std::size_t n, bool counting = true);
@@ -16,6 +17,9 @@ class Failing {
 
     /// Goes on with counting, or stops.
     static void count(bool on);
+
+    /// Counts an allocation that is to be made; true if it is the one that fails.
+    static bool next();
 
     /// Whether the n-th was made, also when the counting is over.
     static bool met();
