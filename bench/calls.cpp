@@ -31,7 +31,7 @@ using bench::Pair;
 constexpr std::size_t largeBytes = std::size_t{256} << 20U;
 constexpr std::size_t largeElements = largeBytes / sizeof(double);
 constexpr std::array<std::size_t, 3> hostDims = {1024, 512, largeElements / 1024 / 512};
-constexpr std::array<std::size_t, 3> first = {0, 0, 0}; // the place of an element
+constexpr std::array<std::size_t, 3> place = {1, 0, 0}; // of an element
 constexpr const char *dimension = "time";
 constexpr const char *variable = "large";
 constexpr const char *attribute = "units";
@@ -196,17 +196,17 @@ void addGuarded(std::vector<Pair> &pairs, const Module &netcdf, const Module &gu
             "get_var1_double",
             [ncid, varid = data.varid] {
                 double value = 0;
-                check(nc_get_var1_double(ncid, varid, first.data(), &value));
+                check(nc_get_var1_double(ncid, varid, place.data(), &value));
                 benchmark::DoNotOptimize(value);
             },
-            Array::scalar(data.varid), Array::row({0, 0, 0}));
+            Array::scalar(data.varid), Array::row({0, 0, 1}));
         add(
             "put_var1_double",
             [ncid, varid = data.varid] {
                 const double value = 0;
-                check(nc_put_var1_double(ncid, varid, first.data(), &value));
+                check(nc_put_var1_double(ncid, varid, place.data(), &value));
             },
-            Array::scalar(data.varid), Array::row({0, 0, 0}), Array::scalar(0));
+            Array::scalar(data.varid), Array::row({0, 0, 1}), Array::scalar(0));
     }
 }
 

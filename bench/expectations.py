@@ -77,8 +77,8 @@ TWICE = ("the library looks the attribute up by its name once for its type and l
          "its values; see [One element](#one-element)")
 STRIDED = MORE_FUNCTIONS + "; the library's strided functions take longer after other code"
 NAMED = "the guard looks at the name of the operation, too; see [With the guard](#with-the-guard)"
-WATCHED = ("the guard finds the dataset, and reads the position of the write, before the module "
-           "does so itself; see [With the guard](#with-the-guard)")
+WATCHED = ("the guard finds the dataset, and whether the variable has records, in what it knows, "
+           "before the module sees the call; see [With the guard](#with-the-guard)")
 ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters are "
          "zeros before they are anything else; see [Blocks of text](#blocks-of-text)")
 UNCOPIED = ("nothing is copied or added on this way, and the same row lies on either side of one "
@@ -97,7 +97,7 @@ REASONS = {
     "put_vars, one element": Reason(STRIDED, 280e-9),
     "get_att, one element": Reason(TWICE, 420e-9),
     "get_var1_double, guarded": Reason(NAMED, 160e-9),
-    "put_var1_double, guarded": Reason(WATCHED, 280e-9),
+    "put_var1_double, guarded": Reason(WATCHED, 200e-9),
     **{f"Python: {each}, anywhere in the file, {form}": Reason(FILLED, 1 / 8)
        for each in ("one element", "ten elements") for form in ("call", "method")},
     **{f"Python: whole {each}": Reason(NOISE, 1.03) for each in ("read", "write, to a new file")},

@@ -300,6 +300,18 @@ std::uint64_t endOf(const Write &write) {
     return end;
 }
 
+/// Whether it is known that no write of the variable fills records.
+bool fillsNoRecords(const Dataset *dataset, int varid) {
+    if (dataset == nullptr) {
+        return false;
+    }
+    if (!dataset->classic || !dataset->filling || dataset->defining) {
+        return true;
+    }
+    const auto known = dataset->hasRecords.find(varid);
+    return known != dataset->hasRecords.end() && !known->second;
+}
+
 /// Looks at a write of a variable that may have records. What it learns of the dataset it notes
 /// there; the end of the write, if it moves the end of the records, is what it gives back.
 std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *dataset,
@@ -310,15 +322,8 @@ std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *da
         const std::uint64_t added = end - std::min(end, number);
         return added - std::min(added, write.count[0]);
     };
-    if (dataset != nullptr) {
-        if (!dataset->classic || !dataset->filling || dataset->defining) {
-            return 0;
-        }
-        const auto known = dataset->hasRecords.find(varid);
-        const bool fixed = known != dataset->hasRecords.end() && !known->second;
-        if (fixed || filled(dataset->records) == 0) {
-            return known != dataset->hasRecords.end() && known->second ? end : 0;
-        }
+    if (dataset != nullptr && filled(dataset->records) == 0) {
+        return dataset->hasRecords.contains(varid) ? end : 0;
     }
     const std::optional<Records> found = recordsOf(ncid, varid, ask);
     if (dataset != nullptr) {
@@ -430,7 +435,11 @@ class Guard : public Watcher {
             unlessRefused([&] { lookAtLengths(*ncid, inputs[4], ask); });
         } else if (isWrite()) {
             const auto varid = integer(inputs[2]);
-            if (const auto write = writeOf(kind, inputs); write && varid) {
+            const bool fillsNone = varid && fillsNoRecords(dataset, *varid);
+            if (fillsNone && kind == Kind::writeElement) {
+                return; // an element has no counts that could wrap around, either
+            }
+            if (const auto write = writeOf(kind, inputs); write && varid && !fillsNone) {
                 unlessRefused([&] {
                     recordsEnd = lookAtRecords(*write, *ncid, *varid, dataset, ask, options);
                 });
