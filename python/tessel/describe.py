@@ -12,7 +12,7 @@ import numpy as np
 import tessel
 from tessel import wording
 from tessel.axis import Axis
-from tessel.dataset import Attribute, Dataset, Variable
+from tessel.dataset import Attribute, Dataset, Dimension, Variable
 
 _LINE = 100
 _LONGEST_TEXT = 2000
@@ -43,9 +43,14 @@ def _columns(rows: list[tuple[str, ...]], right: Iterable[int] = ()) -> Iterator
 
 
 def _dimensions(dataset: Dataset) -> Iterator[str]:
+    def extent(dimension: Dimension) -> str:
+        """Nothing without coordinates, and as many indices as the dimension is long are not made."""
+        known = dataset.coordinate(dimension) is not None
+        return wording.printable(Axis.of(dataset, dimension).extent()) if known else ""
+
     return _columns([
         (wording.printable(each.name), str(each.length), "unlimited" if each.unlimited else "",
-         wording.printable(Axis.of(dataset, each).extent()))
+         extent(each))
         for each in dataset.dimensions], right=[1])
 
 

@@ -266,6 +266,14 @@ def test_check(capsys, tmp_path):
     assert run(capsys, "check", other)[1].startswith(f"{other}: nothing to check; ")
 
 
+def test_info_of_more_positions_than_memory_holds(capsys, tmp_path):
+    """Without coordinates, none of them is made."""
+    path = generate(tmp_path / "f.nc", "dimensions: x = 100000000000 ;", "cdf5")
+    status, output, errors = run(capsys, "info", path)
+    assert (status, errors) == (0, "")
+    assert "Dimensions\n  x  100000000000\n" in output
+
+
 # ops
 
 def test_ops(capsys):
