@@ -7,9 +7,9 @@ import re
 from collections.abc import Callable
 from dataclasses import dataclass
 
-from tessel.kinds import (ATTRIBUTE, COUNT, INDEX, NCID, NO_VARIABLE,
-                          NOT_OPEN, OWNER, START, STRIDE, TEXT_OF_ATTRIBUTE, TEXT_OF_VARIABLE, VARID, XTYPE,
-                          data_kind, data_result)
+from tessel.kinds import (ATTRIBUTE, COUNT, INDEX, NCID, NO_VARIABLE, NOT_OPEN, OWNER, START,
+                          STRIDE, TEXT_OF_ATTRIBUTE, TEXT_OF_VARIABLE, VARID, XTYPE, data_kind,
+                          data_result)
 from tessel.operation import Argument, Errors, Operation, Result
 
 
@@ -112,7 +112,8 @@ def _write(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, 
         found = errors
         kind = TEXT_OF_VARIABLE if of.is_text else data_kind(of.dtype, of.host_class)
         if of.is_text and name == "put_att":  # the one member with a frame of its own
-            kind, mine, given = TEXT_OF_ATTRIBUTE, "putAttText", tuple(each for each in arguments if each is not XTYPE)
+            kind, mine = TEXT_OF_ATTRIBUTE, "putAttText"
+            given = tuple(each for each in arguments if each is not XTYPE)
             found = tuple((identifier.replace(":putAtt:", ":putAttText:"), cause)
                           for identifier, cause in errors)
         empty = () if may_be_empty else (("TESSEL:netcdf:emptyVariableData", "data is empty"),)
