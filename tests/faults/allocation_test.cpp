@@ -3,6 +3,7 @@
 //
 // The operators are those of failing_new.cpp, and count and fail within calls only. (That the
 // host's blocks and arrays fail in turn is part of the conformance tests themselves.)
+#include "support/at_rest.hpp"
 #include "support/conformance.hpp"
 #include "support/failing_new.hpp"
 #include "support/operations.hpp"
@@ -110,22 +111,34 @@ std::string operationOf(const Row &row) {
     return name.starts_with("nc_") ? name.substr(3) : name;
 }
 
+/// Runs a row with the n-th allocation failing; false if there is none.
+bool failOne(const Module &module, const Row &row, Watched watched, std::size_t n,
+             const Seen &undisturbed) {
+    const Seen seen = run(module, row, n);
+    if (!seen.failed) {
+        EXPECT_EQ(seen.outcome, undisturbed.outcome);
+        return false;
+    }
+    EXPECT_EQ(seen.outcome, "TESSEL:host:outOfMemory");
+    EXPECT_TRUE(seen.changes.empty() || seen.changes == undisturbed.changes) << seen.changes;
+    if (watched == Watched::byNobody) { // the guard keeps what it knows of datasets
+        EXPECT_EQ(seen.left, 0) << "allocations are left behind";
+    }
+    return true;
+}
+
 void failEach(const Module &module, const Row &row, Watched watched) {
     run(module, row, 0); // what is made once for all calls is there from now on
     const Seen undisturbed = run(module, row, 0);
-    for (std::size_t n = 1;; ++n) {
-        SCOPED_TRACE("allocation " + shown(n) + " fails");
-        const Seen seen = run(module, row, n);
-        if (!seen.failed) {
-            EXPECT_EQ(seen.outcome, undisturbed.outcome);
-            return;
-        }
+    const long alive = aliveAtRest(module);
+    std::size_t failures = 0;
+    for (bool failed = true; failed; failures += failed ? 1U : 0U) {
+        SCOPED_TRACE("allocation " + shown(failures + 1) + " fails");
+        failed = failOne(module, row, watched, failures + 1, undisturbed);
+    }
+    EXPECT_EQ(aliveAtRest(module) - alive, 0) << "allocations are left when all is closed";
+    if (failures > 0) {
         operationsSeen().insert(operationOf(row));
-        EXPECT_EQ(seen.outcome, "TESSEL:host:outOfMemory");
-        EXPECT_TRUE(seen.changes.empty() || seen.changes == undisturbed.changes) << seen.changes;
-        if (watched == Watched::byNobody) { // the guard keeps what it knows of datasets
-            EXPECT_EQ(seen.left, 0) << "allocations are left behind";
-        }
     }
 }
 

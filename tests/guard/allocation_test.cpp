@@ -4,6 +4,7 @@
 // guard asks the module. Whatever fails, nothing gets through to the library that it does not
 // survive, and no memory is left.
 #include "fatal_calls.hpp"
+#include "support/at_rest.hpp"
 #include "support/failing_new.hpp"
 
 namespace tessel::test {
@@ -29,15 +30,6 @@ class Counted : public Watcher {
   private:
     std::shared_ptr<Watcher> guard = netcdfGuard();
 };
-
-/// Ends what a row leaves open. What is then there of allocations, behind a call that works.
-long aliveAtRest(const Module &netcdf) {
-    for (int number = 1; number < 64; ++number) {
-        identifierOf([&] { netcdf("abort", number << 16); });
-    }
-    EXPECT_GT(netcdf("inq_libvers")[0].size(), 0U);
-    return allocationsAlive();
-}
 
 /// In the checked mode each array is an allocation of its own, and what a call leaves is an error.
 class Checked : public testing::Environment {
