@@ -209,8 +209,8 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         }
     }
     Statistics statistics;
-    if (!pipes
-             .empty()) { // memory that is used for the first time is in no profile, as in no median
+    // Memory that is used for the first time is in no profile, as it is in no median.
+    if (!pipes.empty()) {
         benchmark::RunSpecifiedBenchmarks();
     }
     {

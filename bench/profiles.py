@@ -1,5 +1,5 @@
 # bench/profiles.py: where the time of a row goes that misses what is expected of it.
-"""Profiles by perf (Debian's linux-perf), one for each row that was missed.
+"""Profiles by perf (Debian's linux-perf) of each row that was missed, and of its direct call.
 
 A measuring program is started under perf with `--perf FOLDER`, and tells it by the pipes that are
 there (`telling_perf` in measuring.py, `Perf` in pairs.cpp) when the work begins and ends: what it

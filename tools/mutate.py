@@ -8,8 +8,8 @@ argument or statement changed, but for what only the compiler runs. It is built,
 the conformance suite are run until something fails, which kills the mutant. What does not compile
 is no mutant and not counted. The list is repeatable by its seed; survivors are printed with their
 change. `--write` puts the result into a document, between the marks
-"<!-- tools/mutate.py: begin -->" and "<!-- tools/mutate.py: end -->". With `--list` it writes nothing, and fails when the document names
-other changes that are never made than are left out here.
+"<!-- tools/mutate.py: begin -->" and "<!-- tools/mutate.py: end -->". With `--list` it writes
+nothing, and fails when the document names other changes that are never made than are left out here.
 """
 
 import argparse
