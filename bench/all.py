@@ -49,10 +49,10 @@ class Program(NamedTuple):
     def command(self, built: Path, folder: Path, quick: bool) -> list[str]:
         """How it is run, from the project's folder."""
         numbers = self.numbers(folder)
-        start = [sys.executable, "-B", str(PROJECT / "bench" / self.name), f"--json={numbers}"] \
-            if self.in_python else \
-            [str(built / self.name), f"--benchmark_out={numbers}", "--benchmark_out_format=json"]
-        return [*start, *(["--quick"] if quick else ["--write", str(DOCS / self.document)])]
+        start = [sys.executable, "-B", str(PROJECT / "bench" / self.name)] if self.in_python else \
+            [str(built / self.name)]
+        return [*start, "--json", str(numbers),
+                *(["--quick"] if quick else ["--write", str(DOCS / self.document)])]
 
 
 PROGRAMS = [

@@ -12,6 +12,7 @@
 #include <sstream>
 #include <stdexcept>
 #include <string_view>
+#include <utility>
 
 namespace tessel::bench {
 namespace {
@@ -74,8 +75,31 @@ class Statistics : public benchmark::ConsoleReporter {
     std::map<std::string, double> seconds;
 };
 
-/// Registers a side of a pair. Google Benchmark writes all repetitions into its file, for whoever
-/// wants more than the table has.
+/// All repetitions of all groups in one file, for whoever wants more than the table has: by itself
+/// Google Benchmark begins its file anew with each group.
+class File : public benchmark::JSONReporter {
+  public:
+    explicit File(const std::string &name) : out(name) {}
+    ~File() override {
+        if (begun) {
+            JSONReporter::Finalize();
+        }
+    }
+    File(const File &) = delete;
+    File &operator=(const File &) = delete;
+
+    bool ReportContext(const Context &context) override {
+        SetOutputStream(&out);
+        return std::exchange(begun, true) || JSONReporter::ReportContext(context);
+    }
+    void Finalize() override {}
+
+  private:
+    std::ofstream out;
+    bool begun = false;
+};
+
+/// Registers a side of a pair.
 void add(const std::string &name, const std::function<void()> &work, const Pair &pair, bool quick) {
     auto *const registered =
         benchmark::RegisterBenchmark(name.c_str(), [&work, &pair](benchmark::State &state) {
@@ -92,6 +116,14 @@ void add(const std::string &name, const std::function<void()> &work, const Pair 
         registered->Iterations(1)->Unit(benchmark::kMillisecond);
     } else {
         registered->MinTime(quick ? shortestTime / 10 : shortestTime);
+    }
+}
+
+void addSides(const Pair &pair, bool quick) {
+    add(pair.name + "/reference", pair.reference, pair, quick);
+    add(pair.name + "/module", pair.module, pair, quick);
+    if (pair.steps) {
+        add(pair.name + "/steps", pair.steps, pair, quick);
     }
 }
 
@@ -184,6 +216,7 @@ bool isQuick(int argc, char **argv) {
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs) {
     std::vector<char *> arguments(argv, argv + argc);
     const std::string document = taken(arguments, "--write");
+    const std::string json = taken(arguments, "--json");
     const std::string pipes = taken(arguments, "--perf");
     const bool quick = isQuick(argc, argv);
     std::erase(arguments, std::string_view("--quick"));
@@ -195,27 +228,30 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
         return 1;
     }
     std::string interleaving = "--benchmark_enable_random_interleaving=true";
-    arguments.insert(arguments.begin() + 1, interleaving.data()); // the user's own come later
+    std::string nowhere = "--benchmark_out=/dev/null"; // or else no reporter of ours may be used
+    arguments.insert(arguments.begin() + 1, {interleaving.data(), nowhere.data()});
     int count = static_cast<int>(arguments.size());
     benchmark::Initialize(&count, arguments.data());
     if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) {
         return 1;
     }
-    for (const Pair &pair : pairs) {
-        add(pair.name + "/reference", pair.reference, pair, quick);
-        add(pair.name + "/module", pair.module, pair, quick);
-        if (pair.steps) {
-            add(pair.name + "/steps", pair.steps, pair, quick);
-        }
-    }
     Statistics statistics;
-    // Memory that is used for the first time is in no profile, as it is in no median.
-    if (!pipes.empty()) {
-        benchmark::RunSpecifiedBenchmarks();
-    }
     {
-        const Perf perf(pipes);
-        benchmark::RunSpecifiedBenchmarks(&statistics);
+        File file(json);
+        for (auto first = pairs.begin(); first != pairs.end();) {
+            const auto end = std::find_if(first, pairs.end(), [=](const Pair &pair) {
+                return !part && pair.group != first->group;
+            });
+            std::for_each(first, end, [=](const Pair &pair) { addSides(pair, quick); });
+            // Memory that is used for the first time is in no profile, as it is in no median.
+            if (!pipes.empty()) {
+                benchmark::RunSpecifiedBenchmarks();
+            }
+            const Perf perf(pipes);
+            benchmark::RunSpecifiedBenchmarks(&statistics, &file);
+            benchmark::ClearRegisteredBenchmarks();
+            first = end;
+        }
     }
     benchmark::Shutdown();
     const std::string text = table(pairs, statistics);

@@ -32,15 +32,20 @@ struct Pair {
     int repetitions = usualRepetitions; ///< fewer, where each takes long
 
     std::function<void()> before = nullptr; ///< comes before each repetition, unmeasured
+
+    /// Pairs of one group, which are neighbours, take turns with each other only: together they
+    /// must not be so much memory that what one uses is gone from the caches whenever it comes.
+    std::string group = {};
 };
 
-/// Measures the pairs, their repetitions in random order, and prints a table in Markdown of how
-/// they compare. The median is what one run usually sees; the shortest repetition is what a machine
-/// that does other work besides disturbs least; it is also compared with the second references,
-/// where there are any. `--write FILE` puts the table into a document as well, between the marks
+/// Measures the pairs, group by group, their repetitions in random order, and prints a table in
+/// Markdown of how they compare. The median is what one run usually sees; the shortest repetition
+/// is what a machine that does other work besides disturbs least; it is also compared with the
+/// second references, where there are any. `--write FILE` puts the table into a document as well,
+/// between the marks
 /// "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; `--quick` does everything twice only, to show
-/// that it works; `--perf FOLDER` is for profiles.py; the rest of the command line goes to Google
-/// Benchmark, which keeps all repetitions in the file that `--benchmark_out` names. Gives back
+/// that it works; `--json FILE` keeps all repetitions, in the form of Google Benchmark; `--perf
+/// FOLDER` is for profiles.py; the rest of the command line goes to Google Benchmark. Gives back
 /// main's status.
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
 
