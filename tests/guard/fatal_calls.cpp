@@ -148,12 +148,14 @@ const Fatal rows[] = {
     {"ALengthThatMultipliesToZero", SIGFPE, "TESSEL:guard:lengths", R"("b" is 2^63 or longer)",
      [](const Module &netcdf, const Folder &folder) {
          definingVariable(netcdf, folder, ncChar, {2, 0x1p63, 2}, data64);
-     }},
+     },
+     41001},
     {"ALengthThatMultipliesToZeroWhenDefinitionsEnd", SIGFPE, "TESSEL:guard:lengths",
      "take the length for a negative number",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {0, 0x1p63, 2}, data64));
-     }},
+     },
+     41001},
     {"OpenOfALengthThatMultipliesToZero", SIGFPE, "TESSEL:guard:header",
      "has a variable over a dimension of 9223372036854775808 elements",
      [](const Module &netcdf, const Folder &folder) {
@@ -165,7 +167,8 @@ const Fatal rows[] = {
          open(netcdf, folder,
               "CDF\5" + words({0, 0}) + words({10, 0, 2}) + dimensions + words({0, 0, 0}) +
                   words({11, 0, 1}) + variable + std::string(16, '\0'));
-     }},
+     },
+     41001},
     {"RedefiningASharedHeaderThatWasOverwritten", SIGFPE, "TESSEL:guard:header",
      "has a variable of the type 12",
      [](const Module &netcdf, const Folder &folder) {

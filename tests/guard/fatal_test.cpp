@@ -49,18 +49,19 @@ TEST(NotFenced, MappedMemoryThatCannotGrow) {
     }
 }
 
+/// Which signal it is depends on what the freed memory holds by then.
 TEST(NotFenced, Hdf5FileOnAFullDisk) {
     for (const Module &netcdf : {plainModule(), guardedModule()}) {
-        EXPECT_EQ(endOf([&](const Folder &folder) {
-                      const int ncid = intOf(netcdf("create", folder.file("a.nc"), 4096));
-                      const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
-                      netcdf("def_var", ncid, "v", ncDouble, x);
-                      netcdf("enddef", ncid);
-                      const FullDisk full;
-                      identifierOf([&] { netcdf("put_var1_double", ncid, 0, 19999, 1); });
-                      netcdf("abort", ncid);
-                  }),
-                  strsignal(SIGSEGV));
+        const std::string end = endOf([&](const Folder &folder) {
+            const int ncid = intOf(netcdf("create", folder.file("a.nc"), 4096));
+            const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
+            netcdf("def_var", ncid, "v", ncDouble, x);
+            netcdf("enddef", ncid);
+            const FullDisk full;
+            identifierOf([&] { netcdf("put_var1_double", ncid, 0, 19999, 1); });
+            netcdf("abort", ncid);
+        });
+        EXPECT_TRUE(end == strsignal(SIGSEGV) || end == strsignal(SIGABRT)) << end;
     }
 }
 
