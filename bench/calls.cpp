@@ -27,6 +27,7 @@ using namespace tessel;
 using bench::called;
 using bench::check;
 using bench::Pair;
+using bench::Work;
 
 constexpr std::size_t largeBytes = std::size_t{256} << 20U;
 constexpr std::size_t largeElements = largeBytes / sizeof(double);
@@ -110,6 +111,8 @@ void readPlainly(const Dataset &data) {
 /// The other inquiries, inputs at hand. Each result is a host array of its own, and "inq" and
 /// "inq_var" have four.
 void addInquiries(std::vector<Pair> &pairs, const Module &netcdf, const Dataset &data) {
+    pairs.push_back({"inq_libvers", [] { benchmark::DoNotOptimize(nc_inq_libvers()); },
+                     called(netcdf, Array::text("inq_libvers"))});
     pairs.push_back({"inq",
                      [&data] {
                          std::array<int, 4> all{};
@@ -246,9 +249,13 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Module &guarded, const Dat
     addInquiries(pairs, netcdf, data);
     addAttributeInquiries(pairs, netcdf, data);
     addGuarded(pairs, netcdf, guarded, data);
-    pairs.push_back({"get_var_double of 256 MiB", readDirect, read, true});
-    pairs.push_back({"get_var_double of 256 MiB, beside pread with byte swap",
-                     [&data] { readPlainly(data); }, read, true});
+    for (const auto &[what, reference] :
+         {std::pair<const char *, Work>("get_var_double of 256 MiB", readDirect),
+          std::pair<const char *, Work>("get_var_double of 256 MiB, beside pread with byte swap",
+                                        [&data] { readPlainly(data); })}) {
+        pairs.push_back({what, reference, read, true});
+        pairs.back().group = "blocks";
+    }
     return pairs;
 }
 

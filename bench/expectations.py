@@ -13,7 +13,7 @@ TYPES = (*NUMBERS, "text")
 FAMILIES = ("get_var", "get_var1", "get_vara", "get_vars", "get_att",
             "put_var", "put_var1", "put_vara", "put_vars", "put_att")
 BLOCKS = tuple(each for each in FAMILIES if not each.endswith("var1"))
-INQUIRIES = ("inq", "inq_dim", "inq_dimid, inputs at hand", "inq_varid", "inq_var", "inq_att",
+INQUIRIES = ("inq_libvers", "inq", "inq_dim", "inq_dimid, inputs at hand", "inq_varid", "inq_var", "inq_att",
              "inq_attid", "inq_attname")
 
 
@@ -141,8 +141,9 @@ ROWS = (
     from_python("one element, one after the other, method", one_of(20)),
     from_python("ten elements, one after the other, call", one_of(30)),
     from_python("ten elements, one after the other, method", one_of(20)),
-    *(from_python(f"{each}, anywhere in the file, {form}", one_of(20))
-      for each in ("one element", "ten elements") for form in ("call", "method")),
+    *(from_python(f"{each}, anywhere in the file, {form}", one_of(most))
+      for each in ("one element", "ten elements")
+      for form, most in (("call", 30), ("method", 20))),
     from_python("whole read", times(1)),
     from_python("whole write, to a new file", times(1)),
 )

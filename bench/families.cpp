@@ -21,6 +21,7 @@ namespace {
 using namespace tessel;
 using bench::check;
 using bench::Pair;
+using bench::Work;
 
 constexpr std::size_t columns = 1024;
 constexpr std::ptrdiff_t step = 2; // of the strided blocks, along the fastest dimension
@@ -175,11 +176,11 @@ class Type {
 
     /// A call of the module with arguments that are made once, as a program's loop would have them.
     template <class... Arguments>
-    std::function<void()> call(const char *family, const Arguments &...arguments) const {
+    Work call(const char *family, const Arguments &...arguments) const {
         return callOf(operation(family), arguments...);
     }
     template <class... Arguments>
-    std::function<void()> callOf(const std::string &name, const Arguments &...arguments) const {
+    Work callOf(const std::string &name, const Arguments &...arguments) const {
         auto held = std::make_shared<std::vector<Array>>();
         held->push_back(Array::text(name));
         (held->push_back(made(arguments)), ...);
@@ -206,7 +207,7 @@ class Type {
 
     /// New memory of the kind that results have, for the library to fill.
     template <class Fill>
-    std::function<void()> intoNew(const Fill &fill) const {
+    Work intoNew(const Fill &fill) const {
         return [fill, this] {
             const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{blockBytes, 1});
             check(fill(static_cast<T *>(memory.data())));
@@ -218,7 +219,7 @@ class Type {
         const std::string name = named("one");
         // What the operation asks the library first is its second reference's.
         const auto add = [&](const char *family, const auto &asks, const auto &reference,
-                             std::function<void()> module) {
+                             Work module) {
             pairs.push_back({operation(family) + "/one", reference, std::move(module), false,
                              [asks, reference] {
                                  asks();
@@ -313,7 +314,7 @@ class Type {
     /// A read of text with all that it takes: a zero-filled buffer of so many bytes a character for
     /// the library, and a zero-filled result of the host's characters.
     template <class Fill>
-    std::function<void()> widening(std::size_t unit, const Fill &fill) const {
+    Work widening(std::size_t unit, const Fill &fill) const {
         return [unit, fill, this] {
             const Array result = Array::characters(count);
             const Array buffer = Array::logical(std::array{elements + 1, unit});
@@ -326,7 +327,7 @@ class Type {
 
     /// A write of text likewise: a zero-filled buffer, and the characters made bytes.
     template <class Write>
-    std::function<void()> narrowing(const Write &write) const {
+    Work narrowing(const Write &write) const {
         return [this, write] {
             const Array buffer = Array::logical(std::array{elements, std::size_t{1}});
             auto *const bytes = static_cast<char *>(buffer.data());
@@ -345,8 +346,8 @@ class Type {
 
     /// A block, which takes turns with those of its type: of all types together, each would find
     /// nothing of its own in the caches.
-    void addBlock(std::vector<Pair> &pairs, const char *family, std::function<void()> reference,
-                  std::function<void()> module, std::function<void()> steps) const {
+    void addBlock(std::vector<Pair> &pairs, const char *family, Work reference, Work module,
+                  Work steps) const {
         pairs.push_back({operation(family) + "/64MiB", std::move(reference), std::move(module),
                          true, std::move(steps), repetitionsOf(family), nullptr, library.suffix});
     }
@@ -355,8 +356,8 @@ class Type {
     /// a character.
     template <class Fill>
     void addRead(std::vector<Pair> &pairs, const char *family, std::size_t unit, const Fill &fill,
-                 std::function<void()> module) const {
-        std::function<void()> steps;
+                 Work module) const {
+        Work steps;
         if constexpr (std::is_same_v<T, char>) {
             steps = widening(unit, fill);
         }
@@ -366,8 +367,8 @@ class Type {
     /// A block written by `write`.
     template <class Write>
     void addWrite(std::vector<Pair> &pairs, const char *family, const Write &write,
-                  std::function<void()> module) const {
-        std::function<void()> steps;
+                  Work module) const {
+        Work steps;
         if constexpr (std::is_same_v<T, char>) {
             steps = narrowing(write);
         }
@@ -420,7 +421,7 @@ class Type {
             putAtt(name, hostBlock));
     }
 
-    std::function<void()> putAtt(const std::string &name, const Array &from) const {
+    Work putAtt(const std::string &name, const Array &from) const {
         if constexpr (std::is_same_v<T, char>) {
             return call("put_att", datasets.attributes, NC_GLOBAL, name, from);
         } else {

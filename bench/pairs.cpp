@@ -5,10 +5,14 @@
 
 #include <algorithm>
 #include <array>
+#include <chrono>
+#include <cmath>
+#include <cstdint>
 #include <cstdio>
 #include <cstdlib>
 #include <fstream>
 #include <map>
+#include <regex>
 #include <sstream>
 #include <stdexcept>
 #include <string_view>
@@ -99,32 +103,64 @@ class File : public benchmark::JSONReporter {
     bool begun = false;
 };
 
-/// Registers a side of a pair.
-void add(const std::string &name, const std::function<void()> &work, const Pair &pair, bool quick) {
-    auto *const registered =
-        benchmark::RegisterBenchmark(name.c_str(), [&work, &pair](benchmark::State &state) {
-            if (pair.before) {
-                pair.before();
-            }
-            for ([[maybe_unused]] auto _ : state) {
-                work();
-            }
-        });
-    registered->Repetitions(quick ? 2 : pair.repetitions)->DisplayAggregatesOnly()->UseRealTime();
-    registered->ComputeStatistics("shortest", shortest);
-    if (pair.block) {
-        registered->Iterations(1)->Unit(benchmark::kMillisecond);
-    } else {
-        registered->MinTime(quick ? shortestTime / 10 : shortestTime);
+/// How often each side does its work in a repetition: equally often, so that what is done for the
+/// first time, or once in a while, weighs as much for both; and so often that a repetition is long
+/// enough to be measured. Both sides have been used before anything counts.
+std::int64_t iterationsOf(const Pair &pair, bool quick) {
+    if (pair.before) {
+        pair.before();
     }
+    const auto seconds = [&pair](std::int64_t times) {
+        const auto start = std::chrono::steady_clock::now();
+        for (std::int64_t i = 0; i < times; ++i) {
+            pair.reference();
+            pair.module();
+        }
+        return std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+    };
+    seconds(1);
+    std::int64_t times = 1;
+    for (const double enough = 2 * shortestTime / (quick ? 10 : 1); !pair.block;) {
+        const double taken = seconds(times);
+        if (taken >= enough) {
+            break;
+        }
+        const double more = std::min(1.1 * enough / taken, 10.0);
+        times = static_cast<std::int64_t>(std::ceil(static_cast<double>(times) * more));
+    }
+    return times;
 }
 
-void addSides(const Pair &pair, bool quick) {
-    add(pair.name + "/reference", pair.reference, pair, quick);
-    add(pair.name + "/module", pair.module, pair, quick);
-    if (pair.steps) {
-        add(pair.name + "/steps", pair.steps, pair, quick);
+/// Registers the sides of a pair that the command line wants; says whether there are any.
+bool addSides(const Pair &pair, const std::regex &wanted, bool quick) {
+    std::vector<std::pair<std::string, const Work *>> sides;
+    for (const auto &[side, work] :
+         {std::pair("reference", &pair.reference), std::pair("module", &pair.module),
+          std::pair("steps", &pair.steps)}) {
+        const std::string name = pair.name + "/" + side;
+        if (*work && std::regex_search(name + "/", wanted)) {
+            sides.emplace_back(name, work);
+        }
     }
+    const std::int64_t iterations = sides.empty() ? 0 : iterationsOf(pair, quick);
+    for (const auto &[name, work] : sides) {
+        auto *const registered = benchmark::RegisterBenchmark(
+            name.c_str(), [work = work, &pair](benchmark::State &state) {
+                if (pair.before) {
+                    pair.before();
+                }
+                for ([[maybe_unused]] auto _ : state) {
+                    (*work)();
+                }
+            });
+        registered->Iterations(iterations)->Repetitions(quick ? 2 : pair.repetitions);
+        registered->DisplayAggregatesOnly()->UseRealTime();
+        registered->ComputeStatistics("shortest", shortest);
+        if (pair.block) {
+            registered->Unit(benchmark::kMillisecond);
+        }
+    }
+    return !sides.empty();
 }
 
 std::string table(const std::vector<Pair> &pairs, const Statistics &statistics) {
@@ -220,13 +256,6 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
     const std::string pipes = taken(arguments, "--perf");
     const bool quick = isQuick(argc, argv);
     std::erase(arguments, std::string_view("--quick"));
-    const bool part = std::any_of(argv, argv + argc, [](std::string_view argument) {
-        return argument.starts_with("--benchmark_filter");
-    });
-    if ((quick || part) && !document.empty()) {
-        std::fprintf(stderr, "A document has all rows, and none that is no measurement.\n");
-        return 1;
-    }
     std::string interleaving = "--benchmark_enable_random_interleaving=true";
     std::string nowhere = "--benchmark_out=/dev/null"; // or else no reporter of ours may be used
     arguments.insert(arguments.begin() + 1, {interleaving.data(), nowhere.data()});
@@ -235,21 +264,25 @@ int measure(int argc, char **argv, const std::string &title, const std::vector<P
     if (benchmark::ReportUnrecognizedArguments(count, arguments.data())) {
         return 1;
     }
+    const std::string filter = benchmark::GetBenchmarkFilter();
+    if ((quick || !filter.empty()) && !document.empty()) {
+        std::fprintf(stderr, "A document has all rows, and none that is no measurement.\n");
+        return 1;
+    }
+    const std::regex wanted(filter);
     Statistics statistics;
     {
         File file(json);
         for (auto first = pairs.begin(); first != pairs.end();) {
-            const auto end = std::find_if(first, pairs.end(), [=](const Pair &pair) {
-                return !part && pair.group != first->group;
-            });
-            std::for_each(first, end, [=](const Pair &pair) { addSides(pair, quick); });
-            // Memory that is used for the first time is in no profile, as it is in no median.
-            if (!pipes.empty()) {
-                benchmark::RunSpecifiedBenchmarks();
+            const auto end = std::find_if(
+                first, pairs.end(), [=](const Pair &pair) { return pair.group != first->group; });
+            const auto any = std::count_if(
+                first, end, [&](const Pair &pair) { return addSides(pair, wanted, quick); });
+            if (any > 0) {
+                const Perf perf(pipes);
+                benchmark::RunSpecifiedBenchmarks(&statistics, &file);
+                benchmark::ClearRegisteredBenchmarks();
             }
-            const Perf perf(pipes);
-            benchmark::RunSpecifiedBenchmarks(&statistics, &file);
-            benchmark::ClearRegisteredBenchmarks();
             first = end;
         }
     }

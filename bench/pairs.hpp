@@ -18,20 +18,22 @@ namespace tessel::bench {
 
 constexpr int usualRepetitions = 25;
 
+using Work = std::function<void()>;
+
 /// Something done through the module, and the reference that does the same by the library alone.
 struct Pair {
     std::string name;
-    std::function<void()> reference;
-    std::function<void()> module;
+    Work reference;
+    Work module;
     bool block = false; ///< takes long enough that one iteration is a measurement
 
     /// A second reference, where the operation is more than its one function: all library calls
     /// that it has to make, and all memory that it has to fill, without the module.
-    std::function<void()> steps = nullptr;
+    Work steps = nullptr;
 
     int repetitions = usualRepetitions; ///< fewer, where each takes long
 
-    std::function<void()> before = nullptr; ///< comes before each repetition, unmeasured
+    Work before = nullptr; ///< comes before each repetition, unmeasured
 
     /// Pairs of one group, which are neighbours, take turns with each other only: together they
     /// must not be so much memory that what one uses is gone from the caches whenever it comes.
@@ -54,7 +56,7 @@ bool isQuick(int argc, char **argv);
 
 /// A call with inputs that are made once, as a program's loop would have them.
 template <class... Inputs>
-std::function<void()> called(const Module &module, Inputs... made) {
+Work called(const Module &module, Inputs... made) {
     auto held =
         std::make_shared<std::array<Array, sizeof...(Inputs)>>(std::array{std::move(made)...});
     return [&module, held] {

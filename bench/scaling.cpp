@@ -24,8 +24,8 @@ using namespace tessel;
 using bench::called;
 using bench::check;
 using bench::Pair;
+using bench::Work;
 using Numbers = std::vector<std::size_t>;
-using Work = std::function<void()>;
 
 /// From so many elements on, one iteration is a measurement, and with more, few of them have to do.
 constexpr std::size_t blockElements = 100'000'000;
@@ -33,6 +33,7 @@ constexpr int fewRepetitions = 5;
 
 const Numbers sizes = {1,       10,        100,        1'000,       10'000,
                        100'000, 1'000'000, 10'000'000, 100'000'000, 1'000'000'000};
+const Numbers textSizes = {1, 10, 100, 1'000, 10'000, 100'000, 1'000'000, 10'000'000};
 const Numbers attributeSizes = {1, 10, 100, 1'000, 10'000, 100'000, 1'000'000};
 const Numbers dimensionsOfData = {1, 2, 4, 8, 16, 32};
 const Numbers dimensionsDefined = {1, 4, 16, 64, 256, 1'024};
@@ -122,50 +123,64 @@ struct Datasets {
 
 // ---- the size of the data -----------------------------------------------------------------------
 
-void addReads(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted) {
+/// Reads of bytes or of characters, by the library's function for them.
+template <class T>
+void addReads(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted,
+              const char *operation, nc_type type, int (*function)(int, int, T *)) {
     for (const std::size_t size : wanted) {
-        const int varid = data.variable(numbered("v", size), NC_BYTE,
-                                        {data.dimension(numbered("x", size), size)});
-        const auto library = [&data, varid, size] {
-            const Array memory = Array::numeric(tsINT8, std::array<std::size_t, 2>{size, 1});
-            check(nc_get_var_schar(data.ncid, varid, static_cast<signed char *>(memory.data())));
+        const int varid =
+            data.variable(numbered("v", size), type, {data.dimension(numbered("x", size), size)});
+        const auto library = [&data, varid, size, function] {
+            const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{size, 1});
+            check(function(data.ncid, varid, static_cast<T *>(memory.data())));
         };
-        series.addTransfer("get_var_schar", size, library,
-                           called(netcdf, Array::text("get_var_schar"), Array::scalar(data.ncid),
-                                  Array::scalar(varid)));
-    }
-    data.endDefinition();
-}
-
-void addWrites(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted) {
-    // All of them write from the same memory.
-    const auto values = std::make_shared<std::vector<signed char>>(wanted.back(), 'x');
-    for (const std::size_t size : wanted) {
-        const int varid = data.variable(numbered("v", size), NC_BYTE,
-                                        {data.dimension(numbered("x", size), size)});
         series.addTransfer(
-            "put_var_schar", size,
-            [&data, varid, values] { check(nc_put_var_schar(data.ncid, varid, values->data())); },
-            called(netcdf, Array::text("put_var_schar"), Array::scalar(data.ncid),
-                   Array::scalar(varid),
-                   Array::borrowed(tsINT8, std::array<std::size_t, 2>{size, 1}, values->data(),
-                                   values)));
+            operation, size, library,
+            called(netcdf, Array::text(operation), Array::scalar(data.ncid), Array::scalar(varid)));
     }
     data.endDefinition();
 }
 
-void addAttributeReads(Series &series, const Module &netcdf, const Dataset &data) {
+/// Writes, from the memory of the library's type and of the host's.
+template <class T, class Host>
+void addWrites(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted,
+               const char *operation, nc_type type, int (*function)(int, int, const T *),
+               tsClassID hostClass) {
+    const auto values = std::make_shared<std::vector<T>>(wanted.back(), 'x');
+    const auto inHost = std::make_shared<std::vector<Host>>(wanted.back(), 'x');
+    for (const std::size_t size : wanted) {
+        const int varid =
+            data.variable(numbered("v", size), type, {data.dimension(numbered("x", size), size)});
+        series.addTransfer(
+            operation, size,
+            [&data, varid, values, function] { check(function(data.ncid, varid, values->data())); },
+            called(netcdf, Array::text(operation), Array::scalar(data.ncid), Array::scalar(varid),
+                   Array::borrowed(hostClass, std::array<std::size_t, 2>{size, 1}, inHost->data(),
+                                   inHost)));
+    }
+    data.endDefinition();
+}
+
+void addAttributesBySize(Series &series, const Module &netcdf, const Dataset &data) {
     for (const std::size_t size : attributeSizes) {
         const std::string name = numbered("a", size);
         data.attribute(name, size);
-        const auto library = [&data, name, size] {
+        const auto read = [&data, name, size] {
             const Array memory = Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{1, size});
             check(nc_get_att_double(data.ncid, NC_GLOBAL, name.c_str(),
                                     static_cast<double *>(memory.data())));
         };
-        series.add("get_att_double", "elements", size, library,
+        series.add("get_att_double", "elements", size, read,
                    called(netcdf, Array::text("get_att_double"), Array::scalar(data.ncid),
                           Array::scalar(NC_GLOBAL), Array::text(name)));
+        const auto write = [&data, name, values = std::vector<double>(size, 1)] {
+            check(nc_put_att_double(data.ncid, NC_GLOBAL, name.c_str(), NC_DOUBLE, values.size(),
+                                    values.data()));
+        };
+        series.add("put_att_double", "elements", size, write,
+                   called(netcdf, Array::text("put_att_double"), Array::scalar(data.ncid),
+                          Array::scalar(NC_GLOBAL), Array::text(name), Array::scalar(NC_DOUBLE),
+                          row(size, 1)));
     }
 }
 
@@ -177,19 +192,39 @@ void addElements(Series &series, const Module &netcdf, const Dataset &data) {
     for (const std::size_t ndims : dimensionsOfData) {
         const int varid =
             data.variable(numbered("v", ndims), NC_DOUBLE, std::vector<int>(ndims, dimid));
-        const auto library = [&data, varid, ndims](auto *function) {
-            return [&data, varid, function, start = Numbers(ndims, 0), count = Numbers(ndims, 1)] {
+        const Numbers start(ndims, 0);
+        const Numbers count(ndims, 1);
+        const std::vector<std::ptrdiff_t> stride(ndims, 1);
+        const auto element = [&data, varid](const auto &function) {
+            return [&data, varid, function] {
                 double value = 1;
-                check(function(data.ncid, varid, start.data(), count.data(), &value));
+                check(function(data.ncid, varid, &value));
                 benchmark::DoNotOptimize(value);
             };
         };
-        series.add("get_vara_double", "dimensions", ndims, library(nc_get_vara_double),
-                   called(netcdf, Array::text("get_vara_double"), Array::scalar(data.ncid),
-                          Array::scalar(varid), row(ndims, 0), row(ndims, 1)));
-        series.add("put_vara_double", "dimensions", ndims, library(nc_put_vara_double),
-                   called(netcdf, Array::text("put_vara_double"), Array::scalar(data.ncid),
-                          Array::scalar(varid), row(ndims, 0), row(ndims, 1), Array::scalar(1)));
+        const auto block = [&](auto *function) {
+            return element([=](int ncid, int id, double *value) {
+                return function(ncid, id, start.data(), count.data(), value);
+            });
+        };
+        const auto steps = [&](auto *function) {
+            return element([=](int ncid, int id, double *value) {
+                return function(ncid, id, start.data(), count.data(), stride.data(), value);
+            });
+        };
+        const auto add = [&](const char *what, Work library, auto... inputs) {
+            series.add(what, "dimensions", ndims, std::move(library),
+                       called(netcdf, Array::text(what), Array::scalar(data.ncid),
+                              Array::scalar(varid), std::move(inputs)...));
+        };
+        const auto zeros = [=] { return row(ndims, 0); };
+        const auto ones = [=] { return row(ndims, 1); };
+        add("get_var_double", element(nc_get_var_double));
+        add("get_vara_double", block(nc_get_vara_double), zeros(), ones());
+        add("get_vars_double", steps(nc_get_vars_double), zeros(), ones(), ones());
+        add("put_vara_double", block(nc_put_vara_double), zeros(), ones(), Array::scalar(1));
+        add("put_vars_double", steps(nc_put_vars_double), zeros(), ones(), ones(),
+            Array::scalar(1));
     }
     data.endDefinition();
 }
@@ -244,6 +279,25 @@ void addDefinitions(Series &series, const Module &netcdf, const Dataset &data) {
 
 // ---- the number of variables and of attributes --------------------------------------------------
 
+/// Opening and closing a file, of which the guard reads the header before the library does.
+void addOpening(Series &series, const Module &netcdf, const Module &guarded,
+                const std::string &file, const char *counted, std::size_t count) {
+    for (const auto &[what, module] :
+         {std::pair("open, close", &netcdf), std::pair("open, close, guarded", &guarded)}) {
+        series.add(
+            what, counted, count,
+            [file] {
+                int ncid = 0;
+                check(nc_open(file.c_str(), NC_NOWRITE, &ncid));
+                check(nc_close(ncid));
+            },
+            [file, &netcdf = *module] {
+                const Results ncid = netcdf("open", file, "NOWRITE");
+                netcdf("close", ncid[0]);
+            });
+    }
+}
+
 void addVariables(Series &series, const Module &netcdf, const Module &guarded, Datasets &datasets) {
     for (const std::size_t count : variables) {
         series.add("def_var, each once", "variables", count,
@@ -275,6 +329,7 @@ void addVariables(Series &series, const Module &netcdf, const Module &guarded, D
                 benchmark::DoNotOptimize(found);
             },
             called(netcdf, Array::text("inq_varid"), Array::scalar(data.ncid), Array::text(last)));
+        addOpening(series, netcdf, guarded, datasets.folder.file(name.c_str()), "variables", count);
         const auto write = [varid](int ncid) {
             const std::size_t index = 3;
             const double value = 1;
@@ -294,7 +349,8 @@ void addVariables(Series &series, const Module &netcdf, const Module &guarded, D
     }
 }
 
-void addAttributes(Series &series, const Module &netcdf, Datasets &datasets) {
+void addAttributes(Series &series, const Module &netcdf, const Module &guarded,
+                   Datasets &datasets) {
     for (const std::size_t count : attributes) {
         series.add("put_att_double, each once", "attributes", count,
                    byLibrary([count](const Dataset &data) {
@@ -308,10 +364,14 @@ void addAttributes(Series &series, const Module &netcdf, Datasets &datasets) {
                                   1);
                        }
                    }));
-        const Dataset &data = datasets.inMemory();
+        const std::string file = numbered("attributes", count);
+        const Dataset &data = datasets.file(file);
         for (std::size_t i = 0; i < count; ++i) {
             data.attribute(numbered("a", i), 1);
         }
+        data.endDefinition();
+        addOpening(series, netcdf, guarded, datasets.folder.file(file.c_str()), "attributes",
+                   count);
         const std::string last = numbered("a", count - 1);
         series.add(
             "get_att_double", "attributes", count,
@@ -390,13 +450,19 @@ int main(int argc, char **argv) try {
     if (bench::isQuick(argc, argv)) {
         wanted.pop_back();
     }
-    addReads(series, netcdf, datasets.file("read"), wanted);
-    addWrites(series, netcdf, datasets.file("written"), wanted);
-    addAttributeReads(series, netcdf, datasets.inMemory());
+    addReads(series, netcdf, datasets.file("read"), wanted, "get_var_schar", NC_BYTE,
+             nc_get_var_schar);
+    addReads(series, netcdf, datasets.file("text read"), textSizes, "get_var_text", NC_CHAR,
+             nc_get_var_text);
+    addWrites<signed char, signed char>(series, netcdf, datasets.file("written"), wanted,
+                                        "put_var_schar", NC_BYTE, nc_put_var_schar, tsINT8);
+    addWrites<char, tsChar>(series, netcdf, datasets.file("text written"), textSizes,
+                            "put_var_text", NC_CHAR, nc_put_var_text, tsCHAR);
+    addAttributesBySize(series, netcdf, datasets.inMemory());
     addElements(series, netcdf, datasets.file("dimensions"));
     addDefinitions(series, netcdf, datasets.inMemory());
     addVariables(series, netcdf, guarded, datasets);
-    addAttributes(series, netcdf, datasets);
+    addAttributes(series, netcdf, guarded, datasets);
     addOpen(series, netcdf, guarded, others);
     return bench::measure(argc, argv, "bench_scaling", series.pairs);
 } catch (const std::exception &error) {
