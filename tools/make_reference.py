@@ -79,8 +79,8 @@ def entry(term: str, *texts: str) -> str:
 
 def man_errors(errors: Iterable[Raised], end: str = "") -> str:
     """Errors as a list."""
-    return "".join(entry(reference.shown(each.identifier + end), each.cause + ":", each.message)
-                   for each in errors)
+    return "".join(entry(reference.shown(each.identifier + end), f"{each.cause.rstrip('.')}:",
+                         each.message) for each in errors)
 
 
 def man_page(operation: Operation) -> str:
@@ -99,8 +99,7 @@ def man_page(operation: Operation) -> str:
             entry(each.name, one_line(each.meaning),
                   f"In Python: {each.kind.wording}. In the host: {each.kind.host}.")
             for each in entries))
-    if page.raised:
-        parts.append(".SH ERRORS\n" + man_errors(page.raised))
+    parts.append(".SH ERRORS\n" + man_errors(page.raised))  # the host may always lack memory
     parts += [f".PP\n{roff(note)}\n" + man_errors(errors, end)
               for _, note, errors, end in page.others]
     parts += [".SH EXAMPLE\n", literal(reference.example_of(operation)),
@@ -211,9 +210,8 @@ def rst_page(operation: Operation) -> str:
             f"{code(each.name)}\n   {rst(one_line(each.meaning))}\n\n"
             f"   | Python: {rst(each.kind.wording)}\n   | host: {rst(each.kind.host)}\n\n"
             for each in entries))
-    if page.raised:
-        parts.append(title("Errors", "-") + rst_errors(
-            page.raised, names=[each.name for each in operation.arguments]))
+    parts.append(title("Errors", "-") + rst_errors(
+        page.raised, names=[each.name for each in operation.arguments]))
     parts += [title(name, "~") + f"{rst(note)}\n\n" + rst_errors(errors, end)
               for name, note, errors, end in page.others]
     parts += [title("Example", "-"), block("pycon", reference.example_of(operation))]
@@ -264,10 +262,22 @@ def who(operations: list[Operation]) -> str:
     return " ".join(map(link, operations))
 
 
+def place_of(identifier: str) -> str:
+    """What links to an identifier in the index of errors say."""
+    return "error-" + re.sub(r"[\W_]+", "-", identifier).strip("-")
+
+
 def advice(identifier: str) -> str:
     """What the word of an identifier means, and what to do."""
     meaning, remedy = MEANINGS[word_of(identifier)]
     return f"{rst(meaning)} What to do: {rst(remedy)}"
+
+
+def meant(identifier: str) -> list[str]:
+    """What the word of an identifier means, with a link to what to do; nothing where the word is
+    appended."""
+    word = word_of(identifier)
+    return [f"{rst(MEANINGS[word][0])} :term:`{word}` says what to do."] if word in MEANINGS else []
 
 
 def rst_index() -> str:
@@ -283,17 +293,18 @@ def rst_index() -> str:
             parts.append(f"   {word}\n      {f'*({also.__name__})* ' if also else ''}{rst(meaning)}"
                          f"\n\n      What to do: {rst(remedy)}\n\n")
     parts.append(title("All identifiers", "-") +
-                 "Each with the operations that raise it; those of the host, of the guard and of "
-                 "the Python package with what they mean, too. Where a ``<word>`` is, a status's "
-                 "word is appended: those of `What the netCDF library refuses`_ and "
-                 "`What the system refuses`_.\n\n")
+                 "Each with the operations that raise it, and with what its last word means; those "
+                 "of the host, of the guard and of the Python package with what to do, too. Where "
+                 "a ``<word>`` is, a status's word is appended: those of `What the netCDF library "
+                 "refuses`_ and `What the system refuses`_.\n\n")
     said = {identifier: [advice(identifier)] for identifier in (*HOST, *GUARD, *PACKAGE)}
     for each in reference.every_call():
-        said.setdefault(each.identifier, []).append("Every call, before its operation is found.")
+        said.setdefault(each.identifier, meant(each.identifier)).append(
+            "Every call, before its operation is found.")
     for identifier, operations in raisers().items():
-        said.setdefault(identifier, []).append(who(operations))
-    parts += [f"{code(identifier)}\n   " + "\n\n   ".join(texts) + "\n\n"
-              for identifier, texts in sorted(said.items())]
+        said.setdefault(identifier, meant(identifier)).append(who(operations))
+    parts += [f".. _{place_of(identifier)}:\n\n{code(identifier)}\n   " + "\n\n   ".join(texts)
+              + "\n\n" for identifier, texts in sorted(said.items())]
     parts.append(title("All words of statuses", "-") + "".join(
         f"* {status}: :term:`{word}`\n" for status, word in sorted(STATUSES.items())))
     return "".join(parts)

@@ -7,9 +7,9 @@ import re
 from collections.abc import Callable
 from dataclasses import dataclass
 
-from tessel.kinds import (ATTRIBUTE, COUNT, INDEX, NCID, NO_VARIABLE, NOT_OPEN, OWNER, START,
-                          STRIDE, TEXT_OF_ATTRIBUTE, TEXT_OF_VARIABLE, VARID, XTYPE, data_kind,
-                          data_result)
+from tessel.kinds import (ATTRIBUTE, BAD_NAME, COUNT, INDEX, NCID, NO_VARIABLE, NOT_OPEN, OWNER,
+                          START, STRIDE, TEXT_OF_ATTRIBUTE, TEXT_OF_VARIABLE, VARID, WRONG_COUNT,
+                          XTYPE, data_kind, data_result)
 from tessel.operation import Argument, Errors, Operation, Result
 
 
@@ -92,7 +92,7 @@ def _read(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, s
             arguments=(NCID, OWNER if name == "get_att" else VARID, *arguments),
             results=(Result("data", data_result(of.dtype, of.host_class, text_row),
                             text_shape if of.is_text else shape),),
-            errors=((f"TESSEL:netcdf:{tag}:badInputParameterCount", "the number of arguments"),
+            errors=((f"TESSEL:netcdf:{tag}:badInputParameterCount", WRONG_COUNT),
                     *errors, *_conversion(tag, of)),
             example=of.filled(lines))
 
@@ -123,7 +123,7 @@ def _write(name: str, tag: str, *arguments: Argument, purpose: str, notes: str, 
             notes=" ".join((notes, *about_text)), results=(),
             arguments=(NCID, OWNER if name == "put_att" else VARID, *given,
                        Argument("data", kind, size)),
-            errors=((f"TESSEL:netcdf:{mine}:badInputParameterCount", "the number of arguments"),
+            errors=((f"TESSEL:netcdf:{mine}:badInputParameterCount", WRONG_COUNT),
                     *empty,
                     (f"TESSEL:netcdf:{short}:badDatatype",
                      f"data is an array of another class than {of.host_class}"),
@@ -219,7 +219,7 @@ FAMILIES: dict[str, Callable[[Member], Operation]] = {
         may_be_empty=True,
         errors=_errors("putAtt", NOT_OPEN, NO_VARIABLE,
                        ("operationNotAllowedInDataMode", "it needs define mode (redef)"),
-                       ("nameContainsIllegalCharacters", "the name is none"), _READ_ONLY),
+                       BAD_NAME, _READ_ONLY),
         example=">>> nc.redef(ncid)\n" + _VARIABLE +
                 '>>> nc.put_att_{type}(ncid, varid, "limits", nc.param("{external}"), {d15})\n'
                 '>>> nc.get_att_{type}(ncid, varid, "limits").tolist()\n[[{v1}, {v5}]]',

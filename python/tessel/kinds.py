@@ -80,7 +80,7 @@ def data_kind(dtype: str, host_class: str) -> Kind:
     return Kind(f"Numbers | NDArray[numpy.{dtype}]", f"array of {dtype}, or numbers exact in it",
                 host_class, f"{{name}} if type({{name}}) is ndarray else "
                 f"numbers({{name}}, dtypes['{dtype}'])",
-                (("TESSEL:python:notExact", f"has a number of Python's that no {dtype} is"),))
+                (("TESSEL:python:notExact", f"has a Python number that {dtype} cannot hold exactly"),))
 
 
 NUMBER = ResultKind("int", "int", "double, 1-by-1", "{value}", count=True)
@@ -119,5 +119,8 @@ COUNT = Argument("count", POSITIONS, """How many elements in each dimension, fir
 STRIDE = Argument("stride", POSITIONS, """The step in each dimension, first dimension fastest; 1
     takes every element.""")
 
+WRONG_COUNT = "there are more or fewer arguments than the page lists"
 NOT_OPEN = ("notNetcdfID", "ncid is no open dataset")
 NO_VARIABLE = ("variableNotFound", "the dataset has no such variable")
+BAD_NAME = ("nameContainsIllegalCharacters",
+            "the name is empty, or has characters that names must not have")

@@ -9,9 +9,9 @@ from __future__ import annotations
 import difflib
 
 from tessel.families import family
-from tessel.kinds import (ANYTHING, ATTRIBUTE, CODE, CONSTANT, DIMENSION_LIST, DIMENSIONS, DIMID,
-                          IDENTIFIER, MODE, NAME, NAMES, NCID, NO_VARIABLE, NOT_OPEN, NUMBER,
-                          OWNER, PATH_NAME, SIZE, TEXT, VARID, XTYPE)
+from tessel.kinds import (ANYTHING, ATTRIBUTE, BAD_NAME, CODE, CONSTANT, DIMENSION_LIST, DIMENSIONS,
+                          DIMID, IDENTIFIER, MODE, NAME, NAMES, NCID, NO_VARIABLE, NOT_OPEN, NUMBER,
+                          OWNER, PATH_NAME, SIZE, TEXT, VARID, WRONG_COUNT, XTYPE)
 from tessel.operation import Argument, Errors, Operation, Result
 
 EXAMPLE_BEGINNING = """\
@@ -38,7 +38,6 @@ _DEFINING = ("operationNotAllowedInDefineMode", "the dataset is in define mode")
 _NOT_DEFINING = ("operationNotAllowedInDataMode", "the dataset is not in define mode (redef)")
 _LONGER = ("operationNotAllowedInDataMode", "a longer name needs define mode (redef)")
 _IN_USE = ("nameIsAlreadyInUse", "the name is taken")
-_BAD_NAME = ("nameContainsIllegalCharacters", "the name is none")
 _READ_ONLY = ("writeToReadOnly", "the dataset is open for reading only")
 _NO_DIMENSION = ("invalidDimensionIdOrName", "the dataset has no such dimension")
 _NO_ATTRIBUTE = ("attributeNotFound", "there is no such attribute")
@@ -52,7 +51,7 @@ _BAD_MODE = ("invalidArgument", "the mode's bits make no sense together")
 def _errors(tag: str, *failures: tuple[str, str], count: str = "badInputParameterCount",
             count_tag: str | None = None) -> Errors:
     """The error for a wrong number of arguments, then the library's failures."""
-    return ((f"TESSEL:netcdf:{count_tag or tag}:{count}", "the number of arguments"),
+    return ((f"TESSEL:netcdf:{count_tag or tag}:{count}", WRONG_COUNT),
             *((f"TESSEL:netcdf:{tag}:{word}", cause) for word, cause in failures))
 
 
@@ -120,7 +119,7 @@ OPERATIONS: tuple[Operation, ...] = (
         arguments=(NCID, _DIMENSION,
                    Argument("len", SIZE, "Its length; 0 makes it unlimited.", "dim_length")),
         results=(Result("dimid", NUMBER, "The dimension."),),
-        errors=_errors("defDim", NOT_OPEN, _NOT_DEFINING, _IN_USE, _BAD_NAME,
+        errors=_errors("defDim", NOT_OPEN, _NOT_DEFINING, _IN_USE, BAD_NAME,
                        ("invalidDimensionSize", "the length is more than the format holds"),
                        ("onlyOneUnlimitedDimensionAllowed", "there is an unlimited one already")),
         example='>>> nc.redef(ncid)\n>>> nc.def_dim(ncid, "depth", 20)\n3'),
@@ -130,8 +129,8 @@ OPERATIONS: tuple[Operation, ...] = (
                    Argument("dimids", DIMENSIONS, """Its dimensions, the fastest first and the
                        unlimited one last; none for a single value.""", "Dimids")),
         results=(Result("varid", NUMBER, "The variable."),),
-        errors=_errors("defVar", NOT_OPEN, _NOT_DEFINING, _IN_USE, _BAD_NAME,
-                       ("invalidDataType", "the external type is none"), _NO_DIMENSION,
+        errors=_errors("defVar", NOT_OPEN, _NOT_DEFINING, _IN_USE, BAD_NAME,
+                       ("invalidDataType", "the external type is 0, or no whole number"), _NO_DIMENSION,
                        ("unlimitedDimensionInTheWrongIndex", "the unlimited one is not the last")),
         example=">>> nc.redef(ncid)\n"
                 '>>> nc.def_var(ncid, "depth", nc.param("NC_FLOAT"), [0, 1])\n7'),
@@ -233,7 +232,7 @@ OPERATIONS: tuple[Operation, ...] = (
         arguments=(Argument("name", NAME, """The constant, with or without its NC_, in any case:
             "NC_DOUBLE", "global", "Fill_Int".""", "parameter"),),
         results=(Result("value", CONSTANT, "The fill values of float and double are floats."),),
-        errors=(("TESSEL:netcdf_tq:tqParameter:badInputParameterCount", "the number of arguments"),
+        errors=(("TESSEL:netcdf_tq:tqParameter:badInputParameterCount", WRONG_COUNT),
                 ("TESSEL:netcdf:unrecognizedCharParameter", "there is no such constant")),
         example='>>> nc.param("NC_DOUBLE"), nc.param("global")\n(6, -1)'),
     Operation(
@@ -265,19 +264,19 @@ OPERATIONS: tuple[Operation, ...] = (
         "rename_att", "nc_rename_att", "Rename an attribute.",
         arguments=(NCID, OWNER, ATTRIBUTE, Argument("newname", NAME, "Its new name.", "attribute")),
         results=(),
-        errors=_errors("renameAtt", NOT_OPEN, NO_VARIABLE, _NO_ATTRIBUTE, _IN_USE, _BAD_NAME,
+        errors=_errors("renameAtt", NOT_OPEN, NO_VARIABLE, _NO_ATTRIBUTE, _IN_USE, BAD_NAME,
                        _LONGER, _READ_ONLY),
         example='>>> nc.rename_att(ncid, nc.param("GLOBAL"), "title", "name")'),
     Operation(
         "rename_dim", "nc_rename_dim", "Rename a dimension.",
         arguments=(NCID, DIMID, Argument("name", NAME, "Its new name.", "dimension")), results=(),
-        errors=_errors("renameDim", NOT_OPEN, _NO_DIMENSION, _IN_USE, _BAD_NAME, _LONGER,
+        errors=_errors("renameDim", NOT_OPEN, _NO_DIMENSION, _IN_USE, BAD_NAME, _LONGER,
                        _READ_ONLY),
         example='>>> nc.rename_dim(ncid, 2, "t")'),
     Operation(
         "rename_var", "nc_rename_var", "Rename a variable.",
         arguments=(NCID, VARID, Argument("name", NAME, "Its new name.", "variable")), results=(),
-        errors=_errors("renameVar", NOT_OPEN, NO_VARIABLE, _IN_USE, _BAD_NAME, _LONGER, _READ_ONLY),
+        errors=_errors("renameVar", NOT_OPEN, NO_VARIABLE, _IN_USE, BAD_NAME, _LONGER, _READ_ONLY),
         example='>>> nc.rename_var(ncid, nc.inq_varid(ncid, "series"), "line")'),
     Operation(
         "set_default_format", "nc_set_default_format",

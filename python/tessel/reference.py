@@ -15,7 +15,7 @@ from functools import cache
 from tessel.catalogue import CALLED, GIVEN, GUARD, HOST, RAISES, RETURNED, ROWS, STATUSES
 from tessel.errors import built_in_of, word_of
 from tessel.families import MEMBERS
-from tessel.kinds import SIZE
+from tessel.kinds import NAMES, SIZE
 from tessel.meanings import MEANINGS
 from tessel.operation import Argument, Operation, Result
 from tessel.operations import EXAMPLE_BEGINNING
@@ -124,12 +124,11 @@ class Page:
         """What there is beside `raised`: title, note, errors, and the end of each identifier."""
         for title, note, errors, end in (
                 ("Other statuses", STATUS_NOTE, self.statuses, "<word>"),
-                ("From the host and the front", AROUND_NOTE, self.around, ""),
+                ("From the host and the Python package", AROUND_NOTE, self.around, ""),
                 ("The guard", REFUSED_NOTE, self.refused, ""),
                 ("Guards inside", GUARDS_NOTE, self.guards, "")):
             if errors:
                 yield title, note, errors, end
-
 
 def given_and_taken(operation: Operation
                     ) -> Iterator[tuple[str, tuple[Argument | Result, ...]]]:
@@ -154,6 +153,12 @@ def _labels(operation: Operation, template: str) -> list[str]:
         or "unhandledNumericType" in template and each.kind is SIZE))
 
 
+def _one_of(labels: list[str]) -> str:
+    """What stands in a message where the call decides which of these it is."""
+    *most, last = labels or [""]
+    return f"<{', '.join(most)} or {last}>" if most else last
+
+
 def _messages(operation: Operation, row: str) -> Iterator[tuple[str, str]]:
     """The identifiers of a row, with their messages, as the operation raises them."""
     identifier, message = ROWS[row]
@@ -165,7 +170,7 @@ def _messages(operation: Operation, row: str) -> Iterator[tuple[str, str]]:
     labels = _labels(operation, identifier)
     wanted = next((each.host_class for each in MEMBERS
                    if operation.short.endswith(f"_{each.suffix}")), "")
-    for group in labels if "{label}" in identifier else ["|".join(labels)]:
+    for group in labels if "{label}" in identifier else [_one_of(labels)]:
         named = {"short": operation.short, "label": group, "wanted": _WANTED.get(wanted, wanted)}
         text = message
         for each in fillings:
@@ -262,6 +267,12 @@ def python_call(operation: Operation) -> str:
     return f"{results + ' = ' if results else ''}nc.{operation.short}({given})"
 
 
+_EACH_NAME = """\
+std::vector<std::string> names;
+for (std::size_t i = 0; i < results[0].size(); ++i) {
+    names.push_back(results[0].cellAt(i).utf8());
+}"""
+
 _TAKEN = {"int": ".number()", "str": ".utf8()", "Any": ".number()"}
 
 
@@ -271,6 +282,8 @@ def cpp_call(operation: Operation) -> str:
     call = f'netcdf("{operation.short}"{given});'
     if not operation.results:
         return call
+    if operation.results[0].kind is NAMES:
+        return f"const tessel::Results results = {call}\n{_EACH_NAME}"
     taken = {each.name for each in operation.arguments}
     return "\n".join([f"const tessel::Results results = {call}", *(
         f"const auto {each.name}{'_out' if each.name in taken else ''} = "
@@ -286,8 +299,6 @@ def _taken(annotation: str, host: str) -> str:
     """The member function that gives what a result holds."""
     if annotation in _TAKEN:
         return _TAKEN[annotation]
-    if host.startswith("cell"):
-        return ".cellAt(0).utf8()"
     element = _ELEMENTS.get(host.partition(",")[0])
     return f".elements<{element}>()" if element else ".utf8()"
 

@@ -11,7 +11,7 @@ import tessel.sample
 from tessel import kinds, meanings, reference
 from tessel.errors import word_of
 from tessel.operation import Kind
-from tessel.operations import OPERATIONS
+from tessel.operations import OPERATIONS, find
 
 nc = tessel.load("netcdf")
 
@@ -107,6 +107,51 @@ def test_a_method_takes_a_code_by_its_value(make: typing.Callable[[str], typing.
     nc.set_fill(ncid, make(dtype))
     assert nc.set_fill(ncid, before) == 256
     nc.close(ncid)
+
+
+# What else is said of arguments.
+
+@pytest.mark.parametrize("value", [0.0, 3.5, float("nan")])
+def test_no_external_type(value: float) -> None:
+    """What is within the range and none of the types: the cause names each of these."""
+    ncid = nc.create("none.nc", "CLOBBER")
+    with pytest.raises(tessel.Error) as caught:
+        nc("def_var", ncid, "none", value, numpy.zeros((0, 0)))
+    assert caught.value.identifier == "TESSEL:netcdf:defVar:invalidDataType"
+    [cause] = [each.cause for each in reference.page_of(find("def_var")).raised
+               if each.identifier == caught.value.identifier]
+    assert cause == "the external type is 0, or no whole number"
+    nc.close(ncid)
+
+
+@pytest.mark.parametrize("name, fails", [("", True), ("a/b", True), ("a\x07", True), ("_a", False)])
+def test_bad_names(name: str, fails: bool) -> None:
+    ncid = nc.create("names.nc", "CLOBBER")
+    if fails:
+        with pytest.raises(tessel.Error) as caught:
+            nc.def_dim(ncid, name, 2)
+        assert (caught.value.word, "the name is empty, or has characters that names must not have"
+                ) == kinds.BAD_NAME
+    else:
+        assert nc.def_dim(ncid, name, 2) == 0
+    nc.close(ncid)
+
+
+def test_one_of_the_arguments() -> None:
+    """Where the call decides which argument a message names, the page says so in words; the message
+    itself names that one."""
+    [raised] = [each for each in reference.page_of(find("inq_var")).raised
+                if each.identifier == "TESSEL:netcdf:emptySetID"]
+    assert "<ncid or varid> argument cannot be []" in raised.message
+    for at, name in enumerate(("ncid", "varid")):
+        given = [1.0, 1.0]
+        given[at] = numpy.zeros((0, 0))
+        with pytest.raises(tessel.Error) as caught:
+            nc("inq_var", *given)
+        assert str(caught.value) == raised.message.replace("<ncid or varid>", name)
+    [raised] = [each for each in reference.page_of(find("inq")).raised
+                if each.identifier == "TESSEL:netcdf:emptySetID"]
+    assert raised.message.startswith("ncid argument")
 
 
 # Advice.

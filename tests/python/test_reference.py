@@ -186,21 +186,33 @@ def test_the_same_everywhere(operation: Operation) -> None:
         for line in operation.example.splitlines():
             assert line.replace("'", "\\(aq") in form or line in form
     assert operation.purpose in text
+    for form, heading in ((text, "\nErrors\n------\n"), (man, "\n.SH ERRORS\n"),
+                          (rst, "\nErrors\n------\n")):
+        before, _, errors = form.partition(heading)
+        for each in (*page.raised, *page.statuses, *page.around, *page.guards, *page.refused):
+            assert each.identifier in errors and each.identifier not in before
 
 
 def test_the_index_has_all() -> None:
     index = RST["errors.rst"]
     for word in meanings.MEANINGS:
         assert f"\n   {word}\n" in index
-    for short in PAGES:
-        for identifier in identifiers(short):
-            assert f"\n``{identifier}``\n" in index
-    for each in reference.every_call():
-        assert f"\n``{each.identifier}``\n" in index
     explained = {*catalogue.HOST, *catalogue.GUARD, *catalogue.PACKAGE}
     assert len(explained) > 60
     for identifier in explained:
         assert f"\n``{identifier}``\n   {make_reference.advice(identifier)}\n" in index
+    module = {identifier for short in PAGES for identifier in identifiers(short)} - explained
+    module |= {each.identifier for each in reference.every_call()} - explained
+    assert len(module) > 250
+    for identifier in module:
+        word = word_of(identifier)
+        meaning = make_reference.rst(meanings.MEANINGS[word][0])
+        assert f"\n``{identifier}``\n   {meaning} :term:`{word}` says what to do.\n" in index
+    places = re.findall(r"^\.\. _(.*):\n\n``(.*)``\n   ", index, re.M)
+    assert [each for _, each in places] == re.findall(r"^``(TESSEL:.*)``$", index, re.M)
+    assert len({place.lower() for place, _ in places}) == len(places) > 400
+    assert ("error-TESSEL-netcdf-inqVarID-variableNotFound",
+            "TESSEL:netcdf:inqVarID:variableNotFound") in places
     assert "\nAll identifiers\n" in index
     assert ("``TESSEL:host:outOfMemory``\n   There is no memory left. What to do: Read or write by "
             "smaller blocks.\n\n   Every operation.\n") in index
@@ -217,6 +229,8 @@ def test_manual_pages_are_clean(tmp_path: Path) -> None:
                                                                   for each in MAN)],
                          capture_output=True, text=True, env=PLAIN, check=True)
     assert run.stdout + run.stderr == ""
+    for page, text in MAN.items():
+        assert not re.search(r"\.:$", text, re.M), page
     whole = MAN["man1/tessel.1"]
     for name in ("info", "plot", "copy", "check", "ops"):
         assert f".SS {name}\n" in whole
@@ -257,6 +271,7 @@ def test_calls_in_cpp_compile(tmp_path: Path) -> None:
                          f"{{\n{reference.cpp_call(operation)}{used}\n}}")
     source = tmp_path / "calls.cpp"
     source.write_text("#include \"tessel/runtime.hpp\"\n#include <cstdint>\n#include <string>\n"
+                      "#include <vector>\n"
                       + "\n".join(functions))
     run = subprocess.run(["c++", "-std=c++20", "-fsyntax-only", "-Wall", "-Werror",
                           f"-I{ROOT / 'runtime' / 'include'}", f"-I{ROOT / 'host'}", str(source)],
