@@ -8,9 +8,12 @@
 #include <array>
 #include <cmath>
 #include <limits>
+#include <string>
 
 namespace tessel::test {
 namespace {
+
+using namespace std::string_literals;
 
 std::string failed(const std::string &why) {
     return libraryFailed("Variable data retrieval failed", why);
@@ -108,29 +111,37 @@ Rows eachMember() {
 // clang-format on
 
 /// This family counts the characters that it hands over in 32 bits, with a sign: of 2 to the 31st
-/// it hands over none. The library is not asked, so that no memory is touched that need not be
-/// there.
+/// it hands over none, and of 2 to the 32nd and five, five. The library is not asked, so that no
+/// memory is touched that need not be there.
 TEST(VarRead, CharactersAreCountedIn32Bits) {
-    const Scene scene(On::nothing);
-    int id = -1;
-    want(nc_create(scene.path("huge.nc").c_str(), NC_64BIT_OFFSET, &id));
-    int old = 0;
-    want(nc_set_fill(id, NC_NOFILL, &old));
-    std::array<int, 2> dimids{};
-    want(nc_def_dim(id, "y", 0x8000, &dimids[0]));
-    want(nc_def_dim(id, "x", 0x10000, &dimids[1]));
-    int variable = -1;
-    want(nc_def_var(id, "v", NC_CHAR, dimids.size(), dimids.data(), &variable));
-    want(nc_enddef(id));
-    {
-        Probe probe;
-        probe.answer("nc_get_var_text", NC_NOERR);
-        probe.leave("abc");
-        const Results results = netcdf()("get_var_text", id, variable);
-        ASSERT_EQ(results[0].size(), 0x80000000U);
-        EXPECT_EQ(results[0].elements<tsChar>()[0], 0) << "a character was handed over";
+    struct Case {
+        std::array<std::size_t, 2> shape; ///< in the library's order
+        std::u16string characters;        ///< the first that are handed over, of "abcdefg"
+    };
+    for (const auto &[shape, characters] :
+         {Case{{0x8000, 0x10000}, std::u16string(7, 0)}, Case{{3, 0x55555557}, u"abcde\0\0"s}}) {
+        const Scene scene(On::nothing);
+        int id = -1;
+        want(nc_create(scene.path("huge.nc").c_str(), NC_64BIT_DATA, &id));
+        int old = 0;
+        want(nc_set_fill(id, NC_NOFILL, &old));
+        std::array<int, 2> dimids{};
+        want(nc_def_dim(id, "y", shape[0], &dimids[0]));
+        want(nc_def_dim(id, "x", shape[1], &dimids[1]));
+        int variable = -1;
+        want(nc_def_var(id, "v", NC_CHAR, dimids.size(), dimids.data(), &variable));
+        want(nc_enddef(id));
+        {
+            Probe probe;
+            probe.answer("nc_get_var_text", NC_NOERR);
+            probe.leave("abcdefg");
+            const Results results = netcdf()("get_var_text", id, variable);
+            ASSERT_EQ(results[0].size(), shape[0] * shape[1]);
+            const auto found = results[0].elements<tsChar>();
+            EXPECT_EQ(std::u16string(found.begin(), found.begin() + 7), characters);
+        }
+        want(nc_abort(id));
     }
-    want(nc_abort(id));
 }
 
 INSTANTIATE_TEST_SUITE_P(VarRead, Conformance, testing::ValuesIn(rows()), titleOf);

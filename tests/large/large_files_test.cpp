@@ -468,7 +468,6 @@ TEST_P(LargeWhole, IsRead) {
         }
         EXPECT_EQ(static_cast<int>(found[in31Bits - 2]), 0);
     });
-    // Blocks are read in full, text too.
     EXPECT_EQ(get("get_vara", varid, vectorOf({elements - 2}), vectorOf({2})),
               (Values{0, mark(elements - 1)}));
 }
@@ -476,6 +475,22 @@ TEST_P(LargeWhole, IsRead) {
 // Numbers of two bytes are more than 32 bits count of those, too. What is larger takes 8 GiB and
 // more of memory, and is of the same code.
 INSTANTIATE_TEST_SUITE_P(Members, LargeWhole, testing::Values(members[3], members[4], members[6]),
+                         [](const auto &each) { return each.param.suffix; });
+
+/// Blocks of text are counted in 64 bits, and so read in full.
+class LargeText : public LargeWhole {};
+
+TEST_P(LargeText, IsReadInFull) {
+    markFile();
+    open("NOWRITE");
+    const Results results = call("get_vara", varid, vectorOf({0}), vectorOf({elements}));
+    ASSERT_EQ(results[0].size(), elements);
+    for (const std::size_t element : marked) {
+        EXPECT_EQ(results[0].elements<tsChar>()[element], mark(element)) << element;
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Members, LargeText, testing::Values(members[6]),
                          [](const auto &each) { return each.param.suffix; });
 
 class LargeWholeWrite : public LargeWhole {};
