@@ -72,10 +72,6 @@ void running(Values from, std::span<double> to) {
     std::partial_sum(from.begin(), from.end(), to.begin());
 }
 
-void differences(Values from, std::span<double> to) {
-    std::adjacent_difference(from.begin(), from.end(), to.begin());
-}
-
 void backwards(Values from, std::span<double> to) {
     std::reverse_copy(from.begin(), from.end(), to.begin());
 }
@@ -93,6 +89,15 @@ template <void (*function)(Values, std::span<double>)>
 void toSeries(tsArray *plhs[], const tsArray *prhs[]) {
     const Values from = values(prhs[1]);
     function(from, column(plhs[0], from.size()));
+}
+
+/// What each value is more than the one before: one fewer than the values, and none for none.
+void differences(tsArray *plhs[], const tsArray *prhs[]) {
+    const Values from = values(prhs[1]);
+    const std::size_t n = from.empty() ? 0 : from.size() - 1;
+    const Values later = from.last(n);
+    std::transform(later.begin(), later.end(), from.begin(), column(plhs[0], n).begin(),
+                   std::minus<>());
 }
 
 void product(tsArray *plhs[], const tsArray *prhs[]) {
@@ -118,7 +123,7 @@ constexpr std::array operations = {
     Operation{"running", 2, toSeries<running>},
     Operation{"backwards", 2, toSeries<backwards>},
     Operation{"sorted", 2, toSeries<sorted>},
-    Operation{"differences", 2, toSeries<differences>},
+    Operation{"differences", 2, differences},
     Operation{"product", 3, product},
 };
 

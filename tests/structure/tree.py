@@ -16,8 +16,7 @@ VERSION_IN = {"CMakeLists.txt", "CHANGELOG.md"}
 
 # Compiled by the tests themselves, or by projects of their own.
 BUILT_OTHERWISE = {"tests/host/contract.c", "tests/host/contract.cpp",
-                   "examples/embedding/guarded.cpp", "examples/embedding/means.cpp",
-                   "examples/second_module/series.cpp"}
+                   "examples/embedding/guarded.cpp", "examples/embedding/means.cpp"}
 
 
 def main(root: Path, version: str, commands: Path) -> int:
