@@ -1,7 +1,9 @@
 // examples/embedding/means.cpp: two modules in one host: means SERIES-MODULE FILE VARIABLE...
 //
 // Reads variables of a netCDF file with the module "netcdf", and gives them to the module "series",
-// which knows nothing of netCDF: a host array is a host array.
+// which knows nothing of netCDF: a host array is a host array. So fill values are values like any
+// other here: for the mean of what was measured, leave out what equals the variable's attribute
+// "_FillValue" or "missing_value".
 #include "tessel/runtime.hpp"
 
 #include <iostream>

@@ -1,6 +1,8 @@
-# Installs BUILD into PREFIX, and then uses nothing but that: builds PROGRAM and one with a guard by
-# pkg-config, and the projects of EXAMPLES by the CMake package, and runs all of it on FILE.
+# Installs BUILD into PREFIX, and then uses nothing but that: builds a program and one with a guard by
+# the command that DOCUMENT shows for pkg-config, and the projects of EXAMPLES by the CMake package,
+# and runs all of it on FILE.
 file(REMOVE_RECURSE ${PREFIX})
+unset(ENV{TESSEL_MODULE_PATH})
 execute_process(COMMAND ${CMAKE_COMMAND} --install ${BUILD} --prefix ${PREFIX}/usr
     OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
 set(lib ${PREFIX}/usr/${LIBDIR})
@@ -12,26 +14,29 @@ function(expect printed)
     endif()
 endfunction()
 
-set(ENV{PKG_CONFIG_PATH} ${lib}/pkgconfig)
+file(READ ${DOCUMENT} text)
+if(NOT text MATCHES "```sh\n(export PKG_CONFIG_PATH=PREFIX/[^`]*pkg-config --cflags[^`]*)```")
+    message(FATAL_ERROR "${DOCUMENT} has no command by which programs are built")
+endif()
+string(REPLACE "PREFIX/lib/x86_64-linux-gnu" "${lib}" command "${CMAKE_MATCH_1}")
+string(REPLACE "c++ " "${COMPILER} " command "${command}")
 function(build_by_pkg_config package program)
-    execute_process(COMMAND pkg-config --cflags --libs ${package}
-        OUTPUT_VARIABLE flags OUTPUT_STRIP_TRAILING_WHITESPACE COMMAND_ERROR_IS_FATAL ANY)
-    separate_arguments(flags)
     get_filename_component(name ${program} NAME_WE)
-    execute_process(COMMAND ${COMPILER} -std=c++20 ${program} ${flags} -Wl,-rpath,${lib}
-            -o ${PREFIX}/${name}
-        COMMAND_ERROR_IS_FATAL ANY)
+    string(REPLACE "embed.cpp" "${EXAMPLES}/${program}" command "${command}")
+    string(REPLACE " tessel)" " ${package})" command "${command}")
+    string(REPLACE "-o embed" "-o ${PREFIX}/${name}" command "${command}")
+    execute_process(COMMAND sh -ec "${command}" COMMAND_ERROR_IS_FATAL ANY)
 endfunction()
-build_by_pkg_config(tessel ${PROGRAM})
+build_by_pkg_config(tessel embed.cpp)
 expect("90 values, from -89 to 89\n" ${PREFIX}/embed ${FILE} COADSY)
-build_by_pkg_config(tessel-netcdf-guard ${EXAMPLES}/embedding/guarded.cpp)
+build_by_pkg_config(tessel-netcdf-guard embedding/guarded.cpp)
 expect("opened\n" ${PREFIX}/guarded ${FILE})
 
 foreach(project second_module embedding)
     execute_process(COMMAND ${CMAKE_COMMAND} -S ${EXAMPLES}/${project} -B ${PREFIX}/${project}
             -G Ninja -DCMAKE_PREFIX_PATH=${PREFIX}/usr -DCMAKE_CXX_COMPILER=${COMPILER}
             -DCMAKE_CXX_FLAGS=-Werror
-        OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+        OUTPUT_VARIABLE told COMMAND_ERROR_IS_FATAL ANY)
     execute_process(COMMAND ${CMAKE_COMMAND} --build ${PREFIX}/${project}
         OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
 endforeach()
@@ -40,7 +45,15 @@ set(line "COADSY: 90 values from -89 to 89, mean 0\n")
 set(arguments ${PREFIX}/second_module/series.tsx ${FILE} COADSY)
 expect("${line}" ${PREFIX}/embedding/means ${arguments})
 expect("opened\n" ${PREFIX}/embedding/guarded ${FILE})
-set(ENV{TESSEL_MODULE_PATH} ${lib}/tessel) # beside a program in one piece there are no modules
+execute_process(COMMAND ${PREFIX}/embedding/means_static ${arguments}
+    ERROR_VARIABLE found RESULT_VARIABLE status) # beside a program in one piece there are no modules
+if(NOT status EQUAL 1 OR NOT found MATCHES "^TESSEL:host:moduleNotFound")
+    message(FATAL_ERROR "means_static has a module from somewhere: ${found}")
+endif()
+if(NOT told MATCHES "TESSEL_MODULE_PATH=([^\n]+)")
+    message(FATAL_ERROR "The project does not say where the modules are: ${told}")
+endif()
+set(ENV{TESSEL_MODULE_PATH} "${CMAKE_MATCH_1}")
 expect("${line}" ${PREFIX}/embedding/means_static ${arguments})
 expect("opened\n" ${PREFIX}/embedding/guarded_static ${FILE})
 foreach(program guarded guarded_static)

@@ -1,5 +1,6 @@
-# Installs BUILD into PREFIX as packagers do, for each place that Python looks in, and then uses nothing
-# but that: the command shows FILE, PYTHON finds the package, and xarray in it the engine.
+# Installs BUILD into PREFIX as packagers do, for each place that Python looks in, and into a virtual
+# environment, and then uses nothing but that: the command shows FILE, PYTHON finds the package, and
+# xarray in it the engine.
 #
 # SERIES is Python's, such as 3.11; DEBIAN says whether it is one of Debian's.
 file(REMOVE_RECURSE ${PREFIX})
@@ -41,3 +42,16 @@ foreach(prefix /usr /usr/local /opt/tessel)
         message(FATAL_ERROR "Of the book, ${of_${tree}/share} pages are installed")
     endif()
 endforeach()
+
+# The interpreter of a virtual environment finds the package there without being told, and before
+# any that the system has.
+unset(ENV{PYTHONPATH})
+set(environment ${PREFIX}/environment)
+execute_process(COMMAND ${PYTHON} -m venv --without-pip --system-site-packages ${environment}
+    COMMAND_ERROR_IS_FATAL ANY)
+execute_process(COMMAND ${CMAKE_COMMAND} --install ${BUILD} --prefix ${environment}
+    OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+expect("^90 -89.0\n$" ${environment}/bin/python -B -c ${program})
+expect("/environment/lib/python${SERIES}/site-packages/tessel\n$" ${environment}/bin/python -B -c
+    "import tessel\nprint(*tessel.__path__)")
+expect("COADSY" ${environment}/bin/tessel info ${FILE})
