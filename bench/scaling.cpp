@@ -212,8 +212,8 @@ void addElements(Series &series, const Module &netcdf, const Dataset &data) {
                 return function(ncid, id, start.data(), count.data(), stride.data(), value);
             });
         };
-        const auto add = [&](const char *what, Work library, auto... inputs) {
-            series.add(what, "dimensions", ndims, std::move(library),
+        const auto add = [&](const char *what, const Work &library, auto... inputs) {
+            series.add(what, "dimensions", ndims, library,
                        called(netcdf, Array::text(what), Array::scalar(data.ncid),
                               Array::scalar(varid), std::move(inputs)...));
         };
