@@ -4,11 +4,13 @@
 usage: PYTHONPATH=build/release/python /usr/bin/python3 tools/make_book.py VERSION FOLDER
 
 The pages are those of docs/book, the documents of docs, and the reference, which is generated. They
-end up in FOLDER/html. Any warning fails, and so does a link within the book that leads nowhere.
+end up in FOLDER/html. Any warning fails, and so does a link that leads nowhere within the book, or
+from a document into the tree.
 """
 
 from __future__ import annotations
 
+import json
 import os
 import re
 import shutil
@@ -33,9 +35,40 @@ def chapter(name: str) -> str:
     return CHAPTERS.get(name, "inside")
 
 
+LINK = r"\[([^\]\n]*)\]\(([^)\s]+)\)"
+
+
+def places_in(document: Path) -> set[str]:
+    """What links may name in a document: its headings as those who show it name them, and places
+    with names of their own."""
+    text = re.sub(r"^```.*?^```", "", document.read_text(), flags=re.M | re.S)
+    headings = re.findall(r"^#+ +(.+?) *$", text, re.M)
+    return {*(re.sub(r"[^\w -]", "", re.sub(LINK, r"\1", each)).lower().replace(" ", "-")
+              for each in headings), *re.findall(r'<a name="(\w+)"></a>', text)}
+
+
+def missing_targets(document: Path) -> list[str]:
+    """The links of a document to files that are not in the tree, and to places not in a file."""
+    found = []
+    text = re.sub(r"^```.*?^```|`[^`\n]*`", "", document.read_text(), flags=re.M | re.S)
+    for _, link in re.findall(LINK, text):
+        parts = urlsplit(link)
+        target = document.parent / unquote(parts.path) if parts.path else document
+        if not parts.scheme and not (target.exists() and (
+                not parts.fragment or parts.fragment in places_in(target))):
+            found.append(f"{document.name}: {link}")
+    return found
+
+
+def documents(root: Path) -> list[Path]:
+    """Those whose links are paths in the tree; of the book's own pages, Sphinx looks at them."""
+    return sorted((*root.glob("*.md"), *root.glob("docs/*.md")))
+
+
 def linked(text: str, home: str) -> str:
     """A document with its links as they are in the book: to its other pages, or only their text.
-    Places that HTML names in it are named as Sphinx wants it."""
+    One that shows a file's name shows the page's title there. Places that HTML names in it are named
+    as Sphinx wants it."""
     places = set(re.findall(r'^<a name="(\w+)"></a>', text, re.M))
     text = re.sub(r'^<a name="(\w+)"></a>', r"(\1)=\n", text, flags=re.M)
 
@@ -47,10 +80,11 @@ def linked(text: str, home: str) -> str:
         if target.startswith(("http", "#")) or (DOCS / name).suffix in (".svg", ".png"):
             return found[0]
         if (DOCS / name).is_file():
-            return f"[{shown}](../{chapter(name)}/{target})" if chapter(name) != home else found[0]
+            folder = f"../{chapter(name)}/" if chapter(name) != home else ""
+            return f"[{'' if shown == name else shown}]({folder}{target})"
         return shown
 
-    return re.sub(r"(?<!!)\[([^\]\n]*)\]\(([^)\s]+)\)", replaced, text)
+    return re.sub(rf"(?<!!){LINK}", replaced, text)
 
 
 def put_together(source: Path) -> None:
@@ -123,6 +157,26 @@ def broken_links(html: Path) -> tuple[list[str], int]:
     return sorted(found), followed
 
 
+def finish_search(html: Path) -> None:
+    """Has the search find a page once. It takes results for the same where page, title and anchor
+    are, and a page is in its index without an anchor for its text, with one for its title, and with
+    one for the words that the page is under in the index."""
+    file = html / "searchindex.js"
+    start, end = "Search.setIndex(", ")"
+    text = file.read_text()
+    assert text.startswith(start) and text.endswith(end)
+    index = json.loads(text.removeprefix(start).removesuffix(end))
+    for title, places in index["alltitles"].items():
+        for place in places:
+            if index["titles"][place[0]] == title:
+                place[1] = None
+    for places in index["indexentries"].values():
+        for place in places:
+            if place[1].startswith("index-"):
+                place[1] = None
+    file.write_text(start + json.dumps(index) + end)
+
+
 def finish_theme(static: Path) -> None:
     """Makes the packaged theme work from any folder and in any browser. Its style sheet names
     another by an address of the web server's and has no rule for those who prefer dark, and its
@@ -145,6 +199,8 @@ def finish_theme(static: Path) -> None:
 
 def main(version: str, folder: Path) -> None:
     """The book, or the reason why there is none."""
+    if missing := [each for document in documents(ROOT) for each in missing_targets(document)]:
+        sys.exit("\n".join([*missing, "links to what is not in the tree"]))
     folder = folder.resolve()
     folder.mkdir(parents=True, exist_ok=True)
     source, html = folder / "source", folder / "html"
@@ -155,6 +211,7 @@ def main(version: str, folder: Path) -> None:
         "-d", folder / "doctrees", source, html,
         env={**os.environ, "TESSEL_VERSION": version, "TESSEL_DOXYGEN": str(folder / "xml")})
     finish_theme(html / "_static")
+    finish_search(html)
     found, followed = broken_links(html)
     if found or followed < 1000:
         sys.exit("\n".join([*found, f"{len(found)} of {followed} links lead nowhere"]))

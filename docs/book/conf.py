@@ -16,6 +16,8 @@ smartquotes = False  # what is quoted is to be pasted into programs
 
 breathe_projects = {"tessel": os.environ["TESSEL_DOXYGEN"]}
 breathe_default_project = "tessel"
+breathe_show_include = False  # the names of headers without their folder are of no use
+breathe_show_enumvalue_initializer = True
 breathe_domain_by_extension = {"h": "c", "hpp": "cpp"}
 
 html_theme = "furo"
