@@ -12,6 +12,7 @@
 
 #include "tessel/array.h"
 
+/* What each language says of a function that does not return. */
 #ifdef __cplusplus
 #define TESSEL_NORETURN [[noreturn]]
 extern "C" {

@@ -1,26 +1,4 @@
 // tessel/netcdf_guard.hpp: keeps calls from the netCDF library that it does not survive.
-//
-// Version 4.9 of the library divides by zero, follows a null pointer, or goes on for ever when it
-// is given certain arguments that look valid, and it fetches what a file name that is an address
-// names. The guard is a watcher for the module "netcdf" which refuses these calls, and no others,
-// with an error that says why:
-//
-//   TESSEL:guard:alignment   a tuned enddef with an alignment of 0, which divides by zero
-//   TESSEL:guard:mode        a mode flag that makes create or open follow an invalid pointer
-//   TESSEL:guard:closed      anything with a dataset that is based on HDF5, or was opened without
-//                            the guard, and whose closing failed: its memory may be freed
-//   TESSEL:guard:lengths     a variable over a dimension of 2^63 elements or more
-//   TESSEL:guard:counts      a write of counts that multiply to more than 64 bits hold
-//   TESSEL:guard:records     a write that would first fill more than GuardOptions::fillLimit
-//   TESSEL:guard:header      a file whose header claims what it cannot hold, or what would overflow
-//                            the buffers of programs that follow the library's limits
-//   TESSEL:guard:remote      a file name that is an address, unless GuardOptions::remote
-//
-// It closes in steps: definitions are ended and the dataset is synchronised before the library
-// closes it. When one of them fails, "close" raises why, and the dataset is open and whole.
-//
-// What it knows of open datasets it has from the calls that it saw. Dataset ids belong to the
-// process, and so does this knowledge: all guards share it.
 #pragma once
 
 #include "tessel/runtime/watcher.hpp"
@@ -30,6 +8,7 @@
 
 namespace tessel {
 
+/// What the guard allows.
 struct GuardOptions {
     /// Whether addresses ("https://...") may be given as file names.
     bool remote = false;
@@ -38,6 +17,29 @@ struct GuardOptions {
     std::uint64_t fillLimit = std::uint64_t{4} << 30U;
 };
 
+/// A guard for the module "netcdf", to be given to Module::watchedBy.
+///
+/// Version 4.9 of the library divides by zero, follows a null pointer, or goes on for ever when it
+/// is given certain arguments that look valid, and it fetches what a file name that is an address
+/// names. The guard is a watcher which refuses these calls, and no others, with an Error that says
+/// why:
+///
+/// - "TESSEL:guard:alignment": a tuned enddef with an alignment of 0, which divides by zero
+/// - "TESSEL:guard:mode": a mode flag that makes create or open follow an invalid pointer
+/// - "TESSEL:guard:closed": anything with a dataset that is based on HDF5, or was opened without
+///   the guard, and whose closing failed: its memory may be freed
+/// - "TESSEL:guard:lengths": a variable over a dimension of 2^63 elements or more
+/// - "TESSEL:guard:counts": a write of counts that multiply to more than 64 bits hold
+/// - "TESSEL:guard:records": a write that would first fill more bytes than GuardOptions::fillLimit
+/// - "TESSEL:guard:header": a file whose header claims what it cannot hold, or what would overflow
+///   the buffers of programs that follow the library's limits
+/// - "TESSEL:guard:remote": a file name that is an address, unless GuardOptions::remote is set
+///
+/// It closes in steps: definitions are ended and the dataset is synchronised before the library
+/// closes it. When one of them fails, "close" raises why, and the dataset is open and whole.
+///
+/// What it knows of open datasets it has from the calls that it saw. Dataset ids belong to the
+/// process, and so does this knowledge: all guards share it.
 std::shared_ptr<Watcher> netcdfGuard(const GuardOptions &options = {});
 
 } // namespace tessel

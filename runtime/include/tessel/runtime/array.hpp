@@ -34,9 +34,13 @@ class Array {
     /// parts as well, in storage of their own.
     static Array numeric(tsClassID classID, Dims dims, bool complex = false);
 
-    /// Arrays whose elements are zero: false, the character 0, an empty cell.
+    /// A logical array, all false.
     static Array logical(Dims dims);
+
+    /// A char array, all of the character 0.
     static Array characters(Dims dims);
+
+    /// A cell array without a value in any position.
     static Array cell(Dims dims);
 
     /// A 1-by-1 double.
@@ -66,16 +70,31 @@ class Array {
     /// Takes over an array that nobody else owns.
     static Array adopt(tsArray *array) noexcept;
 
+    /// Whether there is an array.
     [[nodiscard]] explicit operator bool() const noexcept { return array != nullptr; }
+
+    /// The array as the host interface takes it, owned as before; nullptr where there is none.
     [[nodiscard]] const tsArray *get() const noexcept { return array.get(); }
+
+    /// The same, to be changed.
     [[nodiscard]] tsArray *get() noexcept { return array.get(); }
+
+    /// Gives the array away, to one who adopts it or hands it to the host; nullptr where there is
+    /// none. There is none afterwards.
     [[nodiscard]] tsArray *release() noexcept { return array.release(); }
 
     // What follows wants an array to be there.
 
+    /// The class.
     [[nodiscard]] tsClassID classID() const noexcept;
+
+    /// The name of the class: "double", "int32", "char" and so on; it lives as long as the program.
     [[nodiscard]] const char *className() const noexcept;
+
+    /// The lengths of the dimensions, at least two, first dimension fastest; valid as long as the
+    /// array lives.
     [[nodiscard]] Dims dims() const noexcept;
+
     /// The number of elements.
     [[nodiscard]] std::size_t size() const noexcept;
 
@@ -102,6 +121,8 @@ class Array {
     /// The value at a position of a cell or structure array; empty where nothing was set. Error
     /// "TESSEL:host:badIndex" beyond the end, "TESSEL:host:badClass" for other classes.
     [[nodiscard]] const Array &cellAt(std::size_t index) const;
+
+    /// Sets it, in the place of what was there. The same errors.
     void setCell(std::size_t index, Array value);
 
     /// The names of a structure's fields.

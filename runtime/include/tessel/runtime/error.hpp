@@ -14,9 +14,15 @@ namespace tessel {
 /// memory for the texts, the error is "TESSEL:host:outOfMemory".
 class Error : public std::exception {
   public:
+    /// An error with copies of both texts.
     Error(std::string_view identifier, std::string_view message) noexcept;
-    Error(const Error &) noexcept = default; // and no move, which would leave one without texts
+
+    /// Shares the texts. There is no move, which would leave one without texts.
+    Error(const Error &) noexcept = default;
+
+    /// The same.
     Error &operator=(const Error &) noexcept = default;
+
     ~Error() override;
 
     /// Colon-separated, made for programs ("TESSEL:netcdf:open:noSuchFileOrDirectory").

@@ -12,6 +12,7 @@
 #include <span>
 #include <string_view>
 
+/// The embedded host: arrays, modules and calls, and watchers such as the guard.
 namespace tessel {
 
 /// The outputs of one call: the slots that the module filled. Moves, does not copy.
@@ -25,6 +26,8 @@ class Results {
 
     /// Output i; an Array that owns nothing for a slot that was not filled.
     [[nodiscard]] Array &operator[](std::size_t i) noexcept { return arrays[i]; }
+
+    /// The same, to be read.
     [[nodiscard]] const Array &operator[](std::size_t i) const noexcept { return arrays[i]; }
 
   private:
@@ -40,6 +43,7 @@ struct CallReport {
     std::size_t arraysLeft = 0;  ///< arrays that it did not hand out
 };
 
+/// What a call may be given beside its inputs.
 struct CallOptions {
     int outputs = 1;                ///< the number of outputs that are asked for (nlhs)
     std::size_t failAllocation = 0; ///< makes the n-th allocation of the call fail; 0: none
@@ -49,13 +53,25 @@ struct CallOptions {
 /// An argument of the comfortable form of a call: an array, a number or a text.
 class Argument {
   public:
+    /// An array that is there already, and outlives the argument. Not copied.
     Argument(const Array &array) : input(array.get()) {}
+
+    /// A 1-by-1 double. Error "TESSEL:host:outOfMemory", as with all that follow.
     Argument(double value) : made(Array::scalar(value)), input(made.get()) {}
+
+    /// A 1-by-1 double as well.
     Argument(int value) : Argument(static_cast<double>(value)) {}
+
+    /// A 1-by-n row of characters made from UTF-8, as Array::text makes it.
     Argument(std::string_view utf8) : made(Array::text(utf8)), input(made.get()) {}
+
+    /// The same of NUL-terminated text.
     Argument(const char *utf8) : Argument(std::string_view(utf8)) {}
+
+    /// The same.
     Argument(const std::string &utf8) : Argument(std::string_view(utf8)) {}
 
+    /// The array that the call is given; alive as long as the argument.
     [[nodiscard]] const tsArray *get() const noexcept { return input; }
 
   private:
@@ -93,6 +109,7 @@ class Module {
     /// "TESSEL:host:moduleNotFound" names the folders. A name has no "/" in it.
     static Module find(std::string_view name);
 
+    /// The file that the module was loaded from.
     [[nodiscard]] const std::filesystem::path &file() const noexcept;
 
     /// The same module, with someone who looks at each call first (tessel/runtime/watcher.hpp). The
@@ -130,6 +147,8 @@ class Module {
 /// that were overwritten, inputs that were changed, memory that was not the call's to free, and
 /// memory left behind.
 void setChecked(bool on) noexcept;
+
+/// Whether checked mode is on.
 [[nodiscard]] bool isChecked() noexcept;
 
 } // namespace tessel
