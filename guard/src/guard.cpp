@@ -18,6 +18,7 @@
 #include <cstdint>
 #include <filesystem>
 #include <iterator>
+#include <limits>
 #include <optional>
 #include <string_view>
 #include <system_error>
@@ -30,7 +31,8 @@ namespace {
 constexpr int userFormats = 0x40 | 0x80; // what belongs to them cannot be registered here
 constexpr int inMemory = 0x8000;         // the file's name stands for memory that is not there
 constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fails by itself
-constexpr int mapped = 0x10;                              // the file is kept in memory
+constexpr int diskless = 0x8;                             // the file is kept in memory
+constexpr int mapped = 0x10;                              // and is that memory
 constexpr int hdf5 = 0x1000;
 constexpr int noFill = 0x100;
 constexpr double tooLong = 0x1p63;       // elements, which the library takes for a negative number
@@ -106,6 +108,24 @@ void unlessRefused(const Look &look) {
         if (!isModules(error)) {
             throw;
         }
+    }
+}
+
+/// Whether so much of a file can be mapped.
+bool isMappable(std::uint64_t bytes) {
+    void *const memory = mmap(nullptr, bytes, PROT_READ | PROT_WRITE,
+                              MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
+    return memory != MAP_FAILED && munmap(memory, bytes) == 0;
+}
+
+/// In mapped memory, the library maps what it is told that a new file begins with, or that an old
+/// one is read by; a number that would be negative it leaves alone.
+void lookAtMapping(int flags, const tsArray *bytes) {
+    const std::uint64_t asked = size(bytes).value_or(0);
+    if ((flags & (mapped | diskless)) == mapped && asked > 0 &&
+        asked <= std::numeric_limits<std::int64_t>::max() && !isMappable(asked)) {
+        refuse(mode, "the flag 16 (NC_MMAP) is set, and there is no memory for " +
+                         std::to_string(asked) + " bytes");
     }
 }
 
@@ -197,22 +217,11 @@ void settleMode(int ncid, Dataset &dataset, const Ask &ask) {
     dataset.modeInDoubt = false;
 }
 
-/// Whether so much memory can be mapped.
-bool isMappable(std::uint64_t bytes) {
-    void *const memory =
-        mmap(nullptr, bytes, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
-    return memory != MAP_FAILED && munmap(memory, bytes) == 0;
-}
-
 /// Whether the file will be of a classic format.
-bool lookAtCreation(int flags, std::uint64_t initialSize) {
+bool lookAtCreation(int flags) {
     if ((flags & userFormats) != 0) {
         refuse(mode, "the flag " + std::to_string(flags & userFormats) +
                          " (a user-defined format) is set");
-    }
-    if ((flags & mapped) != 0 && initialSize > 0 && !isMappable(initialSize)) {
-        refuse(mode, "the flag 16 (NC_MMAP) is set, and there is no memory for " +
-                         std::to_string(initialSize) + " bytes");
     }
     const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
                                          datasets().defaultFormat) != hdf5Formats.end();
@@ -400,9 +409,11 @@ class Guard : public Watcher {
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             dataset.shared = (flags & share) != 0;
+            if (inputs.size() > 3) {
+                lookAtMapping(flags, inputs[3]);
+            }
             if (creates) {
-                dataset.classic =
-                    lookAtCreation(flags, inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0);
+                dataset.classic = lookAtCreation(flags);
             } else {
                 const Header found = lookAtOpening(dataset.path, flags);
                 dataset.file = found.file;

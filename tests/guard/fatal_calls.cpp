@@ -83,6 +83,12 @@ const Fatal rows[] = {
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
      }},
+    {"OpenByMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mode",
+     "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         netcdf("_open", folder.file("a.nc"), 16, 1e15);
+     }},
     {"OpenOfATypeWithoutSize", SIGFPE, "TESSEL:guard:header", "has a variable of the type 12",
      [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); },
      41001},

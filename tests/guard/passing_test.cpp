@@ -45,6 +45,18 @@ const Passing rows[] = {
          netcdf("redef", ncid);
          netcdf("_enddef", ncid, 0, 0, 0, 0);
      }},
+    {"MappedMemoryThatThereIsToReadBy", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         netcdf("close", netcdf("_open", folder.file("a.nc"), 16, 0x1p40)[1]);
+         netcdf("close", netcdf("_open", folder.file("a.nc"), 16, 0x1p63)[1]);
+     }},
+    {"MemoryThatIsNotMapped", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         netcdf("close", netcdf("_open", folder.file("a.nc"), 8, 1e15)[1]);
+         netcdf("close", netcdf("_open", folder.file("a.nc"), 0, 1e15)[1]);
+     }},
     {"LengthsThatAreTooLargeForTheLibrary", "TESSEL:netcdf:endDef:formatSizeConstraintsViolated",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {2, 0x1p62, 2}, data64));
