@@ -87,8 +87,11 @@ ArrayPointer makeShape(tsClassID classID, Dims dims) {
         array->manyDims = std::make_unique<std::size_t[]>(array->ndim);
         room = array->manyDims.get();
     }
-    room[1] = 1;
-    std::copy(dims.begin(), dims.end(), room);
+    room[0] = dims[0]; // as a rule there are two, for which a call of the library's is long
+    room[1] = dims.size() > 1 ? dims[1] : 1;
+    for (std::size_t i = 2; i < dims.size(); ++i) {
+        room[i] = dims[i];
+    }
     array->dims = room;
     return array;
 }

@@ -197,6 +197,31 @@ TEST(Text, CharactersBetweenFewThatAreAscii) {
     }
 }
 
+/// From a mebibyte on, texts are copied by vectors, which end where the text ends or not; and a
+/// character that is not ASCII may stand on either side of each end, or nowhere.
+TEST(Text, Large) {
+    constexpr std::size_t mebibyte = std::size_t{1} << 20U;
+    const Module good(testModule("good"));
+    for (const std::size_t size : {mebibyte - 1, mebibyte, mebibyte + 1, mebibyte + 15}) {
+        for (const std::size_t place :
+             {std::size_t{0}, std::size_t{15}, std::size_t{16}, size / 2, size - 1, size}) {
+            SCOPED_TRACE(testing::Message() << size << ", other at " << place);
+            std::string utf8(size, '\0');
+            for (std::size_t i = 0; i < size; ++i) {
+                utf8[i] = static_cast<char>(1 + i % 127);
+            }
+            std::u16string characters(utf8.begin(), utf8.end());
+            if (place < size) {
+                utf8[place] = '\xe9';
+                characters[place] = u'\u00e9';
+            }
+            const Array text = Array::text(utf8);
+            ASSERT_TRUE(charactersOf(text) == characters);
+            ASSERT_TRUE(charactersOf(good("text", text)[0]) == characters);
+        }
+    }
+}
+
 TEST(Text, ShapeIsNotText) {
     constexpr std::array<std::size_t, 2> dims = {2, 2};
     const Array array = Array::characters(dims);
