@@ -10,6 +10,16 @@ target_compile_options(tessel_warnings INTERFACE
 add_library(tessel_direct_calls INTERFACE)
 target_compile_options(tessel_direct_calls INTERFACE -fno-plt)
 
+# A call passes through many small functions, which can be inlined wherever they stand.
+function(tessel_inline_across_files)
+    if(CMAKE_CXX_COMPILER_ID STREQUAL GNU AND NOT TESSEL_SANITIZE)
+        set_target_properties(${ARGN} PROPERTIES INTERPROCEDURAL_OPTIMIZATION_RELWITHDEBINFO ON)
+        foreach(target ${ARGN})
+            target_compile_options(${target} PRIVATE -fno-semantic-interposition)
+        endforeach()
+    endif()
+endfunction()
+
 add_library(tessel_sanitizers INTERFACE)
 if(TESSEL_SANITIZE)
     set(flags -fsanitize=${TESSEL_SANITIZE} -fno-sanitize-recover=all -fno-omit-frame-pointer)
