@@ -11,6 +11,7 @@
 #include <array>
 #include <cstdio>
 #include <cstring>
+#include <filesystem>
 #include <functional>
 #include <stdexcept>
 #include <string>
@@ -139,6 +140,8 @@ void measureReads(const Module &netcdf, const Dataset &data) {
                 start(), count(), Array::row({1, 1}));
     measureCall("get_vara_text of 10", Ends::well, netcdf, "get_vara_text", ncid, data.text,
                 start(), count());
+    measureCall("get_vars_text of 10", Ends::well, netcdf, "get_vars_text", ncid, data.text,
+                start(), count(), Array::row({1, 1}));
     measureCall("get_att_double of 10", Ends::well, netcdf, "get_att_double", ncid, data.numbers,
                 "range");
     measureCall("get_att_text", Ends::well, netcdf, "get_att_text", ncid, data.numbers, "units");
@@ -158,8 +161,53 @@ void measureWrites(const Module &netcdf, const Dataset &data) {
                 start(), count(), Array::row({1, 1}), ten());
     measureCall("put_vara_text of 10", Ends::well, netcdf, "put_vara_text", ncid, data.text,
                 start(), count(), "ten letter");
+    measureCall("put_att_double of 10", Ends::well, netcdf, "put_att_double", ncid, data.numbers,
+                "range", NC_DOUBLE, ten());
     measureCall("put_att_text", Ends::well, netcdf, "put_att_text", ncid, data.numbers, "units",
                 "miles per an hour");
+}
+
+/// Long texts are copied as wide as the compiler's vectors are, and from a mebibyte on past the
+/// caches. These end within a vector.
+void measureLongTexts(const Module &netcdf, const std::string &file) {
+    struct Length {
+        const char *name;
+        std::size_t characters;
+    };
+    constexpr std::size_t odd = 11;
+    for (const auto &[name, length] : {Length{" of 64 KiB", (std::size_t{1} << 16U) + odd},
+                                       Length{" of 1 MiB", (std::size_t{1} << 20U) + odd}}) {
+        const double ncid = netcdf("create", file, "CLOBBER")[0].number();
+        const auto count = static_cast<double>(length);
+        const double x = netcdf("def_dim", ncid, "x", count)[0].number();
+        const double text = netcdf("def_var", ncid, "text", NC_CHAR, x)[0].number();
+        const Array characters = Array::text(std::string(length, 'x'));
+        netcdf("put_att_text", ncid, text, "note", characters);
+        netcdf("enddef", ncid);
+        const auto measureText = [&, of = name](const char *what, const auto &...arguments) {
+            measure(std::string(what).append(of).c_str(),
+                    [&] { netcdf(what, ncid, text, arguments...); });
+        };
+        measureText("put_vara_text", 0, count, characters);
+        measureText("get_vara_text", 0, count);
+        measureText("put_att_text", "note", characters);
+        measureText("get_att_text", "note");
+        netcdf("close", ncid);
+    }
+}
+
+/// Calls that cannot be made over and over with the same inputs.
+void measureDefinitions(const Module &netcdf, const std::string &file) {
+    const double ncid = netcdf("create", file, "CLOBBER")[0].number();
+    const double x = netcdf("def_dim", ncid, "x", 10)[0].number();
+    std::string name = "vA";
+    measure("def_var, inputs made", [&] {
+        netcdf("def_var", ncid, name, NC_DOUBLE, x);
+        ++name.back(); // none of the characters that follow is refused in a name
+    });
+    netcdf("close", ncid);
+    measure("open and close, inputs made",
+            [&] { netcdf("close", netcdf("open", file, "NOWRITE")[0]); });
 }
 
 void measureErrors(const Module &netcdf, const Dataset &data) {
@@ -198,17 +246,20 @@ void measureAmongMany(const Module &netcdf, const Module &guarded, const std::st
 
 int main() try {
     const test::Folder folder;
+    std::filesystem::current_path(folder.folder()); // a file's name is as long everywhere
     const Module netcdf(TESSEL_NETCDF_MODULE);
-    const Dataset data(netcdf, folder.file("calls.nc"));
+    const Dataset data(netcdf, "calls.nc");
     measureLookup();
     measureInquiries(netcdf, data);
     measureReads(netcdf, data);
     measureWrites(netcdf, data);
+    measureLongTexts(netcdf, "long.nc");
+    measureDefinitions(netcdf, "definitions.nc");
     measureErrors(netcdf, data);
     const Module guarded = netcdf.watchedBy(netcdfGuard({}));
-    const Dataset known(guarded, folder.file("guarded.nc"));
+    const Dataset known(guarded, "guarded.nc");
     measureGuarded(guarded, known);
-    measureAmongMany(netcdf, guarded, folder.file("many.nc"));
+    measureAmongMany(netcdf, guarded, "many.nc");
     netcdf("close", data.ncid);
     guarded("close", known.ncid);
     std::printf("times=%d\n", measured);
