@@ -55,6 +55,12 @@ foreach(extension IN LISTS extensions)
     file(RPATH_REMOVE FILE ${extension})
 endforeach()
 
+# Who installed the package for Python, and takes it away.
+file(GLOB_RECURSE installers ${CPACK_TEMPORARY_DIRECTORY}/python/usr/INSTALLER)
+foreach(installer IN LISTS installers)
+    file(WRITE ${installer} "debian\n")
+endforeach()
+
 # The book: registered, and with the scripts of Sphinx where Debian keeps them.
 set(usr ${CPACK_TEMPORARY_DIRECTORY}/documentation/usr)
 if(NOT EXISTS ${usr}/share/doc/tessel/html/index.html)

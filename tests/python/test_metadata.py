@@ -40,3 +40,10 @@ def test_the_version() -> None:
 def test_the_python_that_it_was_compiled_for() -> None:
     assert metadata.metadata("tessel")["Requires-Python"] == "==" + ".".join(
         platform.python_version_tuple()[:2]) + ".*"
+
+
+def test_who_takes_it_away() -> None:
+    """Not a tool for Python's packages, which would go by a list of files."""
+    found = metadata.distribution("tessel")
+    assert found.read_text("INSTALLER") == "cmake\n"
+    assert found.read_text("RECORD") is None
