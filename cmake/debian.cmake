@@ -63,7 +63,8 @@ debian_package(DOCUMENTATION tessel-doc doc "embeddable host for modules (docume
 "This package has the book in HTML: concepts, how-to pages, and a page for
 every operation with all of its errors.")
 set(CPACK_DEBIAN_DOCUMENTATION_PACKAGE_ARCHITECTURE all)
-set(CPACK_DEBIAN_DOCUMENTATION_PACKAGE_DEPENDS libjs-sphinxdoc)
+# The scripts of the book are links to files of that package, and from this version on it has all.
+set(CPACK_DEBIAN_DOCUMENTATION_PACKAGE_DEPENDS "libjs-sphinxdoc (>= 5.2)")
 
 if(TESSEL_PYTHON)
     include(${CMAKE_SOURCE_DIR}/python/find_python.cmake)
