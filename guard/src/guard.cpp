@@ -3,6 +3,7 @@
 
 #include "datasets.hpp"
 #include "header.hpp"
+#include "names.hpp"
 #include "operations.hpp"
 #include "refusals.hpp"
 
@@ -34,11 +35,14 @@ constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fa
 constexpr int diskless = 0x8;                             // the file is kept in memory
 constexpr int mapped = 0x10;                              // and is that memory
 constexpr int hdf5 = 0x1000;
+constexpr int ofClassicFormats = 0x20 | 0x100 | 0x200; // each of them outweighs the default format
 constexpr int noFill = 0x100;
-constexpr double tooLong = 0x1p63;       // elements, which the library takes for a negative number
-constexpr int share = 0x800;             // others change the file, too
-constexpr std::size_t secondDataset = 4; // among the inputs of copy_att
-constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
+constexpr double tooLong = 0x1p63; // elements, which the library takes for a negative number
+constexpr std::uint64_t alignmentThatWraps = std::uint64_t{1} << 63U;
+constexpr std::uint64_t alignToChunks = UINT64_MAX; // a name for the usual alignment
+constexpr int share = 0x800;                        // others change the file, too
+constexpr std::size_t secondDataset = 4;            // among the inputs of copy_att
+constexpr std::array hdf5Formats = {3, 4};          // as set_default_format has them
 
 Datasets &datasets() {
     static auto &all = *new Datasets; // never destroyed: threads may outlive the end of main
@@ -225,17 +229,38 @@ bool lookAtCreation(int flags) {
     }
     const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
                                          datasets().defaultFormat) != hdf5Formats.end();
-    return (flags & hdf5) == 0 && !hdf5ByDefault;
+    return (flags & hdf5) == 0 && (!hdf5ByDefault || (flags & ofClassicFormats) != 0);
 }
 
 void lookAtAlignment(Inputs inputs, int ncid, const Dataset *dataset, const Ask &ask) {
     if (dataset != nullptr && (!dataset->classic || !dataset->defining)) {
         return;
     }
-    const bool zero = size(inputs[3]) == 0 || size(inputs[5]) == 0;
-    if (zero && ask("inq", ncid)[1].number() > 0) {
-        refuse(alignment, "an alignment is 0");
+    for (const tsArray *const input : {inputs[3], inputs[5]}) {
+        const std::uint64_t given = size(input).value_or(1);
+        const bool wraps = given >= alignmentThatWraps && given != alignToChunks;
+        if ((given == 0 || wraps) && ask("inq", ncid)[1].number() > 0) {
+            refuse(alignment, wraps ? "an alignment is 2^63 or more" : "an alignment is 0");
+        }
     }
+}
+
+/// What there is against a name that a call gives something; "" if nothing. The library refuses one
+/// that is too long by itself, and looks at it before it composes it.
+std::string growingName(const tsArray *given) {
+    constexpr std::size_t mostGrowth = 3;      // of any text
+    constexpr std::size_t mostOfCharacter = 3; // bytes
+    if (tsGetNumberOfElements(given) * mostOfCharacter * mostGrowth <= longestName) {
+        return ""; // as nearly all
+    }
+    const std::optional<std::string> found = text(given);
+    if (!found || found->size() > longestName) {
+        return "";
+    }
+    const std::size_t most = mostComposed(*found);
+    return most <= longestName ? ""
+                               : "a name of " + std::to_string(found->size()) +
+                                     " bytes may become one of " + std::to_string(most);
 }
 
 /// Looks at the dimensions of a variable that is to be defined.
@@ -440,6 +465,9 @@ class Guard : public Watcher {
             datasets().add(
                 *ncid, Datasets::make({})); // so that there is memory to note that its end failed
         }
+        if (const auto place = placeOfNewName(kind)) {
+            lookAtNewName(inputs, *place, ask);
+        }
         if (kind == Kind::tunedEndDefinition) {
             unlessRefused([&] { lookAtAlignment(inputs, *ncid, dataset, ask); });
         } else if (kind == Kind::defineVariable && tsGetClassID(inputs[4]) == tsDOUBLE) {
@@ -456,6 +484,24 @@ class Guard : public Watcher {
                 });
             }
         }
+    }
+
+    /// A name that is given to something. Outside of define mode it may not be longer than the one
+    /// that it takes the place of, and files based on HDF5 refuse it.
+    void lookAtNewName(Inputs inputs, std::size_t place, const Ask &ask) const {
+        const std::string refusable = growingName(inputs[place]);
+        const auto ncid = integer(inputs[kind == Kind::copyAttribute ? secondDataset : 1]);
+        if (refusable.empty() || !ncid) {
+            return;
+        }
+        const Dataset *const dataset = datasets().find(*ncid);
+        if (dataset != nullptr && (!dataset->classic || !dataset->defining)) {
+            return;
+        }
+        unlessRefused([&] {
+            ask("inq", *ncid); // is it there?
+            refuse(name, refusable);
+        });
     }
 
     /// Allocates nothing: what it notes must not be lost.

@@ -33,7 +33,11 @@ constexpr std::array rows = {
     Row{"enddef", Kind::endDefinition, 2},
     Row{"end_def", Kind::endDefinition, 2},
     Row{"_enddef", Kind::tunedEndDefinition, 6},
+    Row{"def_dim", Kind::defineDimension, 4},
     Row{"def_var", Kind::defineVariable, 5},
+    Row{"rename_dim", Kind::rename, 4},
+    Row{"rename_var", Kind::rename, 4},
+    Row{"rename_att", Kind::renameAttribute, 5},
     Row{"set_fill", Kind::setFill, 3},
     Row{"set_default_format", Kind::setDefaultFormat, 2},
     Row{"copy_att", Kind::copyAttribute, 6},
@@ -41,9 +45,20 @@ constexpr std::array rows = {
 
 /// The typed families, whose names end with a type.
 constexpr std::array families = {
-    Row{"put_var1_", Kind::writeElement, 5},
-    Row{"put_vara_", Kind::writeBlock, 6},
+    Row{"put_att_text", Kind::writeAttribute, 5}, Row{"put_att_", Kind::writeAttribute, 6},
+    Row{"put_var1_", Kind::writeElement, 5},      Row{"put_vara_", Kind::writeBlock, 6},
     Row{"put_vars_", Kind::writeStrided, 7},
+};
+
+struct NamePlace {
+    Kind kind;
+    std::size_t input;
+};
+
+constexpr std::array namePlaces = {
+    NamePlace{Kind::defineDimension, 2}, NamePlace{Kind::defineVariable, 2},
+    NamePlace{Kind::rename, 3},          NamePlace{Kind::writeAttribute, 3},
+    NamePlace{Kind::copyAttribute, 3},   NamePlace{Kind::renameAttribute, 4},
 };
 
 constexpr std::string_view longPrefix = "nc_";
@@ -138,6 +153,13 @@ Kind kindOf(Inputs inputs) {
                       [&](const Row &row) { return name.starts_with(row.name); });
     }
     return kindIn(rows, inputs.size(), [&](const Row &row) { return name == row.name; });
+}
+
+std::optional<std::size_t> placeOfNewName(Kind kind) noexcept {
+    const auto *const found =
+        std::find_if(namePlaces.begin(), namePlaces.end(),
+                     [&](const NamePlace &place) { return place.kind == kind; });
+    return found == namePlaces.end() ? std::nullopt : std::optional(found->input);
 }
 
 std::optional<int> integer(const tsArray *input) {

@@ -22,7 +22,11 @@ enum class Kind {
     redefine,
     endDefinition,
     tunedEndDefinition,
+    defineDimension,
     defineVariable,
+    rename, // a dimension or a variable
+    renameAttribute,
+    writeAttribute,
     setFill,
     setDefaultFormat,
     copyAttribute,
@@ -34,6 +38,9 @@ enum class Kind {
 /// The operation that the first input names, if the call has the inputs that the operation wants;
 /// `other` for operations without interest, and for calls that the module refuses itself.
 Kind kindOf(Inputs inputs);
+
+/// Where a call has the name that it gives something; nothing for one that gives none.
+std::optional<std::size_t> placeOfNewName(Kind kind) noexcept;
 
 /// An element a dimension.
 using Indices = std::vector<std::uint64_t>;

@@ -15,9 +15,10 @@ struct Refusal {
 
 // clang-format off
 inline constexpr Refusal
-    alignment = {"TESSEL:guard:alignment", "the library divides by the alignment of the data and of the records, which must be at least 1 (4 is the usual one)"},
+    alignment = {"TESSEL:guard:alignment", "the library divides by the alignment of the data and of the records and multiplies by it again, so that it must be at least 1 and below 2^63 (4 is the usual one)"},
     mode      = {"TESSEL:guard:mode",      "the library follows an invalid pointer when it is given this mode flag without what belongs to it"},
     closed    = {"TESSEL:guard:closed",    "an earlier closing of the dataset failed, and the library may have freed its memory but not its id"},
+    name      = {"TESSEL:guard:name",      "the library stores a name as it is composed, and copies it over the end of buffers of the size that its documentation gives"},
     lengths   = {"TESSEL:guard:lengths",   "the library would take the length for a negative number, divide by zero, or lay variables over one another"},
     counts    = {"TESSEL:guard:counts",    "the library would write what is beyond the data, or for ever"},
     records   = {"TESSEL:guard:records",   "every record before it would be filled first; with set_fill(ncid, NC_NOFILL) they are left as they are"},

@@ -807,13 +807,18 @@ HOST: dict[str, str] = {
 GUARD: dict[str, str] = {
     "TESSEL:guard:alignment":
         "The call was not made: <particulars>, and the library divides by the alignment "
-        "of the data and of the records, which must be at least 1 (4 is the usual one).",
+        "of the data and of the records and multiplies by it again, so that it must be "
+        "at least 1 and below 2^63 (4 is the usual one).",
     "TESSEL:guard:mode":
         "The call was not made: <particulars>, and the library follows an invalid "
         "pointer when it is given this mode flag without what belongs to it.",
     "TESSEL:guard:closed":
         "The call was not made: <particulars>, and an earlier closing of the dataset "
         "failed, and the library may have freed its memory but not its id.",
+    "TESSEL:guard:name":
+        "The call was not made: <particulars>, and the library stores a name as it is "
+        "composed, and copies it over the end of buffers of the size that its "
+        "documentation gives.",
     "TESSEL:guard:lengths":
         "The call was not made: <particulars>, and the library would take the length for "
         "a negative number, divide by zero, or lay variables over one another.",

@@ -343,14 +343,17 @@ _HOST = {
 # The guard, TESSEL:guard:*.
 _GUARD = {
     "alignment": (
-        "_enddef has an alignment of 0, by which the library divides.",
-        "Give an alignment of at least 1; 4 is the usual one."),
+        "_enddef has an alignment of 0, by which the library divides, or of 2^63 or more.",
+        "Give an alignment of at least 1 and below 2^63; 4 is the usual one."),
     "mode": (
         "The mode has a flag that makes the library follow an invalid pointer.",
         "Leave the flags for files in memory and for user-defined formats out."),
     "closed": (
         "An earlier closing of the dataset failed; the library may have freed it, but not its id.",
         "Do not use the id again; open the file anew."),
+    "name": (
+        "The name may become longer than the library's limit when its letters are composed.",
+        "Shorten the name, or give it composed (Unicode's form NFC)."),
     "lengths": (
         "A dimension of the variable is longer than the library counts.",
         "Look at where the length comes from: a file has room for fewer elements."),
@@ -383,7 +386,7 @@ _PYTHON = {
         "A module is named by nothing that can be a name or a path.",
         "Give a name such as netcdf, or a pathlib.Path for a file."),
     "badPath": (
-        "A path has a NUL, or bytes that are no UTF-8, or a new file's is empty.",
+        "A path has a NUL, or bytes that are no UTF-8, or a new file's is empty or an address.",
         "Rename the file, or link to it."),
     "badShape": (
         "A shape does not fit what it is for.", "Look at the message, which has both shapes."),

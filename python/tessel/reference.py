@@ -232,6 +232,7 @@ def _refused(operation: Operation) -> Iterator[Raised]:
         "remote": operation.opens, "mode": operation.opens,
         "header": short in ("open", "_open", "sync"),
         "alignment": short == "_enddef",
+        "name": short.startswith(("def_", "rename_", "put_att_", "copy_att")),
         "lengths": short == "def_var",
         "counts": short.startswith(("put_vara_", "put_vars_")),
         "records": short.startswith(("put_var1_", "put_vara_", "put_vars_")),

@@ -115,20 +115,24 @@ void keepInFolder(const Array &name) {
 
 /// Whether a call asks for a file that is based on HDF5. One whose closing fails stays open within
 /// HDF5, which needs its descriptor until the process ends, and the next run would find it open.
-bool asksForHdf5(std::string_view operation, const std::vector<Array> &inputs) {
-    const bool creates = operation.ends_with("create") && inputs.size() > 2;
-    const bool chooses = operation.ends_with("set_default_format") && inputs.size() > 1;
-    if (!creates && !chooses) {
+bool asksForHdf5(std::string_view operation, const std::vector<Array> &inputs, bool byDefault) {
+    if (!operation.ends_with("create") || inputs.size() <= 2) {
         return false;
     }
-    const Array &input = inputs[creates ? 2 : 1];
-    if ((input.classID() != tsDOUBLE && input.classID() != tsINT32) || input.size() == 0) {
-        return false;
-    }
-    const double value = input.number();
+    const Array &mode = inputs[2];
+    const bool numeric = mode.classID() == tsDOUBLE || mode.classID() == tsINT32;
+    const auto flags = static_cast<unsigned>(
+        numeric && mode.size() > 0 ? nearest<std::int32_t>(mode.number()) : 0);
     constexpr unsigned hdf5 = 0x1000;
-    return creates ? (static_cast<unsigned>(nearest<std::int32_t>(value)) & hdf5) != 0
-                   : value >= 3 && value < 5;
+    constexpr unsigned outweighingTheDefault = 0x20 | 0x100 | 0x200;
+    return (flags & hdf5) != 0 || (byDefault && (flags & outweighingTheDefault) == 0);
+}
+
+/// Whether files are based on HDF5 unless their flags say otherwise.
+bool isHdf5TheDefault(const tessel::Module &netcdf) {
+    const int format = lastNumber(called(netcdf, "set_default_format", 1).results);
+    called(netcdf, "set_default_format", format);
+    return format == 3 || format == 4;
 }
 
 /// An operation's name as the module reads it.
@@ -193,7 +197,7 @@ class Session {
         if (opens && held.size() > 1) {
             keepInFolder(held[1]);
         }
-        if (asksForHdf5(name, held) || (inMemory && needsMuch(name, held))) {
+        if (asksForHdf5(name, held, hdf5ByDefault) || (inMemory && needsMuch(name, held))) {
             return "left out";
         }
         std::vector<const tsArray *> inputs(held.size());
@@ -205,7 +209,10 @@ class Session {
                                : outcome.identifier;
         note(came);
         noteEnd(name, came);
-        changesFormat = changesFormat || name.ends_with("set_default_format");
+        if (name.ends_with("set_default_format")) {
+            changesFormat = true;
+            hdf5ByDefault = isHdf5TheDefault(netcdf);
+        }
         if (opens && outcome.identifier.empty()) {
             opened.push_back(lastNumber(outcome.results));
         }
@@ -260,6 +267,7 @@ class Session {
     std::vector<int> opened;
     Scratch::Left left = Scratch::Left::nothing;
     bool changesFormat = false;
+    bool hdf5ByDefault = false;
 };
 
 } // namespace

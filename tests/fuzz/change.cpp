@@ -134,6 +134,8 @@ constexpr std::array createFlags = {0,    0,     0,     4,     512,    512,    3
 constexpr std::array openFlags = {0,  0, 1,   1,  1,   2048, 2049,  8,    9,
                                   16, 4, 512, 64, 128, 512,  32768, 8192, 65536};
 constexpr std::array<std::string_view, 8> names = {"x", "y", "t", "v", "w", "a", "_FillValue", ""};
+// Letters that are longer when they are composed, alone or one behind the other.
+constexpr std::array growingLetters = {0x344, 0x344, 0x958, 0xFB2C, 0x1D5, 0x323};
 constexpr std::array<std::string_view, 6> paths = {"0.nc", "0.nc", "1.nc", "1.nc", "2.nc", ""};
 constexpr std::array<std::string_view, 6> modeWords = {"CLOBBER", "NOCLOBBER", "WRITE",
                                                        "NOWRITE", "nc_write",  "SHARE"};
@@ -264,10 +266,16 @@ class Author {
             return characters(chance.oneOf(list));
         }
         Value value = characters("");
-        const std::size_t n = chance.percent(80) ? chance.below(6) : 250 + chance.below(20);
+        const bool grows = chance.percent(10);
+        std::size_t n = chance.percent(80) ? chance.below(6) : 250 + chance.below(20);
+        n = grows ? 30 + chance.below(100) : n;
         for (std::size_t i = 0; i < n; ++i) {
-            value.elements.push_back(static_cast<double>(
-                chance.percent(70) ? 'a' + chance.below(3) : chance.below(0x10000)));
+            if (grows) {
+                value.elements.push_back(chance.oneOf(growingLetters));
+            } else {
+                value.elements.push_back(static_cast<double>(
+                    chance.percent(70) ? 'a' + chance.below(3) : chance.below(0x10000)));
+            }
         }
         value.dims[1] = n;
         return value;

@@ -46,6 +46,20 @@ int definingDataset(const Module &netcdf, const Folder &folder) {
     return ncid;
 }
 
+/// A dataset that is created with these flags while the default is another format.
+int datasetWithDefault(const Module &netcdf, const Folder &folder, int format, int flags) {
+    const int former = intOf(netcdf("set_default_format", format));
+    const int ncid = newDataset(netcdf, folder.file("a.nc"), flags);
+    netcdf("set_default_format", former);
+    return ncid;
+}
+
+void alignWithDefault(const Module &netcdf, const Folder &folder, int format, int flags) {
+    const int ncid = datasetWithDefault(netcdf, folder, format, flags);
+    netcdf("redef", ncid);
+    netcdf("_enddef", ncid, 0, 0, 0, 4);
+}
+
 const Fatal rows[] = {
     {"AlignmentOfTheData", SIGFPE, "TESSEL:guard:alignment",
      "an alignment is 0, and the library divides",
@@ -55,6 +69,34 @@ const Fatal rows[] = {
     {"AlignmentOfTheRecords", SIGFPE, "TESSEL:guard:alignment", "an alignment is 0",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("nc__enddef", definingDataset(netcdf, folder), 0, 4, 0, 0.5);
+     }},
+    {"AlignmentOfA64BitFileWhenHdf5IsTheDefault", SIGFPE, "TESSEL:guard:alignment",
+     "an alignment is 0",
+     [](const Module &netcdf, const Folder &folder) { alignWithDefault(netcdf, folder, 3, 512); }},
+    {"AlignmentOfAFileOf64BitDataWhenHdf5IsTheDefault", SIGFPE, "TESSEL:guard:alignment",
+     "an alignment is 0",
+     [](const Module &netcdf, const Folder &folder) {
+         alignWithDefault(netcdf, folder, 4, data64);
+     }},
+    {"AlignmentOfAClassicFileWhenHdf5IsTheDefault", SIGFPE, "TESSEL:guard:alignment",
+     "an alignment is 0",
+     [](const Module &netcdf, const Folder &folder) {
+         alignWithDefault(netcdf, folder, 3, 256 + share);
+     }},
+    {"AnElementFarBeyondTheRecordsWhenHdf5IsTheDefault", SIGXFSZ, "TESSEL:guard:records",
+     "ends at record 4000000000",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = datasetWithDefault(netcdf, folder, 3, 512);
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
+     }},
+    {"CloseAfterACloseThatFailedWhenHdf5IsTheDefault", SIGSEGV,
+     "TESSEL:netcdf:close:invalidDataType", "Close operation failed",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("set_default_format", 4);
+         const int ncid = unclosable(netcdf, folder, 256);
+         netcdf("set_default_format", 1);
+         wantError("TESSEL:netcdf:close:invalidDataType", [&] { netcdf("close", ncid); });
+         netcdf("close", ncid);
      }},
     {"CreateWithAUserFormat", SIGSEGV, "TESSEL:guard:mode",
      "the flag 64 (a user-defined format) is set",
@@ -116,6 +158,47 @@ const Fatal rows[] = {
                 0);
      },
      41001},
+    {"ADimensionsNameThatGrows", SIGSEGV, "TESSEL:guard:name",
+     "a name of 256 bytes may become one of 768",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
+         netcdf("def_dim", ncid, repeated(growing, 128), 3);
+         netcdf("inq_dim", ncid, 0);
+     }},
+    {"ADimensionsNewNameThatGrows", SIGSEGV, "TESSEL:guard:name", "over the end of buffers",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingDataset(netcdf, folder);
+         netcdf("rename_dim", ncid, 0, repeated(growing, 128));
+         netcdf("inq_dim", ncid, 0);
+     }},
+    {"AnAttributesNameThatGrows", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingDataset(netcdf, folder);
+         netcdf("put_att_double", ncid, 0, repeated(growing, 128), ncDouble, 1);
+         netcdf("inq_attname", ncid, 0, 0);
+     }},
+    {"ATextAttributesNameThatGrows", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingDataset(netcdf, folder);
+         netcdf("nc_put_att_text", ncid, global, repeated(growing, 128), "text");
+         netcdf("inq_attname", ncid, global, 0);
+     }},
+    {"AnAttributesNewNameThatGrows", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingDataset(netcdf, folder);
+         netcdf("put_att_text", ncid, global, "a", "text");
+         netcdf("rename_att", ncid, global, "a", repeated(growing, 128));
+         netcdf("inq_attname", ncid, global, 0);
+     }},
+    {"ACopiedAttributesNameThatGrew", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
+     [](const Module &netcdf, const Folder &folder) {
+         const Module plain = plainModule();
+         const int source = intOf(plain("create", folder.file("b.nc"), 0));
+         plain("put_att_text", source, global, repeated(growing, 128), "text");
+         const int ncid = definingDataset(netcdf, folder);
+         netcdf("copy_att", source, global, repeated(growing, 128), ncid, global);
+         netcdf("inq_attname", ncid, global, 0);
+     }},
     {"NameWhoseLengthTheFileEndsIn", SIGSEGV, "TESSEL:guard:header", "characters in a name",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),

@@ -6,8 +6,10 @@
 #include <algorithm>
 #include <array>
 #include <fstream>
+#include <initializer_list>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace tessel::test {
@@ -59,10 +61,19 @@ std::optional<std::size_t> knownWith(const std::string &operation) {
     return std::nullopt;
 }
 
+bool beginsWithAny(std::string_view operation, std::initializer_list<std::string_view> prefixes) {
+    return std::any_of(prefixes.begin(), prefixes.end(),
+                       [&](std::string_view prefix) { return operation.starts_with(prefix); });
+}
+
 /// What writes is told where, but for attributes and whole variables.
 bool isToldWhere(std::string_view operation) {
-    const auto begins = [&](std::string_view prefix) { return operation.starts_with(prefix); };
-    return begins("put_") && !begins("put_att_") && !begins("put_var_");
+    return beginsWithAny(operation, {"put_"}) &&
+           !beginsWithAny(operation, {"put_att_", "put_var_"});
+}
+
+bool givesName(std::string_view operation) {
+    return beginsWithAny(operation, {"def_", "rename_", "put_att_", "copy_att"});
 }
 
 TEST(Kinds, EveryOperationThatIsToldWhereToWriteIsKnown) {
@@ -71,11 +82,24 @@ TEST(Kinds, EveryOperationThatIsToldWhereToWriteIsKnown) {
         if (isToldWhere(operation)) {
             EXPECT_TRUE(knownWith(operation)) << operation;
             ++writing;
-        } else if (operation.starts_with("put_")) {
+        } else if (operation.starts_with("put_var_")) {
             EXPECT_FALSE(knownWith(operation)) << operation;
         }
     }
     EXPECT_GE(writing, 21);
+}
+
+TEST(Kinds, EveryOperationThatGivesANameIsKnown) {
+    int giving = 0;
+    for (const std::string &operation : operations()) {
+        const auto inputs = knownWith(operation);
+        const auto place =
+            guard::placeOfNewName(inputs ? Call(operation, *inputs).kind() : Kind::other);
+        EXPECT_EQ(place.has_value(), givesName(operation)) << operation;
+        EXPECT_LT(place.value_or(0), inputs.value_or(1)) << operation;
+        giving += givesName(operation) ? 1 : 0;
+    }
+    EXPECT_GE(giving, 13);
 }
 
 TEST(Kinds, WhatIsKnownHasTheInputsThatTheModuleWants) {
@@ -89,7 +113,7 @@ TEST(Kinds, WhatIsKnownHasTheInputsThatTheModuleWants) {
             ++known;
         }
     }
-    EXPECT_GE(known, 35);
+    EXPECT_GE(known, 46);
 }
 
 } // namespace

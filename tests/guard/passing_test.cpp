@@ -22,6 +22,15 @@ void PrintTo(const Passing &row, std::ostream *out) {
     *out << row.name;
 }
 
+/// Defines a variable of this name.
+void definingName(const Module &netcdf, const Folder &folder, const std::string &name,
+                  int flags = 0) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), flags));
+    netcdf("def_dim", ncid, "x", 3);
+    netcdf("def_var", ncid, name, ncDouble, 0);
+    netcdf("close", ncid);
+}
+
 const Passing rows[] = {
     {"AlignmentBeforeAnyVariable", "",
      [](const Module &netcdf, const Folder &folder) {
@@ -56,6 +65,42 @@ const Passing rows[] = {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
          netcdf("close", netcdf("_open", folder.file("a.nc"), 8, 1e15)[1]);
          netcdf("close", netcdf("_open", folder.file("a.nc"), 0, 1e15)[1]);
+     }},
+    {"AlignmentOfAnHdf5FileByDefaultWithOtherFlags", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int former = intOf(netcdf("set_default_format", 4));
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 8192);
+         netcdf("set_default_format", former);
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, 0, 0, 0);
+     }},
+    {"AlignmentOfAnHdf5FileOfTheClassicModel", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 4096 + 256);
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, 0, 0, 0);
+     }},
+    {"AlignmentToChunks", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const Array chunks = Array::numeric(tsUINT64, std::array<std::size_t, 2>{1, 1});
+         chunks.elements<std::uint64_t>()[0] = UINT64_MAX;
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 512);
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, chunks, 0, chunks);
+         netcdf("put_var1_double", ncid, 0, 9, 7);
+         netcdf("close", ncid);
+         const int again = intOf(netcdf("open", folder.file("a.nc"), "NOWRITE"));
+         EXPECT_EQ(netcdf("get_var1_double", again, 0, 9)[0].number(), 7);
+     }},
+    {"AlignmentJustBelow2To63", "TESSEL:netcdf:pEndDef:invalidArgument",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"), 512);
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, 0x1p63 - 1024, 0, 4);
+     }},
+    {"AlignmentOf2To63BeforeAnyVariable", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_enddef", intOf(netcdf("create", folder.file("a.nc"), 0)), 0, 0x1p63, 0, 0x1p63);
      }},
     {"LengthsThatAreTooLargeForTheLibrary", "TESSEL:netcdf:endDef:formatSizeConstraintsViolated",
      [](const Module &netcdf, const Folder &folder) {
@@ -149,6 +194,65 @@ const Passing rows[] = {
          const int ncid = newDataset(netcdf, folder.file("a.nc"), 4096);
          netcdf("put_var1_double", ncid, 1, Array::row({0, 4e9}), 1);
      }},
+    {"ALongNameThatGrowsLittle", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("x", 130) + repeated(growing, 21));
+     }},
+    {"ALongNameOfJapanese", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\u6C34\u6E29\u304C\u30C7", 21));
+     }},
+    {"ALongNameOfJapaneseInParts", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\u304B\u3099\u30C6\u3099", 21));
+     }},
+    {"ALongNameOfKorean", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\uD55C\uAE00\uAC01", 28));
+     }},
+    {"ALongNameOfKoreanInParts", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\u1112\u1161\u11AB\u1100", 21));
+     }},
+    {"ALongNameOfAncientGreek", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\u1F82\u0390\u1FB7\u1F00", 22));
+     }},
+    {"ALongNameOfRussianInParts", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\u0441\u0438\u0306\u0442\u043E\u0432", 21));
+     }},
+    {"ALongNameOfVietnameseInParts", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("a\u0323\u0302u\u031B\u0301n", 23));
+     }},
+    {"ALongNameOfVietnamese", "",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated("\u1EAD\u1EE9n", 36));
+     }},
+    {"ANameThatIsTooLongAndGrows", "TESSEL:netcdf:defVar:maximumNameLengthExceeded",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated(growing, 129));
+     }},
+    {"ANameThatGrowsInAnHdf5File", "TESSEL:netcdf:defVar:maximumNameLengthExceeded",
+     [](const Module &netcdf, const Folder &folder) {
+         definingName(netcdf, folder, repeated(growing, 128), 4096);
+     }},
+    {"ANewNameThatGrowsOutsideOfDefineMode",
+     "TESSEL:netcdf:renameVar:operationNotAllowedInDataMode",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("rename_var", ncid, 0, repeated(growing, 128));
+     }},
+    {"ANameThatGrowsInNoDataset", "TESSEL:netcdf:defDim:notNetcdfID",
+     [](const Module &netcdf, const Folder & /*folder*/) {
+         netcdf("def_dim", 0x7FFF0000, repeated(growing, 128), 3);
+     }},
+    {"ANameThatGrowsOfWhichNothingIs", "TESSEL:netcdf:inqVarID:variableNotFound",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("inq_varid", ncid, repeated(growing, 128));
+     }},
     {"AWordInsteadOfADataset", "TESSEL:netcdf:badIDDatatype",
      [](const Module &netcdf, const Folder & /*folder*/) { netcdf("close", "all"); }},
 };
@@ -165,6 +269,83 @@ TEST_P(PassingCall, IsAnsweredByTheModule) {
 
 INSTANTIATE_TEST_SUITE_P(Rows, PassingCall, testing::ValuesIn(rows),
                          [](const auto &row) { return row.param.name; });
+
+/// One value is written to a variable with these alignments; those of the library instead of what
+/// is refused. The identifier of what refuses them.
+std::string writtenWithAlignments(const Module &netcdf, const std::string &file, int flags,
+                                  bool records, double alignment) {
+    const int ncid = intOf(netcdf("create", file, flags));
+    netcdf("def_dim", ncid, "x", records ? 0 : 3);
+    netcdf("def_var", ncid, "v", ncDouble, 0);
+    const std::string refused = identifierOf(
+        [&] { netcdf("_enddef", ncid, 0, records ? 4 : alignment, 0, records ? alignment : 4); });
+    if (!refused.empty()) {
+        netcdf("enddef", ncid);
+    }
+    netcdf("put_var1_double", ncid, 0, 0, 7);
+    netcdf("close", ncid);
+    return refused;
+}
+
+/// What is written goes over the header, and nothing says so.
+TEST(Alignment, Of2To63OrMoreIsRefused) {
+    const Folder folder;
+    const std::string file = folder.file("a.nc");
+    const auto open = [&] { plainModule()("open", file, "NOWRITE"); };
+    for (const double alignment : {0x1p63, 0x1p64 - 2048, 1e300}) {
+        for (const int flags : {0, 512, data64}) {
+            for (const bool records : {false, true}) {
+                const auto write = [&](const Module &netcdf) {
+                    return writtenWithAlignments(netcdf, file, flags, records, alignment);
+                };
+                EXPECT_EQ(write(plainModule()), "");
+                EXPECT_TRUE(identifierOf(open).starts_with("TESSEL:netcdf:open:"))
+                    << alignment << " " << flags << " " << records;
+                EXPECT_EQ(write(guardedModule()), "TESSEL:guard:alignment");
+                EXPECT_EQ(identifierOf(open), "");
+            }
+        }
+    }
+}
+
+/// Dimensions and attributes of such names end a process; a variable of one only makes a file that
+/// the guard itself refuses.
+TEST(Names, OfVariablesThatGrow) {
+    const Folder folder;
+    definingName(plainModule(), folder, repeated(growing, 128));
+    const Module netcdf = guardedModule();
+    EXPECT_EQ(identifierOf([&] { netcdf("open", folder.file("a.nc"), "NOWRITE"); }),
+              "TESSEL:guard:header");
+    EXPECT_EQ(identifierOf([&] { definingName(netcdf, folder, repeated(growing, 128)); }),
+              "TESSEL:guard:name");
+    const int ncid = definingVariable(netcdf, folder, ncDouble, {3});
+    EXPECT_EQ(identifierOf([&] { netcdf("rename_var", ncid, 0, repeated(growing, 128)); }),
+              "TESSEL:guard:name");
+    netcdf("close", ncid);
+}
+
+TEST(Names, GrowUpToTheLimit) {
+    const Folder folder;
+    const Module netcdf = guardedModule();
+    const int ncid = definingVariable(netcdf, folder, ncDouble, {3});
+    const auto rename = [&](std::string_view letter, std::size_t times, std::size_t others) {
+        const std::string name = repeated("x", others) + repeated(letter, times);
+        return identifierOf([&] { netcdf("rename_dim", ncid, 0, name); });
+    };
+    // Three times as long at most, and twice as long in truth, but for the last.
+    EXPECT_EQ(rename(growing, 42, 4), "");
+    EXPECT_EQ(rename(growing, 42, 5), "TESSEL:guard:name");
+    EXPECT_EQ(rename("\u0958", 28, 4), "");
+    EXPECT_EQ(rename("\u0958", 28, 5), "TESSEL:guard:name");
+    EXPECT_EQ(rename("\U0001D160", 21, 4), "");
+    EXPECT_EQ(rename("\U0001D160", 21, 5), "TESSEL:guard:name");
+    // A mark that takes the place of the letter's own.
+    EXPECT_EQ(rename("\u01D5\u0323", 36, 4), "");
+    EXPECT_EQ(netcdf("inq_dim", ncid, 0)[0].utf8().size(), 4 + 36 * 7U) << "from 2 and 2 bytes";
+    EXPECT_EQ(rename("\u01D5\u0323", 36, 5), "TESSEL:guard:name");
+    EXPECT_EQ(rename("U\u0323\u0308\u0304", 36, 3), "") << "in parts from the beginning";
+    netcdf("close", ncid);
+}
 
 TEST(Records, FillUpToTheLimit) {
     const Folder folder;

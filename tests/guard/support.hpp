@@ -91,9 +91,21 @@ inline std::string words(std::initializer_list<std::uint32_t> values) {
     return bytes;
 }
 
+/// A letter with marks of two bytes, which is always written as two of them.
+constexpr std::string_view growing = "\u0344";
+
+inline std::string repeated(std::string_view text, std::size_t times) {
+    std::string all;
+    while (times-- > 0) {
+        all += text;
+    }
+    return all;
+}
+
 constexpr double ncDouble = 6;
 constexpr double noFill = 256; // of set_fill
 constexpr double ncInt = 4;
+constexpr double global = -1; // in the place of a variable
 constexpr double ncChar = 2;
 constexpr int data64 = 32; // of create
 
@@ -126,8 +138,8 @@ inline int definingVariable(const Module &netcdf, const Folder &folder, double t
 }
 
 /// In define mode, which it cannot leave: the fill value has two values instead of one.
-inline int unclosable(const Module &netcdf, const Folder &folder) {
-    const int ncid = definingVariable(netcdf, folder, ncInt, {3});
+inline int unclosable(const Module &netcdf, const Folder &folder, int flags = 0) {
+    const int ncid = definingVariable(netcdf, folder, ncInt, {3}, flags);
     netcdf("put_att_double", ncid, 0, "_FillValue", ncInt, Array::row({1, 2}));
     return ncid;
 }

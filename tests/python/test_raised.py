@@ -164,6 +164,8 @@ REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
     ("mode", {"cmode": 64}),
     ("header", {"path": "overwritten.nc", "mode": "NOWRITE", "ncid": overwritten}),
     ("alignment", {"ncid": defining, "v_align": 0, "r_align": 0}),
+    ("name", {"ncid": defining, "ncid_out": defining,
+              "name": "\u0344" * 128, "newname": "\u0344" * 128}),
     ("lengths", {"ncid": enormous, "dimids": 0}),
     ("counts", {"start": [1, 0], "count": [-1, -1], "stride": [2, 1], "index": [1, 0]}),
     ("records", {"varid": 6, "index": [2**40],

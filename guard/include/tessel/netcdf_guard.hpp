@@ -24,10 +24,13 @@ struct GuardOptions {
 /// names. The guard is a watcher which refuses these calls, and no others, with an Error that says
 /// why:
 ///
-/// - "TESSEL:guard:alignment": a tuned enddef with an alignment of 0, which divides by zero
+/// - "TESSEL:guard:alignment": a tuned enddef with an alignment of 0, which divides by zero, or
+///   of 2^63 or more, which puts the data over the header
 /// - "TESSEL:guard:mode": a mode flag that makes create or open follow an invalid pointer
 /// - "TESSEL:guard:closed": anything with a dataset that is based on HDF5, or was opened without
 ///   the guard, and whose closing failed: its memory may be freed
+/// - "TESSEL:guard:name": a name that may become longer than NC_MAX_NAME, 256 bytes, when its
+///   letters are composed (Unicode's form NFC), in a classic file
 /// - "TESSEL:guard:lengths": a variable over a dimension of 2^63 elements or more
 /// - "TESSEL:guard:counts": a write of counts that multiply to more than 64 bits hold
 /// - "TESSEL:guard:records": a write that would first fill more bytes than GuardOptions::fillLimit
