@@ -4,6 +4,7 @@
 from __future__ import annotations
 
 import contextlib
+import errno
 import os
 import secrets
 import stat
@@ -65,12 +66,17 @@ def written_aside(target: paths.Path, *, overwrite: bool = False,
     given = paths.given(target)
     if not given:
         raise tessel.Error("TESSEL:python:badPath", "The target has no name.")
+    if paths.is_address(given):
+        raise tessel.Error("TESSEL:python:badPath",
+                           f"The target is an address, and no file can be made there: {given}")
     wanted = paths.absolute(given)
     _judge(wanted, overwrite, source)
     # Where the folder is not there, `realpath` makes up another; the name that was given then fails
     # as it should.
     real = paths.given(os.path.realpath(wanted) if os.path.isdir(os.path.dirname(wanted))
                        else wanted)
+    if os.path.islink(real):
+        raise OSError(errno.ELOOP, os.strerror(errno.ELOOP), given)
     temporary = os.path.join(os.path.dirname(real), f".tessel-{secrets.token_hex(8)}.part")
     try:
         with paths.called(temporary, wanted):

@@ -246,7 +246,12 @@ class Dataset:
         return {name: self._attribute(varid, name) for name in names}
 
     def _attribute(self, varid: int, name: str) -> Attribute:
-        kind = external_type(int(self.call("inq_att", varid, name)[0][0, 0]))
+        try:
+            kind = external_type(int(self.call("inq_att", varid, name)[0][0, 0]))
+        except tessel.Error as error:  # a name that is not UTF-8 in the file cannot be asked for
+            if error.word != "attributeNotFound":
+                raise
+            return Attribute(name, ExternalType(0, "type unknown"), error)
         try:
             value = self.call(f"get_att_{kind.member or 'text'}", varid, name)
         except tessel.Error as error:

@@ -21,6 +21,9 @@ Path = Union[str, bytes, os.PathLike[str], os.PathLike[bytes]]
 _UP = re.compile(r"/+\.\.(?:/+|\Z)")
 """The first of these in a path is where it leads upwards."""
 
+_SCHEME = re.compile(r"(?:\[[^]]*\])*[A-Za-z0-9.+-]+://")
+"""What an address begins with, behind any parameters in brackets."""
+
 _BLANKS = "".join(map(chr, range(1, 33)))
 """What the library skips at the beginning of a path."""
 
@@ -45,6 +48,11 @@ def given(path: Any) -> str:
         raise Error("TESSEL:python:badPath", "The path is not UTF-8, and the module takes no "
                     f"other: {text!r}", path=absolute(text)) from None
     return f"./{text}" if text[:1] in _BLANKS and text else text
+
+
+def is_address(path: str) -> bool:
+    """Whether the library would take a path for an address."""
+    return _SCHEME.match(path) is not None
 
 
 def taken(path: Any) -> str:

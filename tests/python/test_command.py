@@ -570,3 +570,16 @@ def test_the_program_looks_into_no_current_folder(field, tmp_path):
                               capture_output=True, text=True, check=False)
         assert (done.returncode, done.stderr) == (0, "")
         assert "float t(time, z, y, x)" in done.stdout
+
+
+def test_an_attribute_that_cannot_be_asked_for(capsys, tmp_path) -> None:
+    """Its name is not UTF-8 in the file: it is shown, with what the library says of it."""
+    path = Path(generate(tmp_path / "odd.nc", """dimensions: x = 2 ;
+        variables: float v(x) ; v:aaaa = "bbbb" ; v:units = "m" ;
+        data: v = 1, 2 ;"""))
+    path.write_bytes(path.read_bytes().replace(b"aaaa", b"a\x9baa"))
+    status, out, _ = run(capsys, "info", str(path), "v")
+    assert status == 0 and "units" in out and "(type unknown) Attribute inquiry failed" in out
+    status, _, err = run(capsys, "copy", str(path), str(tmp_path / "copy.nc"))
+    assert status != 0 and "Attribute not found" in err
+    assert not (tmp_path / "copy.nc").exists()

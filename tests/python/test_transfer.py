@@ -3,6 +3,7 @@
 
 from __future__ import annotations
 
+import errno
 import io
 import itertools
 import math
@@ -544,6 +545,31 @@ def test_a_link_stays_one(everything, tmp_path):
     real.unlink()
     assert identifier_of(lambda: tessel.copy(everything, link)) == "TESSEL:python:fileExists"
     assert os.listdir(folder) == []
+
+
+def test_a_link_to_itself_is_kept(everything, tmp_path):
+    loop = tmp_path / "loop"
+    loop.symlink_to("loop")
+    with pytest.raises(OSError) as caught:
+        tessel.copy(everything, loop, overwrite=True)
+    assert (caught.value.errno, caught.value.filename) == (errno.ELOOP, str(loop))
+    assert os.readlink(loop) == "loop"
+
+
+@pytest.mark.parametrize("target", ["http://127.0.0.1:1/x.nc", "[mode=x]s3://b/x.nc",
+                                    "file:///x.nc"])
+def test_a_target_that_is_an_address(everything, target):
+    with pytest.raises(tessel.Error) as caught:
+        tessel.copy(everything, target)
+    assert caught.value.identifier == "TESSEL:python:badPath"
+    assert target in str(caught.value) and ".tessel-" not in str(caught.value)
+
+
+def test_a_target_in_a_folder_like_an_address(everything, tmp_path, monkeypatch):
+    monkeypatch.chdir(tmp_path)
+    (tmp_path / "http:").mkdir()
+    tessel.copy(everything, "./http://x.nc")
+    assert dump(tmp_path / "http:" / "x.nc") == dump(everything)
 
 
 def test_a_target_that_is_no_file(everything, tmp_path):
