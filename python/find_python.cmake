@@ -16,7 +16,7 @@ if(NOT Python3_EXECUTABLE)
     endforeach()
     if(NOT Python3_EXECUTABLE)
         message(FATAL_ERROR "No python3 with NumPy among ${candidates}: install python3-numpy, "
-                            "give -DPython3_EXECUTABLE=..., or leave the Python front out with "
+                            "give -DPython3_EXECUTABLE=..., or leave the Python package out with "
                             "-DTESSEL_PYTHON=OFF")
     endif()
 endif()

@@ -26,8 +26,8 @@ ROOT = Path(__file__).resolve().parents[1]
 DOCS = ROOT / "docs"
 
 # Where the documents of docs/ stand in the book; others are in "inside".
-CHAPTERS = {"order.md": "concepts", "threads.md": "howto", "xarray.md": "howto",
-            "xarray-writing.md": "howto"}
+CHAPTERS = {"order.md": "concepts", "formats.md": "concepts", "threads.md": "howto",
+            "xarray.md": "howto", "xarray-writing.md": "howto"}
 
 
 def chapter(name: str) -> str:

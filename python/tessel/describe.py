@@ -10,7 +10,7 @@ from typing import Any
 import numpy as np
 
 import tessel
-from tessel import wording
+from tessel import integrity, wording
 from tessel.axis import Axis
 from tessel.dataset import Attribute, Dataset, Dimension, Variable
 
@@ -21,7 +21,7 @@ _MOST_TEXTS = 20
 
 
 def listing(dataset: Dataset) -> str:
-    """The dimensions, variables and attributes of a file."""
+    """The dimensions, variables and attributes of a file; of one with groups, those of the root."""
     sections = [
         ("Dimensions", _dimensions(dataset)),
         ("Variables", _variables(dataset)),
@@ -30,6 +30,8 @@ def listing(dataset: Dataset) -> str:
     lines = [wording.printable(dataset.path)]
     for heading, content in sections:
         lines += ["", heading, *(list(content) or ["  none"])]
+    if integrity.format_of(dataset) is None:
+        lines += ["", "Groups, which only files in HDF5 may have, are not shown."]
     return "\n".join(lines)
 
 
