@@ -6,6 +6,8 @@
 
 #include <algorithm>
 #include <array>
+#include <cmath>
+#include <cstddef>
 #include <cstdint>
 #include <span>
 
@@ -33,37 +35,63 @@ bool hasRecords(const Variable &variable, int unlimited) {
     return !variable.dimids.empty() && static_cast<int>(variable.dimids.back()) == unlimited;
 }
 
-std::uint64_t lengthOf(int ncid, int dimid, const Ask &ask) {
-    return static_cast<std::uint64_t>(ask("inq_dim", ncid, dimid)[1].number());
-}
+/// The lengths of dimensions, each of which is asked for once.
+class Lengths {
+  public:
+    Lengths(int dataset, const Ask &asked) : ncid(dataset), ask(asked) {}
 
-/// The bytes of one record of a variable, rounded up as the formats have it.
-std::uint64_t recordBytes(int ncid, const Variable &variable, const Ask &ask) {
+    double operator()(double dimid) {
+        const auto [found, isNew] = known.try_emplace(static_cast<int>(dimid), 0);
+        if (isNew) {
+            found->second = ask("inq_dim", ncid, dimid)[1].number();
+        }
+        return found->second;
+    }
+
+  private:
+    int ncid;
+    const Ask &ask;
+    std::unordered_map<int, double> known;
+};
+
+/// The bytes of a variable, rounded up as the formats have it, or of one record of it.
+double bytesOf(const Variable &variable, std::span<const double> dimids, Lengths &lengthOf) {
+    constexpr double word = 4;
     // What only files based on HDF5 have is taken for the largest of the others.
     const auto type = static_cast<std::size_t>(variable.type);
-    std::uint64_t bytes = type < typeSizes.size() ? typeSizes[type] : sizeof(double);
-    for (const double dimid : variable.dimids.first(variable.dimids.size() - 1)) {
-        bytes *= lengthOf(ncid, static_cast<int>(dimid), ask);
+    double bytes = type < typeSizes.size() ? typeSizes[type] : sizeof(double);
+    for (const double dimid : dimids) {
+        bytes *= lengthOf(dimid);
     }
-    return (bytes + 3) / 4 * 4;
+    return std::ceil(bytes / word) * word;
 }
 
 } // namespace
 
-std::optional<Records> recordsOf(int ncid, int varid, const Ask &ask) {
+Layout layoutOf(int ncid, const Ask &ask) {
     const Results dataset = ask("inq", ncid);
     const int unlimited = asInt(dataset[3]);
+    Lengths lengthOf(ncid, ask);
+    Layout layout;
+    layout.records = unlimited < 0 ? 0 : static_cast<std::uint64_t>(lengthOf(unlimited));
+    for (int each = 0; each < asInt(dataset[1]); ++each) {
+        const Variable variable = variableOf(ncid, each, ask);
+        const bool inRecords = unlimited >= 0 && hasRecords(variable, unlimited);
+        const double bytes =
+            bytesOf(variable, variable.dimids.first(variable.dimids.size() - (inRecords ? 1 : 0)),
+                    lengthOf);
+        (inRecords ? layout.record : layout.fixed) += bytes;
+        layout.largest = std::max(layout.largest, bytes);
+    }
+    return layout;
+}
+
+std::optional<Layout> recordsOf(int ncid, int varid, const Ask &ask) {
+    const int unlimited = asInt(ask("inq", ncid)[3]);
     if (unlimited < 0 || !hasRecords(variableOf(ncid, varid, ask), unlimited)) {
         return std::nullopt;
     }
-    Records records{lengthOf(ncid, unlimited, ask), 0};
-    for (int each = 0; each < asInt(dataset[1]); ++each) {
-        const Variable variable = variableOf(ncid, each, ask);
-        if (hasRecords(variable, unlimited)) {
-            records.bytes += recordBytes(ncid, variable, ask);
-        }
-    }
-    return records;
+    return layoutOf(ncid, ask);
 }
 
 } // namespace tessel::guard

@@ -14,12 +14,20 @@
 
 namespace tessel::guard {
 
+/// What the header of a file claimed, when it was opened, of which the file had less.
+struct Shortfall {
+    std::uint64_t end = 0;    // where its data were to end; 0 if the file had all of them
+    std::uint64_t size = 0;   // of the file
+    std::uint64_t record = 0; // bytes of one record
+};
+
 /// A dataset between the call that opened it and the one that ends it.
 struct Dataset {
     std::string path;
     bool known = false; // it was seen to be opened
     FileIdentity file;
     bool classic = true; // not based on HDF5
+    bool data64 = false; // of 64-bit data
     bool writable = true;
     bool shared = false; // its header is read again when it is redefined
     bool defining = false;
@@ -32,12 +40,22 @@ struct Dataset {
 
     /// Whether variables have records, for those that were asked about.
     std::unordered_map<int, bool> hasRecords;
+
+    /// No less than its header and its variables take, with a single record; and what of it is no
+    /// variable's.
+    std::uint64_t room = UINT64_MAX;
+    std::uint64_t gaps = 0;
+
+    Shortfall shortfall;
 };
 
-/// Where the records of a dataset stand, as inquiries say.
-struct Records {
-    std::uint64_t number;
-    std::uint64_t bytes; // of one record, with every record variable in it
+/// What the variables of a dataset take, as inquiries say. Lengths come as doubles, which hold
+/// what no file does.
+struct Layout {
+    std::uint64_t records = 0;
+    double record = 0; // bytes of one record, with every record variable in it
+    double fixed = 0;  // bytes of all other variables
+    double largest = 0;
 };
 
 /// The process's datasets by id. Every function is called while no call of a module runs.
@@ -82,7 +100,9 @@ class Datasets {
     ById byId;
 };
 
-/// The records of the dataset, if the variable has any.
-std::optional<Records> recordsOf(int ncid, int varid, const Ask &ask);
+Layout layoutOf(int ncid, const Ask &ask);
+
+/// The same, if the variable has records.
+std::optional<Layout> recordsOf(int ncid, int varid, const Ask &ask);
 
 } // namespace tessel::guard

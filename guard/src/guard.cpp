@@ -1,10 +1,12 @@
 // guard/src/guard.cpp: the watcher that refuses what the netCDF library does not survive.
 #include "tessel/netcdf_guard.hpp"
 
+#include "bytes.hpp"
 #include "datasets.hpp"
 #include "header.hpp"
 #include "names.hpp"
 #include "operations.hpp"
+#include "positions.hpp"
 #include "refusals.hpp"
 
 #include "tessel/array.h"
@@ -36,6 +38,7 @@ constexpr int diskless = 0x8;                             // the file is kept in
 constexpr int mapped = 0x10;                              // and is that memory
 constexpr int hdf5 = 0x1000;
 constexpr int ofClassicFormats = 0x20 | 0x100 | 0x200; // each of them outweighs the default format
+constexpr int data64 = 0x20;
 constexpr int noFill = 0x100;
 constexpr double tooLong = 0x1p63; // elements, which the library takes for a negative number
 constexpr std::uint64_t alignmentThatWraps = std::uint64_t{1} << 63U;
@@ -160,15 +163,17 @@ bool opensForWriting(const tsArray *mode) {
 /// Synchronising a dataset that is open for reading makes the library read its header again, and so
 /// does the redefinition of one that is shared: from the file that it opened. Its name may lead to
 /// another one by now.
-void lookAtOpenHeader(const FileIdentity &opened) {
-    for (const int descriptor : descriptorsOf(opened)) {
-        if (const Header found = headerOf(descriptor); found.claim) {
+void lookAtOpenHeader(Dataset &dataset) {
+    for (const int descriptor : descriptorsOf(dataset.file)) {
+        const Header found = headerOf(descriptor);
+        if (found.claim) {
             const std::string link = "/proc/self/fd/" + std::to_string(descriptor);
             std::error_code ignored;
             refuse(header, "the header of " +
                                inQuotes(std::filesystem::read_symlink(link, ignored).string()) +
                                " " + *found.claim);
         }
+        take(found, dataset);
     }
 }
 
@@ -263,18 +268,24 @@ std::string growingName(const tsArray *given) {
                                      " bytes may become one of " + std::to_string(most);
 }
 
-/// Looks at the dimensions of a variable that is to be defined.
-void lookAtLengths(int ncid, const tsArray *dimids, const Ask &ask) {
+/// Looks at the dimensions of a variable that is to be defined, which takes no more bytes than
+/// what comes back.
+std::uint64_t lookAtLengths(int ncid, const tsArray *dimids, const Ask &ask) {
+    std::uint64_t most = sizeof(double);
     for (const std::uint64_t dimid : indices(dimids).value_or(Indices{})) {
         const Results dimension = ask("inq_dim", ncid, static_cast<double>(dimid));
         if (dimension[1].number() >= tooLong) {
             refuse(lengths, inQuotes(dimension[0].utf8()) + " is 2^63 or longer");
         }
+        const double length = std::max(dimension[1].number(), 1.0);
+        most = product(most, static_cast<std::uint64_t>(length));
     }
+    return most;
 }
 
-/// Counts that wrap around to what was given. Empty data are the module's to refuse.
-void lookAtCounts(const Indices &count, const tsArray *data) {
+/// Counts that wrap around to what was given. Empty data are the module's to refuse, and so are
+/// counts of anything else than what was given: then nothing comes of the call.
+bool lookAtCounts(const Indices &count, const tsArray *data) {
     std::uint64_t product = 1;
     bool wraps = false;
     for (const std::uint64_t each : count) {
@@ -284,6 +295,7 @@ void lookAtCounts(const Indices &count, const tsArray *data) {
     if (wraps && !none && !tsIsEmpty(data) && product == tsGetNumberOfElements(data)) {
         refuse(counts, "the counts multiply to more than 64 bits hold");
     }
+    return !wraps && product == tsGetNumberOfElements(data);
 }
 
 /// Where a write goes, in the library's order.
@@ -306,7 +318,9 @@ std::optional<Write> writeOf(Kind kind, Inputs inputs) {
             return std::nullopt;
         }
         write.count = *count;
-        lookAtCounts(*count, inputs[inputs.size() - 1]);
+        if (!lookAtCounts(*count, inputs[inputs.size() - 1])) {
+            return std::nullopt;
+        }
     }
     if (kind == Kind::writeStrided) {
         const auto stride = indices(inputs[5]);
@@ -334,12 +348,13 @@ std::uint64_t endOf(const Write &write) {
     return end;
 }
 
-/// Whether it is known that no write of the variable fills records.
-bool fillsNoRecords(const Dataset *dataset, int varid) {
+/// Whether it is known that no write of the variable fills records, or lies too far behind them.
+bool needsNoLook(const Dataset *dataset, int varid) {
     if (dataset == nullptr) {
         return false;
     }
-    if (!dataset->classic || !dataset->filling || dataset->defining) {
+    if (!dataset->classic || dataset->defining ||
+        (!dataset->filling && dataset->room < modestRoom)) {
         return true;
     }
     const auto known = dataset->hasRecords.find(varid);
@@ -351,29 +366,30 @@ bool fillsNoRecords(const Dataset *dataset, int varid) {
 std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *dataset,
                             const Ask &ask, const GuardOptions &options) {
     const std::uint64_t end = endOf(write);
+    const bool fills = dataset == nullptr || dataset->filling;
     // Only what lies between the end of the records and the write's own is filled.
     const auto filled = [&](std::uint64_t number) {
-        const std::uint64_t added = end - std::min(end, number);
+        const std::uint64_t added = fills ? end - std::min(end, number) : 0;
         return added - std::min(added, write.count[0]);
     };
-    if (dataset != nullptr && filled(dataset->records) == 0) {
+    if (dataset != nullptr && filled(dataset->records) == 0 && liesWithin(*dataset, end)) {
         return dataset->hasRecords.contains(varid) ? end : 0;
     }
-    const std::optional<Records> found = recordsOf(ncid, varid, ask);
+    const std::optional<Layout> found = recordsOf(ncid, varid, ask);
     if (dataset != nullptr) {
         dataset->hasRecords[varid] = found.has_value();
-        dataset->records = found ? found->number : dataset->records;
+        dataset->records = found ? found->records : dataset->records;
     }
-    if (!found) {
+    if (!found || end == 0) {
         return 0;
     }
-    const std::uint64_t records = filled(found->number);
-    std::uint64_t bytes = 0;
-    if (__builtin_mul_overflow(records, found->bytes, &bytes) || bytes > options.fillLimit) {
+    const std::uint64_t records = filled(found->records);
+    if (static_cast<double>(records) * found->record > static_cast<double>(options.fillLimit)) {
         refuse(guard::records, "the write ends at record " + std::to_string(end - 1) + ", and " +
                                    std::to_string(records) + " records of " +
-                                   std::to_string(found->bytes) + " bytes are missing before it");
+                                   inWords(found->record) + " are missing before it");
     }
+    lookAtEnd(end, *found, dataset);
     return end;
 }
 
@@ -385,6 +401,7 @@ class Guard : public Watcher {
     void before(Inputs inputs, const Ask &ask) override {
         kind = kindOf(inputs);
         recordsEnd = 0;
+        defined = 0;
         opening = {};
         if (datasets().anyDead) {
             lookForDead(inputs);
@@ -438,11 +455,15 @@ class Guard : public Watcher {
                 lookAtMapping(flags, inputs[3]);
             }
             if (creates) {
+                dataset.room = 0;
+                dataset.data64 = (flags & data64) != 0;
                 dataset.classic = lookAtCreation(flags);
             } else {
                 const Header found = lookAtOpening(dataset.path, flags);
                 dataset.file = found.file;
                 dataset.classic = found.classic;
+                dataset.data64 = found.data64;
+                take(found, dataset);
             }
             opening = Datasets::make(std::move(dataset));
             return;
@@ -453,10 +474,28 @@ class Guard : public Watcher {
         }
         Dataset *const dataset = datasets().find(*ncid);
         if (dataset != nullptr && readsHeaderAgain(*dataset)) {
-            lookAtOpenHeader(dataset->file);
+            lookAtOpenHeader(*dataset);
         }
         if (dataset != nullptr && dataset->modeInDoubt && kind != Kind::abort) {
             settleMode(*ncid, *dataset, ask);
+        }
+        if (kind == Kind::redefine && dataset != nullptr && dataset->shortfall.end > 0 &&
+            dataset->writable && !dataset->defining) {
+            // What was written, and is still the library's, makes the file longer.
+            unlessRefused([&] { ask("sync", *ncid); });
+            lookAtShortfall(*dataset, options.fillLimit);
+        }
+        if (kind == Kind::tunedEndDefinition) {
+            unlessRefused([&] { lookAtAlignment(inputs, *ncid, dataset, ask); });
+        }
+        if (mayEndDefinitions(dataset)) {
+            const std::uint64_t tuned =
+                kind == Kind::tunedEndDefinition ? tunedRoom(inputs) : std::uint64_t{0};
+            unlessRefused([&] { lookAtLayout(tuned, *ncid, dataset, ask, options.fillLimit); });
+            if (dataset != nullptr) { // whatever comes of it: the library keeps the room
+                dataset->room = sum(dataset->room, tuned);
+                dataset->gaps = sum(dataset->gaps, tuned);
+            }
         }
         if (kind == Kind::close && dataset != nullptr && dataset->classic && dataset->writable) {
             settle(*ncid, *dataset, ask);
@@ -468,17 +507,15 @@ class Guard : public Watcher {
         if (const auto place = placeOfNewName(kind)) {
             lookAtNewName(inputs, *place, ask);
         }
-        if (kind == Kind::tunedEndDefinition) {
-            unlessRefused([&] { lookAtAlignment(inputs, *ncid, dataset, ask); });
-        } else if (kind == Kind::defineVariable && tsGetClassID(inputs[4]) == tsDOUBLE) {
-            unlessRefused([&] { lookAtLengths(*ncid, inputs[4], ask); });
+        if (kind == Kind::defineVariable && tsGetClassID(inputs[4]) == tsDOUBLE) {
+            unlessRefused([&] { defined = lookAtLengths(*ncid, inputs[4], ask); });
         } else if (isWrite()) {
             const auto varid = integer(inputs[2]);
-            const bool fillsNone = varid && fillsNoRecords(dataset, *varid);
-            if (fillsNone && kind == Kind::writeElement) {
+            const bool harmless = varid && needsNoLook(dataset, *varid);
+            if (harmless && kind == Kind::writeElement) {
                 return; // an element has no counts that could wrap around, either
             }
-            if (const auto write = writeOf(kind, inputs); write && varid && !fillsNone) {
+            if (const auto write = writeOf(kind, inputs); write && varid && !harmless) {
                 unlessRefused([&] {
                     recordsEnd = lookAtRecords(*write, *ncid, *varid, dataset, ask, options);
                 });
@@ -557,6 +594,8 @@ class Guard : public Watcher {
     void rememberChange(Inputs inputs, Dataset &dataset) const {
         if (isWrite()) {
             dataset.records = std::max(dataset.records, recordsEnd);
+        } else if (kind == Kind::defineVariable) {
+            dataset.room = sum(dataset.room, defined);
         } else if (kind == Kind::redefine) {
             dataset.defining = true;
             dataset.hasRecords.clear(); // variables may come, and dimensions be known anew
@@ -570,6 +609,14 @@ class Guard : public Watcher {
     [[nodiscard]] bool readsHeaderAgain(const Dataset &dataset) const noexcept {
         return dataset.classic && ((kind == Kind::sync && !dataset.writable) ||
                                    (kind == Kind::redefine && dataset.shared));
+    }
+
+    /// Closing ends definitions as well. Whether a dataset that nobody was seen to open has any is
+    /// not known: its closing is let be.
+    [[nodiscard]] bool mayEndDefinitions(const Dataset *dataset) const noexcept {
+        return dataset == nullptr ? endsDefinitions()
+                                  : dataset->classic && dataset->defining &&
+                                        (endsDefinitions() || kind == Kind::close);
     }
 
     [[nodiscard]] bool endsDefinitions() const noexcept {
@@ -586,6 +633,7 @@ class Guard : public Watcher {
     Kind kind = Kind::other;      // of the call in progress
     Datasets::New opening;        // what it opens
     std::uint64_t recordsEnd = 0; // where it ends, if it writes records
+    std::uint64_t defined = 0;    // bytes at most of the variable that it defines
 };
 
 } // namespace

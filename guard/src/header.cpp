@@ -1,6 +1,7 @@
 // guard/src/header.cpp: what a file of the classic formats claims about itself.
 #include "header.hpp"
 
+#include "bytes.hpp"
 #include "external_types.hpp"
 
 #include <dirent.h>
@@ -42,20 +43,25 @@ struct Distrusted {
     std::string claim;
 };
 
-/// Reads a file from its beginning on. Most headers fit into the buffer: then opening, one read and
-/// closing are all that it costs, because the size of the file is only asked for behind that.
+/// Reads a file from its beginning on. Most headers fit into the buffer: then opening, one look at
+/// what is open, one read and closing are all that it costs.
 class Reader {
   public:
     explicit Reader(int descriptor) : file(descriptor) {
         if (file >= 0) {
+            known = fstat(file, &status) == 0;
             fill();
         }
     }
 
-    [[nodiscard]] FileIdentity identity() const noexcept {
-        struct stat status {};
-        return fstat(file, &status) == 0 ? FileIdentity{status.st_dev, status.st_ino}
-                                         : FileIdentity{};
+    [[nodiscard]] FileIdentity identity() const noexcept { return {status.st_dev, status.st_ino}; }
+
+    /// Of what is no regular file, nothing more can be said.
+    [[nodiscard]] std::uint64_t size() const {
+        if (!known || !S_ISREG(status.st_mode)) {
+            throw Ended{};
+        }
+        return static_cast<std::uint64_t>(status.st_size);
     }
 
     [[nodiscard]] bool has(std::uint64_t bytes) { return bytes <= ahead() || bytes <= left(); }
@@ -98,19 +104,9 @@ class Reader {
         buffered = got > 0 ? static_cast<std::uint64_t>(got) : 0;
     }
 
-    std::uint64_t size() {
-        if (!fileSize) {
-            struct stat status {};
-            if (fstat(file, &status) != 0 || !S_ISREG(status.st_mode)) {
-                throw Ended{};
-            }
-            fileSize = static_cast<std::uint64_t>(status.st_size);
-        }
-        return *fileSize;
-    }
-
     int file;
-    std::optional<std::uint64_t> fileSize;
+    struct stat status {};
+    bool known = false;
     std::uint64_t position = 0;
     std::uint64_t start = 0;
     std::uint64_t buffered = 0;
@@ -134,7 +130,9 @@ class Walk {
             throw Ended{};
         }
         found.classic = true;
-        reader.skip(countSize); // the number of records
+        found.data64 = version == 5;
+        found.size = reader.size();
+        const std::uint64_t records = reader.number(countSize);
         for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.has(1); --n) {
             name();
             lengths.push_back(reader.number(countSize));
@@ -142,6 +140,10 @@ class Walk {
         attributes();
         for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.has(1); --n) {
             variable();
+        }
+        found.extent = extent(records);
+        if (found.extent.end > maxLength) {
+            throw Distrusted{"claims data that end behind 2^63 bytes, where no file reaches"};
         }
     }
 
@@ -194,26 +196,67 @@ class Walk {
                              " dimensions, where " + std::to_string(maxDimensions) +
                              " are the most"};
         }
-        for (std::uint64_t n = dimensions; n > 0; --n) {
+        std::uint64_t elements = 1; // of a record, where there are any
+        bool hasRecords = false;
+        for (std::uint64_t i = 0; i < dimensions; ++i) {
             const std::uint64_t dimid = reader.number(countSize);
-            if (dimid < lengths.size() && lengths[dimid] > maxLength) {
-                throw Distrusted{"has a variable over a dimension of " +
-                                 std::to_string(lengths[dimid]) + " elements, where " +
-                                 std::to_string(maxLength) + " are the most"};
+            const std::uint64_t length = dimid < lengths.size() ? lengths[dimid] : 1;
+            if (length > maxLength) {
+                throw Distrusted{"has a variable over a dimension of " + std::to_string(length) +
+                                 " elements, where " + std::to_string(maxLength) + " are the most"};
             }
+            hasRecords = hasRecords || (i == 0 && length == 0);
+            elements = product(elements, std::max<std::uint64_t>(length, 1));
         }
         attributes();
-        if (reader.number(4) == typeWithoutSize) {
+        const std::uint64_t type = reader.number(4);
+        if (type == typeWithoutSize) {
             throw Distrusted{"has a variable of the type " + std::to_string(typeWithoutSize) +
                              ", which has no size"};
         }
-        reader.skip(countSize + offsetSize); // size and place
+        if (type >= typeSizes.size()) {
+            throw Ended{};
+        }
+        reader.skip(countSize); // the size, which the library computes itself, as is done here
+        const std::uint64_t bytes = product(elements, typeSizes[static_cast<std::size_t>(type)]);
+        const std::uint64_t begin = reader.number(offsetSize);
+        (hasRecords ? inRecords : fixed).add(begin, bytes);
     }
 
-    static std::uint64_t padded(std::uint64_t bytes) noexcept { return (bytes + 3) / 4 * 4; }
+    /// Where so many records end.
+    [[nodiscard]] Extent extent(std::uint64_t records) const noexcept {
+        Extent found;
+        found.record = inRecords.variables == 1 ? inRecords.packed : inRecords.bytes;
+        found.room = std::max(fixed.end, inRecords.end);
+        found.gaps = found.room - std::min(found.room, sum(fixed.bytes, inRecords.bytes));
+        found.end = fixed.end;
+        if (records > 0 && inRecords.variables > 0) {
+            const std::uint64_t last = product(records - 1, found.record);
+            found.end = std::max(found.end, sum(inRecords.end, last));
+        }
+        return found;
+    }
+
+    /// The variables with records, or those without.
+    struct Part {
+        void add(std::uint64_t begin, std::uint64_t given) noexcept {
+            const std::uint64_t rounded = padded(given);
+            ++variables;
+            packed = given;
+            bytes = sum(bytes, rounded);
+            end = std::max(end, sum(begin, rounded));
+        }
+
+        std::uint64_t variables = 0;
+        std::uint64_t packed = 0; // a single one with records is not filled up
+        std::uint64_t bytes = 0;
+        std::uint64_t end = 0; // of the first record
+    };
 
     Reader reader;
     std::vector<std::uint64_t> lengths; // of the dimensions
+    Part fixed;
+    Part inRecords;
     std::size_t countSize = 4;
     std::size_t offsetSize = 4;
 };

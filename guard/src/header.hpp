@@ -3,6 +3,7 @@
 
 #include <sys/types.h>
 
+#include <cstdint>
 #include <optional>
 #include <string>
 #include <vector>
@@ -17,11 +18,22 @@ struct FileIdentity {
     bool operator==(const FileIdentity &) const = default;
 };
 
+/// Where a header says that data are, in bytes; UINT64_MAX stands for more than that.
+struct Extent {
+    std::uint64_t end = 0;           ///< of all records that it claims
+    std::uint64_t record = 0;        ///< of one record
+    std::uint64_t room = UINT64_MAX; ///< to the end of the first record
+    std::uint64_t gaps = 0;          ///< what of the room is no variable's
+};
+
 /// What the header of a file is like.
 struct Header {
     FileIdentity file;                ///< of nothing, if it could not be opened
+    std::uint64_t size = 0;           ///< of the file
     bool classic = false;             ///< whether it is one of the classic formats'
+    bool data64 = false;              ///< whether that is the one of 64-bit data
     std::optional<std::string> claim; ///< what is not to be trusted in it, as part of a sentence
+    Extent extent;                    ///< where there is no claim
 };
 
 /// Looks at the header of a file and at nothing else of it. What is not of the classic formats, and
@@ -29,7 +41,8 @@ struct Header {
 ///
 /// Refused are counts above the number of bytes that are left of the file, names longer than
 /// NC_MAX_NAME and variables of more than NC_MAX_VAR_DIMS dimensions (both overflow the buffers
-/// that the library's documentation tells programs to use).
+/// that the library's documentation tells programs to use), and data that would end where no file
+/// reaches, behind 2^63 bytes (of which the library notices only some).
 Header headerOf(const std::string &path);
 
 /// The header of a file that is open.

@@ -22,6 +22,7 @@ inline constexpr Refusal
     lengths   = {"TESSEL:guard:lengths",   "the library would take the length for a negative number, divide by zero, or lay variables over one another"},
     counts    = {"TESSEL:guard:counts",    "the library would write what is beyond the data, or for ever"},
     records   = {"TESSEL:guard:records",   "every record before it would be filled first; with set_fill(ncid, NC_NOFILL) they are left as they are"},
+    position  = {"TESSEL:guard:position",  "the library would take the position for a negative number, and read or write memory in its stead"},
     header    = {"TESSEL:guard:header",    "the library would trust the header"},
     remote    = {"TESSEL:guard:remote",    "the library would fetch it; addresses are to be allowed first"};
 // clang-format on

@@ -828,6 +828,9 @@ GUARD: dict[str, str] = {
     "TESSEL:guard:records":
         "The call was not made: <particulars>, and every record before it would be "
         "filled first; with set_fill(ncid, NC_NOFILL) they are left as they are.",
+    "TESSEL:guard:position":
+        "The call was not made: <particulars>, and the library would take the position "
+        "for a negative number, and read or write memory in its stead.",
     "TESSEL:guard:header":
         "The call was not made: <particulars>, and the library would trust the header.",
     "TESSEL:guard:remote":

@@ -1,6 +1,7 @@
 // tests/guard/fatal_calls.cpp: calls that the library does not survive, a row each.
 #include "fatal_calls.hpp"
 
+#include <cmath>
 #include <csignal>
 
 namespace tessel::test {
@@ -10,6 +11,8 @@ using namespace std::string_literals;
 
 constexpr double wraps = -1; // as a count: 2^64-1
 constexpr int share = 2048;
+constexpr int mapped = 16;
+constexpr double longest = 0x1p60 - 0x1p7; // of doubles, in a file of 64-bit data
 
 /// Closed once, which failed.
 int closedInVain(const Module &netcdf, const Folder &folder) {
@@ -37,6 +40,59 @@ int open(const Module &netcdf, const Folder &folder, const std::string &bytes) {
 std::string variableOfType(std::uint32_t type) {
     return "CDF\1" + words({0, 10, 1, 1}) + "x\0\0\0"s + words({4, 0, 0, 11, 1, 1}) + "v\0\0\0"s +
            words({1, 0, 0, 0, type, 4, 100}) + std::string(16, '\0');
+}
+
+/// In mapped memory, without filling: records of 2^34 bytes. Where a position wraps in a file, it
+/// depends on the position what comes of it; here no memory is.
+int longRecords(const Module &netcdf, const Folder &folder) {
+    const int ncid = definingVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64 + mapped);
+    netcdf("set_fill", ncid, noFill);
+    netcdf("enddef", ncid);
+    return ncid;
+}
+
+/// A file of 64-bit data with records of 2^31 doubles, and so many of them.
+std::string manyLongRecords(std::uint32_t records) {
+    const auto dimension = [](char name, std::uint32_t length) {
+        return words({0, 1}) + name + "\0\0\0"s + words({0, length});
+    };
+    return "CDF\5" + words({0, records, 10, 0, 2}) + dimension('t', 0) + dimension('x', 1U << 31U) +
+           words({0, 0, 0, 11, 0, 1, 0, 1}) + "v\0\0\0"s + words({0, 2, 0, 0, 0, 1, 0, 0, 0, 6}) +
+           words({4, 0, 0, 200}) + std::string(64, '\0');
+}
+
+/// A file of 64-bit offsets with nine variables of records of 2^29-1 doubles each, and as many
+/// records as there can be.
+std::string manyRecordsOfNine() {
+    constexpr std::uint32_t x = (1U << 29U) - 1;
+    const auto variable = [](char name, std::uint32_t high, std::uint32_t low) {
+        return words({1}) + name + "\0\0\0"s + words({2, 0, 1, 0, 0, 6, x * 8, high, low});
+    };
+    std::string bytes = "CDF\2" + words({0xFFFFFFFE, 10, 2, 1}) + "t\0\0\0"s + words({0, 1}) +
+                        "x\0\0\0"s + words({x, 0, 0, 11, 9});
+    std::uint64_t begin = 600;
+    for (char name = 'a'; name < 'a' + 9; ++name) {
+        bytes += variable(name, static_cast<std::uint32_t>(begin >> 32U),
+                          static_cast<std::uint32_t>(begin));
+        begin += std::uint64_t{x} * 8;
+    }
+    return bytes + std::string(200, '\0');
+}
+
+/// Opened for writing: a file that claims so many records of so many bytes, and has none.
+int openForWriting(const Module &netcdf, const Folder &folder, std::uint32_t records,
+                   std::uint32_t bytes) {
+    return intOf(netcdf("open", written(folder, "a.nc", claimedRecords(records, bytes)), 1));
+}
+
+/// In define mode, without filling: two variables that each fit, and not one behind the other.
+int beyondAllFiles(const Module &netcdf, const Folder &folder) {
+    const int ncid = intOf(netcdf("create", folder.file("a.nc"), data64 + mapped));
+    const int x = intOf(netcdf("def_dim", ncid, "x", longest));
+    netcdf("def_var", ncid, "v", ncDouble, x);
+    netcdf("def_var", ncid, "w", ncDouble, x);
+    netcdf("set_fill", ncid, noFill);
+    return ncid;
 }
 
 /// In define mode, with a variable.
@@ -312,6 +368,79 @@ const Fatal rows[] = {
          const int ncid = newDataset(netcdf, folder.file("a.nc"));
          netcdf("put_vars_double", ncid, 1, Array::row({0, 0}), Array::row({1, 2}),
                 Array::row({1, 2e9}), Array::row({1, 2}));
+     }},
+    {"ABlockWhosePositionWraps", SIGSEGV, "TESSEL:guard:position", "ends at record 1073741823",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = longRecords(netcdf, folder);
+         netcdf("put_vara_double", ncid, 0, Array::row({0x1p30, 0x1p30 - 1}), Array::row({900, 1}),
+                Array::numeric(tsDOUBLE, std::array<std::size_t, 2>{900, 1}));
+         netcdf("close", ncid);
+     }},
+    {"StepsToAPositionThatWraps", SIGSEGV, "TESSEL:guard:position", "ends at record 1073741823",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = longRecords(netcdf, folder);
+         netcdf("put_vars_double", ncid, 0, Array::row({0x1p30, 0x1p30 - 1}), Array::row({2, 1}),
+                Array::row({3, 1}), Array::row({1, 2}));
+     }},
+    {"AnElementWhosePositionWraps", SIGSEGV, "TESSEL:guard:position",
+     "records of 17179869184 bytes that is behind 2^63 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = longRecords(netcdf, folder);
+         netcdf("put_var1_double", ncid, 0, Array::row({0x1p30, 0x1p30 - 1}), 1);
+     }},
+    {"AnEndOfDefinitionsBehindWhichPositionsWrap", SIGSEGV, "TESSEL:guard:position",
+     "the variables end behind 2^63 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = beyondAllFiles(netcdf, folder);
+         netcdf("enddef", ncid);
+         netcdf("put_var1_double", ncid, 1, longest / 2, 1);
+     }},
+    {"ATunedEndOfDefinitionsBehindWhichPositionsWrap", SIGSEGV, "TESSEL:guard:position",
+     "the variables end behind 2^63 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = beyondAllFiles(netcdf, folder);
+         netcdf("nc__enddef", ncid, 0, 4, 0, 4);
+         netcdf("put_var1_double", ncid, 1, longest / 2, 1);
+     }},
+    {"OpenOfManyLongRecords", SIGSEGV, "TESSEL:guard:header",
+     "claims data that end behind 2^63 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const std::string file = written(folder, "a.nc", manyLongRecords(1U << 30U));
+         const int ncid = intOf(netcdf("open", file, mapped));
+         netcdf("get_var1_double", ncid, 0, Array::row({0x1p30, 0x1p30 - 1}));
+     }},
+    {"OpenOfManyRecordsOfNineVariables", SIGSEGV, "TESSEL:guard:header",
+     "claims data that end behind 2^63 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid =
+             intOf(netcdf("open", written(folder, "a.nc", manyRecordsOfNine()), mapped));
+         constexpr double record = 9 * 8 * ((1U << 29U) - 1.0);
+         netcdf("get_var1_double", ncid, 0,
+                Array::row({0, std::floor((0x1p64 - 0x1p36) / record)}));
+     }},
+    {"AnEndOfDefinitionsOfALargeClassicVariable", SIGSEGV, "TESSEL:guard:position",
+     "the variables end behind 2^63 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid =
+             definingVariable(netcdf, folder, ncChar, {0x1p21, 0x1p21, 0x1p22}, mapped);
+         netcdf("set_fill", ncid, noFill);
+         netcdf("enddef", ncid);
+         netcdf("put_var1_text", ncid, 0, Array::row({0, 0, 0x1p20}), "a");
+     }},
+    {"RedefiningWhatTheFileLacks", SIGXFSZ, "TESSEL:guard:header", "the file lacks 17179869",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = openForWriting(netcdf, folder, 1U << 30U, 16);
+         netcdf("redef", ncid);
+         netcdf("put_att_text", ncid, -1, "a", std::string(1000, 'a'));
+         netcdf("enddef", ncid);
+     }},
+    {"LongerRecordsThatTheFileLacks", SIGXFSZ, "TESSEL:guard:header", "the file lacks 268435",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = openForWriting(netcdf, folder, 1U << 28U, 1);
+         netcdf("redef", ncid);
+         const int x = intOf(netcdf("def_dim", ncid, "y", 2));
+         netcdf("def_var", ncid, "w", ncDouble, Array::row({static_cast<double>(x), 0}));
+         netcdf("enddef", ncid);
      }},
 };
 

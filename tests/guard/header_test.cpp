@@ -64,6 +64,36 @@ std::string variablesBehind(std::uint32_t bytes, std::uint32_t variables) {
            std::string(bytes, 'a') + words({11, variables}) + room;
 }
 
+/// A file of 64-bit offsets with variables of 100 integers that begin at these places.
+std::string beginningAt(std::initializer_list<std::uint64_t> places) {
+    std::string bytes = "CDF\2"s + words({0}) + words({10, 1}) + stored("x") + words({100}) +
+                        nothing + words({11, static_cast<std::uint32_t>(places.size())});
+    std::string name = "a";
+    for (const std::uint64_t place : places) {
+        bytes += stored(name) + words({1, 0}) + nothing +
+                 words({4, 400, static_cast<std::uint32_t>(place >> 32U),
+                        static_cast<std::uint32_t>(place)});
+        ++name[0];
+    }
+    return bytes + room;
+}
+
+/// A classic file with a variable of 2^21 times 2^21 times so many bytes.
+std::string bytesInSquares(std::uint32_t number) {
+    constexpr std::uint32_t side = 1U << 21U;
+    return classic + words({10, 2}) + stored("x") + words({side}) + stored("y") + words({number}) +
+           nothing + words({11, 1}) + stored("v") + words({3, 0, 0, 1}) + nothing +
+           words({1, 0xFFFFFFFF, 200}) + room;
+}
+
+/// A file of 64-bit data with so many records of 2^31 doubles.
+std::string longRecords(std::uint32_t records) {
+    return "CDF\5"s + words({0, records, 10, 0, 2, 0}) + stored("t") + words({0, 0, 0}) +
+           stored("x") + words({0, 1U << 31U}) + words({0, 0, 0}) + words({11, 0, 1, 0}) +
+           stored("v") + words({0, 2, 0, 0, 0, 1}) + words({0, 0, 0}) + words({6, 4, 0, 0, 200}) +
+           room;
+}
+
 struct Claim {
     const char *name;
     std::string bytes;
@@ -177,6 +207,19 @@ const std::vector<Claim> claims = {
      refused, "has a variable of the type 12", divides},
     {"VariableOfNoType", variableOf(1, 13), invalid.c_str()},
     {"AttributeOfATypeWithoutSize", attributeNamed("long", 12, 1), opens},
+
+    // Positions are numbers of 64 bits with a sign; where data end is computed, and not looked at.
+    {"DataUpToTheLastByteOfAll", beginningAt({(std::uint64_t{1} << 63U) - 404}), opens},
+    {"DataBehindTheLastByteOfAll", beginningAt({300, (std::uint64_t{1} << 63U) - 400, 1000}),
+     refused, "claims data that end behind 2^63 bytes",
+     "1 dimensions, the last with 1 letters, 3 variables, the last with 1 letters, 1 dimensions"},
+    {"ALargeClassicVariable", bytesInSquares(1U << 20U), opens},
+    {"AClassicVariableTooLarge", bytesInSquares(1U << 21U), refused, "behind 2^63 bytes",
+     "TESSEL:netcdf:open:notANetcdfFile"},
+    {"RecordsUpToTheLastByteOfAll", longRecords((1U << 29U) - 1), opens},
+    {"RecordsBehindTheLastByteOfAll", longRecords(1U << 29U), refused, "behind 2^63 bytes",
+     "2 dimensions, the last with 1 letters, 1 variables, the last with 1 letters, 2 dimensions"},
+    {"AsManyRecordsAsThereCanBe", claimedRecords(0xFFFFFFFF, 8), opens},
 
     {"OtherFormat", "CDF\7"s + words({10, 0x40000000}) + room, "TESSEL:netcdf:open:notANetcdfFile"},
 };

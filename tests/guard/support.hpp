@@ -102,6 +102,14 @@ inline std::string repeated(std::string_view text, std::size_t times) {
     return all;
 }
 
+/// A file with a variable of letters in records, of which it has none.
+inline std::string claimedRecords(std::uint32_t records, std::uint32_t bytes) {
+    using namespace std::string_literals;
+    return "CDF\1" + words({records, 10, 2, 1}) + "t\0\0\0"s + words({0, 1}) + "x\0\0\0"s +
+           words({bytes, 0, 0, 11, 1, 1}) + "v\0\0\0"s + words({2, 0, 1, 0, 0, 2, bytes, 200}) +
+           std::string(100, '\0');
+}
+
 constexpr double ncDouble = 6;
 constexpr double noFill = 256; // of set_fill
 constexpr double ncInt = 4;

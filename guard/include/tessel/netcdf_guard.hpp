@@ -13,7 +13,8 @@ struct GuardOptions {
     /// Whether addresses ("https://...") may be given as file names.
     bool remote = false;
 
-    /// How many bytes of fill values one call may write before the data that it was given.
+    /// How many bytes of fill values one call may write before the data that it was given, and how
+    /// many a redefinition may write for what a file claims and does not have.
     std::uint64_t fillLimit = std::uint64_t{4} << 30U;
 };
 
@@ -34,8 +35,10 @@ struct GuardOptions {
 /// - "TESSEL:guard:lengths": a variable over a dimension of 2^63 elements or more
 /// - "TESSEL:guard:counts": a write of counts that multiply to more than 64 bits hold
 /// - "TESSEL:guard:records": a write that would first fill more bytes than GuardOptions::fillLimit
+/// - "TESSEL:guard:position": definitions or a write that would put data behind 2^63 bytes
 /// - "TESSEL:guard:header": a file whose header claims what it cannot hold, or what would overflow
-///   the buffers of programs that follow the library's limits
+///   the buffers of programs that follow the library's limits, and the redefinition of one that
+///   lacks more than GuardOptions::fillLimit of what its header claims
 /// - "TESSEL:guard:remote": a file name that is an address, unless GuardOptions::remote is set
 ///
 /// It closes in steps: definitions are ended and the dataset is synchronised before the library
