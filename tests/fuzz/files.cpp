@@ -115,6 +115,8 @@ class Reader {
         std::vector<double> halves = shape;
         std::for_each(last.begin(), last.end(), [](double &n) { n = std::max(n - 1, 0.0); });
         std::for_each(halves.begin(), halves.end(), [](double &n) { n = std::floor((n + 1) / 2); });
+        std::vector<double> middle = shape;
+        std::for_each(middle.begin(), middle.end(), [](double &n) { n = std::floor(n / 2); });
         const std::vector<double> zeros(shape.size(), 0);
         const std::vector<double> ones(shape.size(), 1);
         const std::vector<double> twos(shape.size(), 2);
@@ -122,6 +124,7 @@ class Reader {
             const auto get = [&](const char *part) { return std::string(part) + family; };
             call(get("get_var1_"), varid, rowOf(zeros));
             call(get("get_var1_"), varid, rowOf(last));
+            call(get("get_var1_"), varid, rowOf(middle));
             call(get("get_vara_"), varid, rowOf(last), rowOf(ones));
             if (elements <= mostElements) {
                 call(get("get_var_"), varid);
