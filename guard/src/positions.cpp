@@ -71,6 +71,9 @@ void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const A
         return;
     }
     const Layout layout = layoutOf(ncid, ask);
+    if (layout.largest == 0) { // the library lays nothing out
+        return;
+    }
     const auto gaps = static_cast<double>(sum(dataset == nullptr ? 0 : dataset->gaps, tuned));
     const double bytes = bytesOf(layout, std::max<std::uint64_t>(layout.records, 1));
     const bool answered = dataset != nullptr && dataset->data64 && layout.largest > tooLarge;
