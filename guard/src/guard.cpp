@@ -268,6 +268,20 @@ std::string growingName(const tsArray *given) {
                                      " bytes may become one of " + std::to_string(most);
 }
 
+/// Where records have to move, the library counts them with 31 bits: of more it moves none, and no
+/// longer finds them.
+void lookAtRecordsToMove(int ncid, const Ask &ask) {
+    const double unlimited = ask("inq", ncid)[3].number();
+    if (unlimited < 0) {
+        return;
+    }
+    const double records = ask("inq_dim", ncid, unlimited)[1].number();
+    if (records >= 0x1p31) {
+        refuse(lengths, "there are " + std::to_string(static_cast<std::uint64_t>(records)) +
+                            " records, which a redefinition may have to move");
+    }
+}
+
 /// Looks at the dimensions of a variable that is to be defined, which takes no more bytes than
 /// what comes back.
 std::uint64_t lookAtLengths(int ncid, const tsArray *dimids, const Ask &ask) {
@@ -479,11 +493,14 @@ class Guard : public Watcher {
         if (dataset != nullptr && dataset->modeInDoubt && kind != Kind::abort) {
             settleMode(*ncid, *dataset, ask);
         }
-        if (kind == Kind::redefine && dataset != nullptr && dataset->shortfall.end > 0 &&
-            dataset->writable && !dataset->defining) {
-            // What was written, and is still the library's, makes the file longer.
-            unlessRefused([&] { ask("sync", *ncid); });
-            lookAtShortfall(*dataset, options.fillLimit);
+        if (kind == Kind::redefine && dataset != nullptr && dataset->classic && dataset->writable &&
+            !dataset->defining) {
+            unlessRefused([&] { lookAtRecordsToMove(*ncid, ask); });
+            if (dataset->shortfall.end > 0) {
+                // What was written, and is still the library's, makes the file longer.
+                unlessRefused([&] { ask("sync", *ncid); });
+                lookAtShortfall(*dataset, options.fillLimit);
+            }
         }
         if (kind == Kind::tunedEndDefinition) {
             unlessRefused([&] { lookAtAlignment(inputs, *ncid, dataset, ask); });

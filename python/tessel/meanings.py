@@ -355,8 +355,8 @@ _GUARD = {
         "The name may become longer than the library's limit when its letters are composed.",
         "Shorten the name, or give it composed (Unicode's form NFC)."),
     "lengths": (
-        "A dimension of the variable is longer than the library counts.",
-        "Look at where the length comes from: a file has room for fewer elements."),
+        "A dimension is longer than the library counts: 2^63 elements, or 2^31 records to be moved.",
+        "Look at where the length comes from. To redefine so many records, copy them to a new file."),
     "counts": (
         "The counts multiply to more than 64 bits hold.", "Look at where the counts come from."),
     "records": (

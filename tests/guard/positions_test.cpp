@@ -1,6 +1,7 @@
 // tests/guard/positions_test.cpp: how far data may reach, and what a file may lack of what its
 // header claims, on either side of both limits.
 #include "support.hpp"
+#include "support/library.hpp"
 
 #include <cstddef>
 #include <cstdint>
@@ -167,6 +168,44 @@ TEST(Shortfall, IsOfTheRecordsThatWillBe) {
             written(folder, "a.nc", bytes);
         }
     }
+}
+
+/// A file that is a hole between its first record and its last, which are a byte each.
+int withRecords(const Module &netcdf, const Folder &folder, double number) {
+    const int made = definingVariable(netcdf, folder, ncChar, {0});
+    netcdf("set_fill", made, noFill);
+    netcdf("enddef", made);
+    netcdf("put_var1_text", made, 0, 0, "a");
+    netcdf("put_var1_text", made, 0, number - 1, "z");
+    netcdf("close", made);
+    return intOf(netcdf("open", folder.file("a.nc"), 1));
+}
+
+TEST(Redefinition, OfMoreRecordsThanTheLibraryMoves) {
+    const Module netcdf = guardedModule();
+    for (const auto &[number, identifier] :
+         {std::pair(0x1p31 - 1, ""), std::pair(0x1p31, "TESSEL:guard:lengths")}) {
+        const Folder folder;
+        const int ncid = withRecords(netcdf, folder, number);
+        EXPECT_EQ(identifierOf([&] { netcdf("redef", ncid); }), identifier) << number;
+        netcdf("abort", ncid);
+    }
+}
+
+/// What becomes of the records: they stay where they were, and are looked for elsewhere.
+TEST(Redefinition, LosesTheRecordsWithoutTheGuard) {
+    if (libraryRelease != 40900) {
+        GTEST_SKIP() << "what is said here is said of 4.9.0";
+    }
+    const Module netcdf = plainModule();
+    const Folder folder;
+    const int ncid = withRecords(netcdf, folder, 0x1p31 + 10);
+    netcdf("set_fill", ncid, noFill);
+    netcdf("redef", ncid);
+    netcdf("put_att_text", ncid, -1, "a", std::string(5000, 'x'));
+    netcdf("enddef", ncid);
+    EXPECT_EQ(netcdf("get_var1_text", ncid, 0, 0)[0].utf8(), "") << "a zero, where an a was";
+    netcdf("abort", ncid);
 }
 
 } // namespace
