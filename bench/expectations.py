@@ -79,8 +79,9 @@ STRIDED = MORE_FUNCTIONS + "; the library's strided functions take longer after 
 NAMED = "the guard looks at the name of the operation, too; see [With the guard](#with-the-guard)"
 WATCHED = ("the guard finds the dataset, and whether the variable has records, in what it knows, "
            "before the module sees the call; see [With the guard](#with-the-guard)")
-ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters are "
-         "zeros before they are anything else; see [Blocks of text](#blocks-of-text)")
+ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters, which are "
+         "twice as large, are zeros before they are anything else; to widen them takes longer than "
+         "the quarter by itself; see [Blocks of text](#blocks-of-text)")
 UNCOPIED = ("nothing is copied or added on this way; the row shows the worst of six types, and what "
             "is below 3 % is noise; see [Blocks of numbers](#blocks-of-numbers)")
 

@@ -125,14 +125,13 @@ bool isMappable(std::uint64_t bytes) {
     return memory != MAP_FAILED && munmap(memory, bytes) == 0;
 }
 
-/// In mapped memory, the library maps what it is told that a new file begins with, or that an old
-/// one is read by; a number that would be negative it leaves alone.
-void lookAtMapping(int flags, const tsArray *bytes) {
-    const std::uint64_t asked = size(bytes).value_or(0);
-    if ((flags & (mapped | diskless)) == mapped && asked > 0 &&
-        asked <= std::numeric_limits<std::int64_t>::max() && !isMappable(asked)) {
+/// In mapped memory, the library maps what it is told that a new file begins with, what it is told
+/// to read an old one by, and what an old one that may become longer claims. Where that cannot be,
+/// it writes to an address that there is not.
+void lookAtMapping(int flags, std::uint64_t bytes) {
+    if ((flags & (mapped | diskless)) == mapped && bytes > 0 && !isMappable(bytes)) {
         refuse(mode, "the flag 16 (NC_MMAP) is set, and there is no memory for " +
-                         std::to_string(asked) + " bytes");
+                         std::to_string(bytes) + " bytes");
     }
 }
 
@@ -226,6 +225,13 @@ void settleMode(int ncid, Dataset &dataset, const Ask &ask) {
     dataset.modeInDoubt = false;
 }
 
+/// Whether a new file will be of 64-bit data.
+bool makesData64(int flags) {
+    constexpr int byDefault = 5;
+    return (flags & data64) != 0 ||
+           (datasets().defaultFormat == byDefault && (flags & (hdf5 | ofClassicFormats)) == 0);
+}
+
 /// Whether the file will be of a classic format.
 bool lookAtCreation(int flags) {
     if ((flags & userFormats) != 0) {
@@ -277,8 +283,8 @@ void lookAtRecordsToMove(int ncid, const Ask &ask) {
     }
     const double records = ask("inq_dim", ncid, unlimited)[1].number();
     if (records >= 0x1p31) {
-        refuse(lengths, "there are " + std::to_string(static_cast<std::uint64_t>(records)) +
-                            " records, which a redefinition may have to move");
+        refuse(redefinition,
+               "there are " + std::to_string(static_cast<std::uint64_t>(records)) + " records");
     }
 }
 
@@ -465,19 +471,24 @@ class Guard : public Watcher {
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             dataset.shared = (flags & share) != 0;
-            if (inputs.size() > 3) {
-                lookAtMapping(flags, inputs[3]);
-            }
+            const std::uint64_t tuned = inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0;
             if (creates) {
+                lookAtMapping(flags, tuned);
                 dataset.room = 0;
-                dataset.data64 = (flags & data64) != 0;
+                dataset.data64 = makesData64(flags);
                 dataset.classic = lookAtCreation(flags);
             } else {
+                // A number that would be negative the library leaves alone.
+                lookAtMapping(flags, tuned <= std::numeric_limits<std::int64_t>::max() ? tuned : 0);
                 const Header found = lookAtOpening(dataset.path, flags);
+                if (dataset.writable && found.extent.end > found.size) {
+                    lookAtMapping(flags, found.extent.end);
+                }
                 dataset.file = found.file;
                 dataset.classic = found.classic;
                 dataset.data64 = found.data64;
                 take(found, dataset);
+                dataset.shortfall = shortfallOf(found);
             }
             opening = Datasets::make(std::move(dataset));
             return;

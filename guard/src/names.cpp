@@ -6,9 +6,8 @@
 //
 // - it is one of those that are always written in parts, which the first table has;
 // - a mark below it follows, which comes before those above in that order, and so may be joined to
-// the
-//   bare letter in their place. The second table has the marks for which there are such letters.
-//   ASCII letters have no parts.
+//   the bare letter in their place. The second table has the marks for which there are such
+//   letters. ASCII letters have no parts.
 //
 // Both tables are compared with Python's normalisation in tests/python/test_names.py.
 #include "names.hpp"

@@ -44,7 +44,8 @@ void lookAtMissing(const Dataset &dataset, double record, std::uint64_t limit) {
     if (bytes > static_cast<double>(limit)) {
         refuse(header, "of what the header of \"" + dataset.path + "\" claims, the file lacks " +
                            inWords(missing) + ", for which " + inWords(bytes) +
-                           " may have to be written");
+                           " may have to be written (it is made as long as it claims when it is "
+                           "opened for writing and closed)");
     }
 }
 
@@ -95,11 +96,15 @@ std::uint64_t tunedRoom(Inputs inputs) {
 }
 
 void take(const Header &found, Dataset &dataset) {
+    dataset.room = found.extent.room;
+    dataset.gaps = found.extent.gaps;
+}
+
+Shortfall shortfallOf(const Header &found) noexcept {
+    constexpr std::uint64_t filling = 3; // the most that is no value, and nobody has to write
     const Extent &extent = found.extent;
-    dataset.room = extent.room;
-    dataset.gaps = extent.gaps;
-    dataset.shortfall =
-        extent.end > found.size ? Shortfall{extent.end, found.size, extent.record} : Shortfall{};
+    return extent.end > sum(found.size, filling) ? Shortfall{extent.end, found.size, extent.record}
+                                                 : Shortfall{};
 }
 
 void lookAtShortfall(const Dataset &dataset, std::uint64_t limit) {

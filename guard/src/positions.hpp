@@ -35,8 +35,11 @@ void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const A
 /// What a tuned end of definitions puts between the variables, at most.
 std::uint64_t tunedRoom(Inputs inputs);
 
-/// Notes what the header of a file says.
+/// Notes how much room a file has by its header.
 void take(const Header &found, Dataset &dataset);
+
+/// What a file that is being opened lacks of what its header claims.
+Shortfall shortfallOf(const Header &found) noexcept;
 
 /// Refuses a redefinition that may have to move, or to fill, more than the limit of what the file
 /// claims and does not have.

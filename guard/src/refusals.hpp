@@ -19,6 +19,7 @@ inline constexpr Refusal
     mode      = {"TESSEL:guard:mode",      "the library follows an invalid pointer when it is given this mode flag without what belongs to it"},
     closed    = {"TESSEL:guard:closed",    "an earlier closing of the dataset failed, and the library may have freed its memory but not its id"},
     name      = {"TESSEL:guard:name",      "the library stores a name as it is composed, and copies it over the end of buffers of the size that its documentation gives"},
+    redefinition = {"TESSEL:guard:redefinition", "the library counts records with 31 bits when it moves them: of more it moves none, and does not say so"},
     lengths   = {"TESSEL:guard:lengths",   "the library would take the length for a negative number, divide by zero, or lay variables over one another"},
     counts    = {"TESSEL:guard:counts",    "the library would write what is beyond the data, or for ever"},
     records   = {"TESSEL:guard:records",   "every record before it would be filled first; with set_fill(ncid, NC_NOFILL) they are left as they are"},

@@ -819,6 +819,9 @@ GUARD: dict[str, str] = {
         "The call was not made: <particulars>, and the library stores a name as it is "
         "composed, and copies it over the end of buffers of the size that its "
         "documentation gives.",
+    "TESSEL:guard:redefinition":
+        "The call was not made: <particulars>, and the library counts records with 31 "
+        "bits when it moves them: of more it moves none, and does not say so.",
     "TESSEL:guard:lengths":
         "The call was not made: <particulars>, and the library would take the length for "
         "a negative number, divide by zero, or lay variables over one another.",

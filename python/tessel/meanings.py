@@ -355,15 +355,21 @@ _GUARD = {
         "The name may become longer than the library's limit when its letters are composed.",
         "Shorten the name, or give it composed (Unicode's form NFC)."),
     "lengths": (
-        "A dimension is longer than the library counts: 2^63 elements, or 2^31 records to be moved.",
-        "Look at where the length comes from. To redefine so many records, copy them to a new file."),
+        "A dimension of the variable is longer than the library counts.",
+        "Look at where the length comes from: a file has room for fewer elements."),
+    "redefinition": (
+        "The dataset has 2^31 records or more, which the library loses when they have to move.",
+        "Copy the data to a new file that is defined as it is to be."),
     "counts": (
         "The counts multiply to more than 64 bits hold.", "Look at where the counts come from."),
     "records": (
         "The write would first fill a great many records before it.",
         "Look at the position; if it is meant, switch filling off with set_fill."),
+    "position": (
+        "What is to be written, or a variable that is defined, would end behind 2^63 bytes.",
+        "Look at where the position, or the lengths of the dimensions, come from."),
     "header": (
-        "The file's header claims what the file cannot hold.",
+        "The file's header claims what the file cannot hold, or does not.",
         "Get the file again; do not open such files in programs without the guard."),
     "remote": (
         "The file name is an address, which the library would fetch.",

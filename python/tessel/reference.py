@@ -228,12 +228,15 @@ def _around(shaped: bool, given: bool) -> tuple[Raised, ...]:
 def _refused(operation: Operation) -> Iterator[Raised]:
     """What the guard looks for before the operation."""
     short = operation.short
+    ends = ("enddef", "end_def", "_enddef", "close")  # of definitions
     words = {
         "remote": operation.opens, "mode": operation.opens,
-        "header": short in ("open", "_open", "sync"),
+        "header": short in ("open", "_open", "sync", "redef", *ends),
         "alignment": short == "_enddef",
         "name": short.startswith(("def_", "rename_", "put_att_", "copy_att")),
         "lengths": short == "def_var",
+        "redefinition": short == "redef",
+        "position": short in ends or short.startswith(("put_var1_", "put_vara_", "put_vars_")),
         "counts": short.startswith(("put_vara_", "put_vars_")),
         "records": short.startswith(("put_var1_", "put_vara_", "put_vars_")),
         "closed": any(each.name.startswith("ncid") for each in operation.arguments),

@@ -25,7 +25,8 @@ std::size_t utf8Length(std::span<const tsChar> utf16) noexcept;
 void writeUtf8(std::span<const tsChar> utf16, char *out) noexcept;
 
 /// Copies a text of nothing but ASCII characters, which are the same in both forms; `out` has room
-/// for as many, and is aligned as blocks are. False, and something or other in `out`, when the text has a character besides.
+/// for as many, and is aligned as blocks are. False, and something or other in `out`, when the text
+/// has a character besides.
 bool copyIfAscii(std::string_view utf8, tsChar *out) noexcept;
 bool copyIfAscii(std::span<const tsChar> utf16, char *out) noexcept;
 

@@ -181,6 +181,21 @@ const Fatal rows[] = {
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
      }},
+    {"CreateInMemoryOfANegativeSize", SIGSEGV, "TESSEL:guard:mode",
+     "there is no memory for 9223372036854775808 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_create", folder.file("a.nc"), 16, 0x1p63, 4096);
+     }},
+    {"ReadOfMappedMemoryThatTheFileLacks", SIGSEGV, "TESSEL:guard:mode",
+     "there is no memory for 281474976710664 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         const std::string file = written(
+             folder, "a.nc",
+             "CDF\5" + words({0, 0}) + words({0, 0, 0}) + words({0, 0, 0}) + words({11, 0, 1}) +
+                 words({0, 1}) + "v\0\0\0"s + words({0, 0}) + words({0, 0, 0}) +
+                 words({6, 0, 8, 0x10000, 0}) + std::string(8000, '\0'));
+         netcdf("get_var_double", netcdf("open", file, 17)[0], 0);
+     }},
     {"OpenByMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mode",
      "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
      [](const Module &netcdf, const Folder &folder) {

@@ -102,6 +102,36 @@ const Passing rows[] = {
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_enddef", intOf(netcdf("create", folder.file("a.nc"), 0)), 0, 0x1p63, 0, 0x1p63);
      }},
+    {"LengthsThatAreTooLargeForTheLibraryByDefault",
+     "TESSEL:netcdf:endDef:formatSizeConstraintsViolated",
+     [](const Module &netcdf, const Folder &folder) {
+         const int former = intOf(netcdf("set_default_format", 5));
+         const int ncid = definingVariable(netcdf, folder, ncDouble, {0x1p62, 2});
+         netcdf("set_default_format", former);
+         netcdf("enddef", ncid);
+     }},
+    {"RedefinitionOfASharedFileThatIsNotFilled", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingVariable(netcdf, folder, ncDouble, {0x1p30}, 2048 + data64);
+         netcdf("set_fill", ncid, noFill);
+         netcdf("_enddef", ncid, 4096, 4, 0, 4);
+         netcdf("redef", ncid);
+         netcdf("put_att_text", ncid, global, "a", "b");
+         netcdf("close", ncid);
+     }},
+    {"RedefinitionOfAFileWithoutItsLastFilling", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int made = definingVariable(netcdf, folder, ncChar, {0}, data64);
+         netcdf("enddef", made);
+         netcdf("put_var1_text", made, 0, 0, "a");
+         netcdf("close", made);
+         const int ncid = intOf(netcdf("open", folder.file("a.nc"), 1));
+         netcdf("set_fill", ncid, noFill);
+         netcdf("redef", ncid);
+         const double x = netcdf("def_dim", ncid, "x", 0x1p31)[0].number();
+         netcdf("def_var", ncid, "w", ncDouble, Array::row({x, 0}));
+         netcdf("close", ncid);
+     }},
     {"LengthsThatAreTooLargeForTheLibrary", "TESSEL:netcdf:endDef:formatSizeConstraintsViolated",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("enddef", definingVariable(netcdf, folder, ncDouble, {2, 0x1p62, 2}, data64));

@@ -184,7 +184,7 @@ int withRecords(const Module &netcdf, const Folder &folder, double number) {
 TEST(Redefinition, OfMoreRecordsThanTheLibraryMoves) {
     const Module netcdf = guardedModule();
     for (const auto &[number, identifier] :
-         {std::pair(0x1p31 - 1, ""), std::pair(0x1p31, "TESSEL:guard:lengths")}) {
+         {std::pair(0x1p31 - 1, ""), std::pair(0x1p31, "TESSEL:guard:redefinition")}) {
         const Folder folder;
         const int ncid = withRecords(netcdf, folder, number);
         EXPECT_EQ(identifierOf([&] { netcdf("redef", ncid); }), identifier) << number;

@@ -192,5 +192,5 @@ def test_a_header_that_cannot_be_believed(tmp_path, way):
 def test_addresses_everywhere(tmp_path, way):
     """None of them is asked for; xarray's engine opens no address whatever the guard says."""
     line = said(way, ADDRESS, tmp_path)
-    assert line in ("remote", "notAClassicFile") or "is an address" in line, line
+    assert line in ("remote", "notAClassicFile", "badPath") or "is an address" in line, line
     assert os.listdir(tmp_path) == []

@@ -186,14 +186,29 @@ def test_real_file_cut(tmp_path, missing):
     assert raised.value.__notes__ == [f"in tessel.check(path={wording.abridged(cut)})\nfile: {cut}"]
 
 
-@pytest.mark.parametrize("kind, count", [("classic", 4), ("64-bit offset", 4), ("cdf5", 8)])
-def test_a_stream_that_does_not_count_its_records(tmp_path, kind, count):
-    """It is not cut off, and the size that so many records would need tells nobody anything."""
-    path = Path(generate(tmp_path / "f.nc", """dimensions: t = UNLIMITED ; x = 3 ;
+def stream(folder: Path, kind: str, count: int) -> tuple[Path, bytearray]:
+    """A file whose count of records, of so many bytes, is -1; and its content."""
+    path = Path(generate(folder / "f.nc", """dimensions: t = UNLIMITED ; x = 3 ;
         variables: double a(t, x) ; short b(x) ; data: a = 1, 2, 3, 4, 5, 6 ; b = 7, 8, 9 ;""", kind))
     data = bytearray(path.read_bytes())
     data[4:4 + count] = b"\xff" * count
     path.write_bytes(data)
+    return path, data
+
+
+def test_a_stream_of_64_bit_data(tmp_path):
+    """The library would take it for a count of more records than can be found."""
+    path, _ = stream(tmp_path, "cdf5", 8)
+    for refused in (lambda: tessel.check(path), lambda: tessel.read(path, "b", check=False)):
+        with pytest.raises(tessel.Error, match="claims data that end behind 2\\^63 bytes") as raised:
+            refused()
+        assert raised.value.identifier == "TESSEL:guard:header"
+
+
+@pytest.mark.parametrize("kind, count", [("classic", 4), ("64-bit offset", 4)])
+def test_a_stream_that_does_not_count_its_records(tmp_path, kind, count):
+    """It is not cut off, and the size that so many records would need tells nobody anything."""
+    path, data = stream(tmp_path, kind, count)
     for refused in (lambda: tessel.check(path), lambda: tessel.read(path, "b")):
         with pytest.raises(tessel.Error) as raised:
             refused()

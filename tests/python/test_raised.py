@@ -101,17 +101,18 @@ NO_ARRAYS: list[tuple[list[int], str, str]] = [
 
 @pytest.mark.parametrize("lengths, short, identifier", NO_ARRAYS)
 def test_variables_that_no_array_holds(lengths: list[int], short: str, identifier: str) -> None:
-    ncid = nc.create("odd.nc", nc.param("64BIT_OFFSET"))
-    dimids = [nc.def_dim(ncid, f"d{i}", length) for i, length in enumerate(lengths)]
-    varid = nc.def_var(ncid, "odd", nc.param("BYTE"), dimids)
-    nc.set_fill(ncid, nc.param("NOFILL"))
-    nc.enddef(ncid)
+    plain = tessel.load("netcdf", "off")  # one of them lies where no file reaches
+    ncid = plain.create("odd.nc", nc.param("64BIT_OFFSET"))
+    dimids = [plain.def_dim(ncid, f"d{i}", length) for i, length in enumerate(lengths)]
+    varid = plain.def_var(ncid, "odd", nc.param("BYTE"), dimids)
+    plain.set_fill(ncid, nc.param("NOFILL"))
+    plain.enddef(ncid)
     operation = operations.find(short)
     assert operation is not None and on_page(operation).fullmatch(identifier)
     block = {"start": [0] * len(lengths), "count": lengths, "stride": [1] * len(lengths)}
     given = [block[each.name] for each in operation.arguments[2:]]
     assert error_of(operation, ncid, varid, *given) == identifier
-    nc.abort(ncid)
+    plain.abort(ncid)
 
 
 # What the guard refuses.
@@ -157,12 +158,70 @@ def enormous() -> int:
     return ncid
 
 
+def claiming(records: int) -> int:
+    """A dataset that is open for writing, of so many records of eight bytes that are not there."""
+    Path("claiming.nc").write_bytes(
+        b"CDF\1" + struct.pack(">4I", records, 10, 1, 1) + b"t\0\0\0"
+        + struct.pack(">6I", 0, 0, 0, 11, 1, 1) + b"v\0\0\0"
+        + struct.pack(">7I", 1, 0, 0, 0, nc.param("DOUBLE"), 8, 80))
+    return nc.open("claiming.nc", "WRITE")
+
+
+def lacking() -> int:
+    """One of which much is to be written when it is redefined."""
+    return claiming(2**30)
+
+
+def lacking_more() -> int:
+    """One of which much is to be written, now that its records become longer."""
+    ncid = claiming(1000)
+    nc.redef(ncid)
+    nc.def_var(ncid, "w", nc.param("DOUBLE"), [nc.def_dim(ncid, "x", 2**20), 0])
+    return ncid
+
+
+def distant() -> int:
+    """A dataset of 64-bit data with records of which no file holds as many as may be asked for."""
+    ncid = nc.create("distant.nc", 32)
+    t = nc.def_dim(ncid, "t", 0)
+    nc.def_var(ncid, "v", nc.param("BYTE"), [nc.def_dim(ncid, "x", 2.0**31), t])
+    nc.def_var(ncid, "text", nc.param("CHAR"), [1, t])
+    nc.set_fill(ncid, nc.param("NOFILL"))
+    nc.enddef(ncid)
+    return ncid
+
+
+def endless() -> int:
+    """A dataset whose variables, which are being defined, end where no file reaches."""
+    ncid = nc.create("endless.nc", 32)
+    dimids = [nc.def_dim(ncid, f"d{i}", 2.0**31) for i in range(2)]
+    for name in ("v", "w"):
+        nc.def_var(ncid, name, nc.param("BYTE"), dimids)
+    return ncid
+
+
+def many() -> int:
+    """A dataset of more records than the library moves."""
+    ncid = nc.create("many.nc", 0)
+    nc.def_var(ncid, "v", nc.param("BYTE"), nc.def_dim(ncid, "t", 0))
+    nc.set_fill(ncid, nc.param("NOFILL"))
+    nc.enddef(ncid)
+    nc.put_var1_schar(ncid, 0, 2**31, numpy.int8(1))
+    return ncid
+
+
 # What the guard refuses, as what arguments are instead, by their names.
 REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
     ("remote", {"path": "https://127.0.0.1:1/a.nc"}),
     ("mode", {"mode": 32768, "path": "none.nc"}),
     ("mode", {"cmode": 64}),
     ("header", {"path": "overwritten.nc", "mode": "NOWRITE", "ncid": overwritten}),
+    ("header", {"ncid": lacking}),
+    ("header", {"ncid": lacking_more}),
+    ("position", {"ncid": endless}),
+    ("position", {"ncid": distant, "varid": 0, "index": [0, 2.0**33], "start": [0, 2.0**33],
+                  "count": [1, 1], "stride": [1, 1]}),
+    ("redefinition", {"ncid": many}),
     ("alignment", {"ncid": defining, "v_align": 0, "r_align": 0}),
     ("name", {"ncid": defining, "ncid_out": defining,
               "name": "\u0344" * 128, "newname": "\u0344" * 128}),
@@ -197,7 +256,7 @@ def test_refused_are_those_whose_page_says_so(word: str) -> None:
                         value = once or value()
                         made += [] if once else [value]
                     given[i] = value
-                elif argument.name == "data" and word == "counts":
+                elif argument.name == "data" and word in ("counts", "position", "records"):
                     given[i] = given[i][:1]
             if error_of(operation, *given) == identifier:
                 refused.add(operation.short)

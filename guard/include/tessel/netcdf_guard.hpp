@@ -32,9 +32,9 @@ struct GuardOptions {
 ///   the guard, and whose closing failed: its memory may be freed
 /// - "TESSEL:guard:name": a name that may become longer than NC_MAX_NAME, 256 bytes, when its
 ///   letters are composed (Unicode's form NFC), in a classic file
-/// - "TESSEL:guard:lengths": a variable over a dimension of 2^63 elements or more, or a
-/// redefinition
-///   of 2^31 records or more, which would be lost
+/// - "TESSEL:guard:lengths": a variable over a dimension of 2^63 elements or more
+/// - "TESSEL:guard:redefinition": a redefinition with 2^31 records or more, which would be lost if
+///   they had to move; whether they will have to, nobody knows by then
 /// - "TESSEL:guard:counts": a write of counts that multiply to more than 64 bits hold
 /// - "TESSEL:guard:records": a write that would first fill more bytes than GuardOptions::fillLimit
 /// - "TESSEL:guard:position": definitions or a write that would put data behind 2^63 bytes
