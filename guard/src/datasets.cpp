@@ -59,7 +59,7 @@ double bytesOf(const Variable &variable, std::span<const double> dimids, Lengths
     constexpr double word = 4;
     // What only files based on HDF5 have is taken for the largest of the others.
     const auto type = static_cast<std::size_t>(variable.type);
-    double bytes = type < typeSizes.size() ? typeSizes[type] : sizeof(double);
+    auto bytes = static_cast<double>(type < typeSizes.size() ? typeSizes[type] : sizeof(double));
     for (const double dimid : dimids) {
         bytes *= lengthOf(dimid);
     }

@@ -64,9 +64,11 @@ class Reader {
         return static_cast<std::uint64_t>(status.st_size);
     }
 
-    [[nodiscard]] bool has(std::uint64_t bytes) { return bytes <= ahead() || bytes <= left(); }
+    [[nodiscard]] bool has(std::uint64_t bytes) const {
+        return bytes <= ahead() || bytes <= left();
+    }
 
-    [[nodiscard]] std::uint64_t left() { return size() - std::min(position, size()); }
+    [[nodiscard]] std::uint64_t left() const { return size() - std::min(position, size()); }
 
     std::uint64_t number(std::size_t bytes) {
         std::uint64_t value = 0;

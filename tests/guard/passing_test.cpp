@@ -307,7 +307,7 @@ std::string writtenWithAlignments(const Module &netcdf, const std::string &file,
     const int ncid = intOf(netcdf("create", file, flags));
     netcdf("def_dim", ncid, "x", records ? 0 : 3);
     netcdf("def_var", ncid, "v", ncDouble, 0);
-    const std::string refused = identifierOf(
+    std::string refused = identifierOf(
         [&] { netcdf("_enddef", ncid, 0, records ? 4 : alignment, 0, records ? alignment : 4); });
     if (!refused.empty()) {
         netcdf("enddef", ncid);

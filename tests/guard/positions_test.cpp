@@ -114,7 +114,7 @@ TEST(Positions, OfVariables) {
 /// Opened for writing, which makes nothing longer yet.
 std::string redefined(const Module &netcdf, const std::string &file) {
     const int ncid = intOf(netcdf("open", file, 1));
-    const std::string identifier = identifierOf([&] { netcdf("redef", ncid); });
+    std::string identifier = identifierOf([&] { netcdf("redef", ncid); });
     netcdf("abort", ncid);
     return identifier;
 }
