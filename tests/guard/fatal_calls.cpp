@@ -235,32 +235,37 @@ const Fatal rows[] = {
          const int ncid = intOf(netcdf("create", folder.file("a.nc"), 0));
          netcdf("def_dim", ncid, repeated(growing, 128), 3);
          netcdf("inq_dim", ncid, 0);
-     }},
+     },
+     41001},
     {"ADimensionsNewNameThatGrows", SIGSEGV, "TESSEL:guard:name", "over the end of buffers",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = definingDataset(netcdf, folder);
          netcdf("rename_dim", ncid, 0, repeated(growing, 128));
          netcdf("inq_dim", ncid, 0);
-     }},
+     },
+     41001},
     {"AnAttributesNameThatGrows", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = definingDataset(netcdf, folder);
          netcdf("put_att_double", ncid, 0, repeated(growing, 128), ncDouble, 1);
          netcdf("inq_attname", ncid, 0, 0);
-     }},
+     },
+     41001},
     {"ATextAttributesNameThatGrows", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = definingDataset(netcdf, folder);
          netcdf("nc_put_att_text", ncid, global, repeated(growing, 128), "text");
          netcdf("inq_attname", ncid, global, 0);
-     }},
+     },
+     41001},
     {"AnAttributesNewNameThatGrows", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = definingDataset(netcdf, folder);
          netcdf("put_att_text", ncid, global, "a", "text");
          netcdf("rename_att", ncid, global, "a", repeated(growing, 128));
          netcdf("inq_attname", ncid, global, 0);
-     }},
+     },
+     41001},
     {"ACopiedAttributesNameThatGrew", SIGSEGV, "TESSEL:guard:name", "may become one of 768",
      [](const Module &netcdf, const Folder &folder) {
          const Module plain = plainModule();
@@ -269,7 +274,8 @@ const Fatal rows[] = {
          const int ncid = definingDataset(netcdf, folder);
          netcdf("copy_att", source, global, repeated(growing, 128), ncid, global);
          netcdf("inq_attname", ncid, global, 0);
-     }},
+     },
+     41001},
     {"NameWhoseLengthTheFileEndsIn", SIGSEGV, "TESSEL:guard:header", "characters in a name",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("inq_dim", open(netcdf, folder, "CDF\5" + words({0, 0, 10, 0, 1, 0}) + "\0\0\x02"s),
@@ -423,7 +429,8 @@ const Fatal rows[] = {
          const std::string file = written(folder, "a.nc", manyLongRecords(1U << 30U));
          const int ncid = intOf(netcdf("open", file, mapped));
          netcdf("get_var1_double", ncid, 0, Array::row({0x1p30, 0x1p30 - 1}));
-     }},
+     },
+     41001},
     {"OpenOfManyRecordsOfNineVariables", SIGSEGV, "TESSEL:guard:header",
      "claims data that end behind 2^63 bytes",
      [](const Module &netcdf, const Folder &folder) {
@@ -432,7 +439,8 @@ const Fatal rows[] = {
          constexpr double record = 9 * 8 * ((1U << 29U) - 1.0);
          netcdf("get_var1_double", ncid, 0,
                 Array::row({0, std::floor((0x1p64 - 0x1p36) / record)}));
-     }},
+     },
+     41001},
     {"AnEndOfDefinitionsOfALargeClassicVariable", SIGSEGV, "TESSEL:guard:position",
      "the variables end behind 2^63 bytes",
      [](const Module &netcdf, const Folder &folder) {
