@@ -23,6 +23,7 @@
 #include <iterator>
 #include <limits>
 #include <optional>
+#include <span>
 #include <string_view>
 #include <system_error>
 
@@ -42,10 +43,10 @@ constexpr int data64 = 0x20;
 constexpr int noFill = 0x100;
 constexpr double tooLong = 0x1p63; // elements, which the library takes for a negative number
 constexpr std::uint64_t alignmentThatWraps = std::uint64_t{1} << 63U;
-constexpr std::uint64_t alignToChunks = UINT64_MAX; // a name for the usual alignment
-constexpr int share = 0x800;                        // others change the file, too
-constexpr std::size_t secondDataset = 4;            // among the inputs of copy_att
-constexpr std::array hdf5Formats = {3, 4};          // as set_default_format has them
+constexpr int share = 0x800;               // others change the file, too
+constexpr std::size_t secondDataset = 4;   // among the inputs of copy_att
+constexpr std::array hdf5Formats = {3, 4}; // as set_default_format has them
+constexpr std::array data64Formats = {5};
 
 Datasets &datasets() {
     static auto &all = *new Datasets; // never destroyed: threads may outlive the end of main
@@ -225,11 +226,10 @@ void settleMode(int ncid, Dataset &dataset, const Ask &ask) {
     dataset.modeInDoubt = false;
 }
 
-/// Whether a new file will be of 64-bit data.
-bool makesData64(int flags) {
-    constexpr int byDefault = 5;
-    return (flags & data64) != 0 ||
-           (datasets().defaultFormat == byDefault && (flags & (hdf5 | ofClassicFormats)) == 0);
+/// Whether a new file will be of one of these formats, because no flag says otherwise.
+bool isByDefault(int flags, std::span<const int> formats) {
+    return (flags & (hdf5 | ofClassicFormats)) == 0 &&
+           std::find(formats.begin(), formats.end(), datasets().defaultFormat) != formats.end();
 }
 
 /// Whether the file will be of a classic format.
@@ -238,9 +238,7 @@ bool lookAtCreation(int flags) {
         refuse(mode, "the flag " + std::to_string(flags & userFormats) +
                          " (a user-defined format) is set");
     }
-    const bool hdf5ByDefault = std::find(hdf5Formats.begin(), hdf5Formats.end(),
-                                         datasets().defaultFormat) != hdf5Formats.end();
-    return (flags & hdf5) == 0 && (!hdf5ByDefault || (flags & ofClassicFormats) != 0);
+    return (flags & hdf5) == 0 && !isByDefault(flags, hdf5Formats);
 }
 
 void lookAtAlignment(Inputs inputs, int ncid, const Dataset *dataset, const Ask &ask) {
@@ -475,7 +473,7 @@ class Guard : public Watcher {
             if (creates) {
                 lookAtMapping(flags, tuned);
                 dataset.room = 0;
-                dataset.data64 = makesData64(flags);
+                dataset.data64 = (flags & data64) != 0 || isByDefault(flags, data64Formats);
                 dataset.classic = lookAtCreation(flags);
             } else {
                 // A number that would be negative the library leaves alone.

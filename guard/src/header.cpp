@@ -3,6 +3,7 @@
 
 #include "bytes.hpp"
 #include "external_types.hpp"
+#include "names.hpp"
 
 #include <dirent.h>
 #include <fcntl.h>
@@ -24,7 +25,6 @@ namespace tessel::guard {
 namespace {
 
 // The library's limits.
-constexpr std::uint64_t maxName = 256;
 constexpr std::uint64_t maxDimensions = 1024;
 constexpr std::uint64_t maxLength = std::numeric_limits<std::int64_t>::max();
 
@@ -171,9 +171,9 @@ class Walk {
 
     void name() {
         const std::uint64_t length = count("characters in a name");
-        if (length > maxName) {
+        if (length > longestName) {
             throw Distrusted{"has a name of " + std::to_string(length) + " characters, where " +
-                             std::to_string(maxName) + " are the most"};
+                             std::to_string(longestName) + " are the most"};
         }
         reader.skip(padded(length));
     }

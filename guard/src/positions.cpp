@@ -17,8 +17,7 @@ namespace {
 /// nobody says, and for the blocks that are read and written at once.
 constexpr double mostBytes = 0x1p63 - 0x1p32;
 
-constexpr double tooLarge = 0x1p63;                 // which the library says itself, of 64-bit data
-constexpr std::uint64_t alignOfAChunk = UINT64_MAX; // NC_ALIGN_CHUNK, which is a block of the disk
+constexpr double tooLarge = 0x1p63; // which the library says itself, of 64-bit data
 
 double bytesOf(const Layout &layout, std::uint64_t number) {
     return layout.fixed + static_cast<double>(number) * layout.record;
@@ -90,7 +89,7 @@ std::uint64_t tunedRoom(Inputs inputs) {
     std::uint64_t room = 0;
     for (const tsArray *const input : inputs.subspan(2)) {
         const std::uint64_t bytes = size(input).value_or(0);
-        room = sum(room, bytes == alignOfAChunk ? 0 : bytes);
+        room = sum(room, bytes == alignToChunks ? 0 : bytes);
     }
     return room;
 }

@@ -12,6 +12,9 @@
 
 namespace tessel::guard {
 
+/// The alignment that is none, but a name for a block of the disk (NC_ALIGN_CHUNK).
+inline constexpr std::uint64_t alignToChunks = UINT64_MAX;
+
 /// A dataset of less room than this has all positions within 64 bits: the library writes to no
 /// record beyond 2^32 but those of one block, which has fewer elements than there is memory for.
 inline constexpr std::uint64_t modestRoom = std::uint64_t{1} << 28U;

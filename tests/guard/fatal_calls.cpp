@@ -45,10 +45,7 @@ std::string variableOfType(std::uint32_t type) {
 /// In mapped memory, without filling: records of 2^34 bytes. Where a position wraps in a file, it
 /// depends on the position what comes of it; here no memory is.
 int longRecords(const Module &netcdf, const Folder &folder) {
-    const int ncid = definingVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64 + mapped);
-    netcdf("set_fill", ncid, noFill);
-    netcdf("enddef", ncid);
-    return ncid;
+    return unfilledVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64 + mapped);
 }
 
 /// A file of 64-bit data with records of 2^31 doubles, and so many of them.
@@ -99,14 +96,6 @@ int beyondAllFiles(const Module &netcdf, const Folder &folder) {
 int definingDataset(const Module &netcdf, const Folder &folder) {
     const int ncid = newDataset(netcdf, folder.file("a.nc"));
     netcdf("redef", ncid);
-    return ncid;
-}
-
-/// A dataset that is created with these flags while the default is another format.
-int datasetWithDefault(const Module &netcdf, const Folder &folder, int format, int flags) {
-    const int former = intOf(netcdf("set_default_format", format));
-    const int ncid = newDataset(netcdf, folder.file("a.nc"), flags);
-    netcdf("set_default_format", former);
     return ncid;
 }
 
@@ -294,9 +283,7 @@ const Fatal rows[] = {
     {"CloseAgainAfterAChangeOnAFullDisk", SIGSEGV, "TESSEL:netcdf:close:fileTooLarge",
      "Close operation failed, library error message \"File too large\"",
      [](const Module &netcdf, const Folder &folder) {
-         const int ncid = definingVariable(netcdf, folder, ncDouble, {20000});
-         netcdf("set_fill", ncid, noFill);
-         netcdf("enddef", ncid);
+         const int ncid = unfilledVariable(netcdf, folder, ncDouble, {20000});
          netcdf("rename_var", ncid, 0, "w");
          netcdf("put_var1_double", ncid, 0, 19999, 1);
          const FullDisk full;
@@ -444,17 +431,14 @@ const Fatal rows[] = {
     {"AnEndOfDefinitionsOfALargeClassicVariable", SIGSEGV, "TESSEL:guard:position",
      "the variables end behind 2^63 bytes",
      [](const Module &netcdf, const Folder &folder) {
-         const int ncid =
-             definingVariable(netcdf, folder, ncChar, {0x1p21, 0x1p21, 0x1p22}, mapped);
-         netcdf("set_fill", ncid, noFill);
-         netcdf("enddef", ncid);
+         const int ncid = unfilledVariable(netcdf, folder, ncChar, {0x1p21, 0x1p21, 0x1p22}, mapped);
          netcdf("put_var1_text", ncid, 0, Array::row({0, 0, 0x1p20}), "a");
      }},
     {"RedefiningWhatTheFileLacks", SIGXFSZ, "TESSEL:guard:header", "the file lacks 17179869",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = openForWriting(netcdf, folder, 1U << 30U, 16);
          netcdf("redef", ncid);
-         netcdf("put_att_text", ncid, -1, "a", std::string(1000, 'a'));
+         netcdf("put_att_text", ncid, global, "a", std::string(1000, 'a'));
          netcdf("enddef", ncid);
      }},
     {"LongerRecordsThatTheFileLacks", SIGXFSZ, "TESSEL:guard:header", "the file lacks 268435",

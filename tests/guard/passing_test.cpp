@@ -48,9 +48,7 @@ const Passing rows[] = {
      }},
     {"AlignmentOfAnHdf5FileByDefault", "",
      [](const Module &netcdf, const Folder &folder) {
-         const int former = intOf(netcdf("set_default_format", 3));
-         const int ncid = newDataset(netcdf, folder.file("a.nc"));
-         netcdf("set_default_format", former);
+         const int ncid = datasetWithDefault(netcdf, folder, 3, 0);
          netcdf("redef", ncid);
          netcdf("_enddef", ncid, 0, 0, 0, 0);
      }},
@@ -68,9 +66,7 @@ const Passing rows[] = {
      }},
     {"AlignmentOfAnHdf5FileByDefaultWithOtherFlags", "",
      [](const Module &netcdf, const Folder &folder) {
-         const int former = intOf(netcdf("set_default_format", 4));
-         const int ncid = newDataset(netcdf, folder.file("a.nc"), 8192);
-         netcdf("set_default_format", former);
+         const int ncid = datasetWithDefault(netcdf, folder, 4, 8192);
          netcdf("redef", ncid);
          netcdf("_enddef", ncid, 0, 0, 0, 0);
      }},

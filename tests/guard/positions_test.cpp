@@ -23,9 +23,7 @@ bool isLetThrough(const std::string &identifier) {
 TEST(Positions, OfRecords) {
     const Folder folder;
     const Module netcdf = guardedModule();
-    const int ncid = definingVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64);
-    netcdf("set_fill", ncid, noFill);
-    netcdf("enddef", ncid);
+    const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64);
     const auto element = [&](double record) {
         return identifierOf([&] {
             netcdf("put_var1_double", ncid, 0, Array::row({0, record}), 1);
@@ -57,9 +55,7 @@ TEST(Positions, OfRecords) {
 TEST(Positions, WrapIntoTheHeaderWithoutTheGuard) {
     const Folder folder;
     const Module netcdf = plainModule();
-    const int ncid = definingVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64);
-    netcdf("set_fill", ncid, noFill);
-    netcdf("enddef", ncid);
+    const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0, 0x1p31}, data64);
     for (int i = 1; i < 18; ++i) {
         netcdf("put_var1_double", ncid, 0, Array::row({0x1p31 - i, 0x1p30 - 1}), 1);
     }
@@ -71,9 +67,7 @@ TEST(Positions, WrapIntoTheHeaderWithoutTheGuard) {
 TEST(Positions, OfRecordsThatGrow) {
     const Folder folder;
     const Module netcdf = guardedModule();
-    const int ncid = definingVariable(netcdf, folder, ncChar, {0, 0x1p20}, data64);
-    netcdf("set_fill", ncid, noFill);
-    netcdf("enddef", ncid);
+    const int ncid = unfilledVariable(netcdf, folder, ncChar, {0, 0x1p20}, data64);
     netcdf("put_var1_text", ncid, 0, Array::row({0, 0x1p20}),
            "a"); // a TiB, of which there is a byte
     netcdf("redef", ncid);
@@ -172,9 +166,7 @@ TEST(Shortfall, IsOfTheRecordsThatWillBe) {
 
 /// A file that is a hole between its first record and its last, which are a byte each.
 int withRecords(const Module &netcdf, const Folder &folder, double number) {
-    const int made = definingVariable(netcdf, folder, ncChar, {0});
-    netcdf("set_fill", made, noFill);
-    netcdf("enddef", made);
+    const int made = unfilledVariable(netcdf, folder, ncChar, {0});
     netcdf("put_var1_text", made, 0, 0, "a");
     netcdf("put_var1_text", made, 0, number - 1, "z");
     netcdf("close", made);
@@ -202,7 +194,7 @@ TEST(Redefinition, LosesTheRecordsWithoutTheGuard) {
     const int ncid = withRecords(netcdf, folder, 0x1p31 + 10);
     netcdf("set_fill", ncid, noFill);
     netcdf("redef", ncid);
-    netcdf("put_att_text", ncid, -1, "a", std::string(5000, 'x'));
+    netcdf("put_att_text", ncid, global, "a", std::string(5000, 'x'));
     netcdf("enddef", ncid);
     EXPECT_EQ(netcdf("get_var1_text", ncid, 0, 0)[0].utf8(), "") << "a zero, where an a was";
     netcdf("abort", ncid);

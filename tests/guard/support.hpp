@@ -145,6 +145,23 @@ inline int definingVariable(const Module &netcdf, const Folder &folder, double t
     return ncid;
 }
 
+/// The same in data mode, and never filled.
+inline int unfilledVariable(const Module &netcdf, const Folder &folder, double type,
+                            std::initializer_list<double> lengths, int flags = 0) {
+    const int ncid = definingVariable(netcdf, folder, type, lengths, flags);
+    netcdf("set_fill", ncid, noFill);
+    netcdf("enddef", ncid);
+    return ncid;
+}
+
+/// A dataset that is created with these flags while the default is another format.
+inline int datasetWithDefault(const Module &netcdf, const Folder &folder, int format, int flags) {
+    const int former = intOf(netcdf("set_default_format", format));
+    const int ncid = newDataset(netcdf, folder.file("a.nc"), flags);
+    netcdf("set_default_format", former);
+    return ncid;
+}
+
 /// In define mode, which it cannot leave: the fill value has two values instead of one.
 inline int unclosable(const Module &netcdf, const Folder &folder, int flags = 0) {
     const int ncid = definingVariable(netcdf, folder, ncInt, {3}, flags);
