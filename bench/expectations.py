@@ -13,8 +13,8 @@ TYPES = (*NUMBERS, "text")
 FAMILIES = ("get_var", "get_var1", "get_vara", "get_vars", "get_att",
             "put_var", "put_var1", "put_vara", "put_vars", "put_att")
 BLOCKS = tuple(each for each in FAMILIES if not each.endswith("var1"))
-INQUIRIES = ("inq_libvers", "inq", "inq_dim", "inq_dimid, inputs at hand", "inq_varid", "inq_var", "inq_att",
-             "inq_attid", "inq_attname")
+INQUIRIES = ("inq_libvers", "inq", "inq_dim", "inq_dimid, inputs at hand", "inq_varid", "inq_var",
+             "inq_att", "inq_attid", "inq_attname")
 
 
 class Limit(NamedTuple):
@@ -79,17 +79,18 @@ STRIDED = MORE_FUNCTIONS + "; the library's strided functions take longer after 
 NAMED = "the guard looks at the name of the operation, too; see [With the guard](#with-the-guard)"
 WATCHED = ("the guard finds the dataset, and whether the variable has records, in what it knows, "
            "before the module sees the call; see [With the guard](#with-the-guard)")
-ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters, which are "
-         "twice as large, are zeros before they are anything else; to widen them takes longer than "
-         "the quarter by itself; see [Blocks of text](#blocks-of-text)")
+ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters, which "
+         "are twice as large, are zeros before they are anything else; to widen them takes longer "
+         "than the quarter by itself; see [Blocks of text](#blocks-of-text)")
 UNCOPIED = ("nothing is copied or added on this way; the row shows the worst of six types, whose "
             "medians stray by as much below one as above it; see "
             "[Blocks of numbers](#blocks-of-numbers)")
 
 NOISE = ("both sides leave nearly all of the work to the library, and a difference below 3 % is "
          "noise")
-NEW_PAGES = ("both sides leave nearly all of the work to the library and to the system, which finds "
-             "new pages for the file: where it is short of them, either side may be the longer one")
+NEW_PAGES = ("both sides leave nearly all of the work to the library and to the system, which "
+             "finds new pages for the file: where it is short of them, either side may be the "
+             "longer one")
 
 FILLED = ("for each call, the library moves in the file twice and fills its buffer of 8 KiB, which "
           "takes longer than the rest and is more than a twentieth of the other side's time by "

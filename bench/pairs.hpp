@@ -44,11 +44,10 @@ struct Pair {
 /// Markdown of how they compare. The median is what one run usually sees; the shortest repetition
 /// is what a machine that does other work besides disturbs least; it is also compared with the
 /// second references, where there are any. `--write FILE` puts the table into a document as well,
-/// between the marks
-/// "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; `--quick` does everything twice only, to show
-/// that it works; `--json FILE` keeps all repetitions, in the form of Google Benchmark; `--perf
-/// FOLDER` is for profiles.py; the rest of the command line goes to Google Benchmark. Gives back
-/// main's status.
+/// between the marks "<!-- TITLE: begin -->" and "<!-- TITLE: end -->"; `--quick` does everything
+/// twice only, to show that it works; `--json FILE` keeps all repetitions, in the form of Google
+/// Benchmark; `--perf FOLDER` is for profiles.py; the rest of the command line goes to Google
+/// Benchmark. Gives back main's status.
 int measure(int argc, char **argv, const std::string &title, const std::vector<Pair> &pairs);
 
 /// Whether `--quick` is on the command line, so that a program can do with less.

@@ -67,8 +67,8 @@ def documents(root: Path) -> list[Path]:
 
 def linked(text: str, home: str) -> str:
     """A document with its links as they are in the book: to its other pages, or only their text.
-    One that shows a file's name shows the page's title there. Places that HTML names in it are named
-    as Sphinx wants it."""
+    One that shows a file's name shows the page's title there. Places that HTML names in it are
+    named as Sphinx wants it."""
     places = set(re.findall(r'^<a name="(\w+)"></a>', text, re.M))
     text = re.sub(r'^<a name="(\w+)"></a>', r"(\1)=\n", text, flags=re.M)
 

@@ -80,7 +80,8 @@ def data_kind(dtype: str, host_class: str) -> Kind:
     return Kind(f"Numbers | NDArray[numpy.{dtype}]", f"array of {dtype}, or numbers exact in it",
                 host_class, f"{{name}} if type({{name}}) is ndarray else "
                 f"numbers({{name}}, dtypes['{dtype}'])",
-                (("TESSEL:python:notExact", f"has a Python number that {dtype} cannot hold exactly"),))
+                (("TESSEL:python:notExact",
+                  f"has a Python number that {dtype} cannot hold exactly"),))
 
 
 NUMBER = ResultKind("int", "int", "double, 1-by-1", "{value}", count=True)
