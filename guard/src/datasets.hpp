@@ -2,6 +2,7 @@
 #pragma once
 
 #include "header.hpp"
+#include "mapping.hpp"
 #include "tessel/runtime/watcher.hpp"
 
 #include <cstdint>
@@ -29,6 +30,7 @@ struct Dataset {
     bool classic = true; // not based on HDF5
     bool data64 = false; // of 64-bit data
     bool writable = true;
+    Mapping mapping = Mapping::none;
     bool shared = false; // its header is read again when it is redefined
     bool defining = false;
     bool modeInDoubt = false; // it may have left define mode

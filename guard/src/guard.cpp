@@ -4,14 +4,13 @@
 #include "bytes.hpp"
 #include "datasets.hpp"
 #include "header.hpp"
+#include "mapping.hpp"
 #include "names.hpp"
 #include "operations.hpp"
 #include "positions.hpp"
 #include "refusals.hpp"
 
 #include "tessel/array.h"
-
-#include <sys/mman.h>
 
 #include <algorithm>
 #include <array>
@@ -35,8 +34,6 @@ namespace {
 constexpr int userFormats = 0x40 | 0x80; // what belongs to them cannot be registered here
 constexpr int inMemory = 0x8000;         // the file's name stands for memory that is not there
 constexpr int answeredBefore = 0x08 | 0x10 | userFormats; // with these, open fails by itself
-constexpr int diskless = 0x8;                             // the file is kept in memory
-constexpr int mapped = 0x10;                              // and is that memory
 constexpr int hdf5 = 0x1000;
 constexpr int ofClassicFormats = 0x20 | 0x100 | 0x200; // each of them outweighs the default format
 constexpr int data64 = 0x20;
@@ -116,23 +113,6 @@ void unlessRefused(const Look &look) {
         if (!isModules(error)) {
             throw;
         }
-    }
-}
-
-/// Whether so much of a file can be mapped.
-bool isMappable(std::uint64_t bytes) {
-    void *const memory = mmap(nullptr, bytes, PROT_READ | PROT_WRITE,
-                              MAP_PRIVATE | MAP_ANONYMOUS | MAP_NORESERVE, -1, 0);
-    return memory != MAP_FAILED && munmap(memory, bytes) == 0;
-}
-
-/// In mapped memory, the library maps what it is told that a new file begins with, what it is told
-/// to read an old one by, and what an old one that may become longer claims. Where that cannot be,
-/// it writes to an address that there is not.
-void lookAtMapping(int flags, std::uint64_t bytes) {
-    if ((flags & (mapped | diskless)) == mapped && bytes > 0 && !isMappable(bytes)) {
-        refuse(mode, "the flag 16 (NC_MMAP) is set, and there is no memory for " +
-                         std::to_string(bytes) + " bytes");
     }
 }
 
@@ -372,7 +352,7 @@ bool needsNoLook(const Dataset *dataset, int varid) {
         return false;
     }
     if (!dataset->classic || dataset->defining ||
-        (!dataset->filling && dataset->room < modestRoom)) {
+        (!dataset->filling && dataset->room < modestRoom && dataset->mapping == Mapping::none)) {
         return true;
     }
     const auto known = dataset->hasRecords.find(varid);
@@ -390,7 +370,8 @@ std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *da
         const std::uint64_t added = fills ? end - std::min(end, number) : 0;
         return added - std::min(added, write.count[0]);
     };
-    if (dataset != nullptr && filled(dataset->records) == 0 && liesWithin(*dataset, end)) {
+    if (dataset != nullptr && filled(dataset->records) == 0 && liesWithin(*dataset, end) &&
+        (dataset->mapping == Mapping::none || end <= dataset->records)) {
         return dataset->hasRecords.contains(varid) ? end : 0;
     }
     const std::optional<Layout> found = recordsOf(ncid, varid, ask);
@@ -433,7 +414,7 @@ class Guard : public Watcher {
     }
 
     void after(Inputs inputs, const Results &results, const Error *error) noexcept override {
-        if (kind != Kind::other) {
+        if (kind != Kind::other && !(isWrite() && recordsEnd == 0)) {
             remember(inputs, results, error);
         }
     }
@@ -469,18 +450,22 @@ class Guard : public Watcher {
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             dataset.shared = (flags & share) != 0;
+            dataset.mapping = mappingOf(flags, creates);
+            // It maps what it is told that a new file begins with, what it is told to read an old
+            // one by, and what an old one that may become longer claims.
             const std::uint64_t tuned = inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0;
             if (creates) {
-                lookAtMapping(flags, tuned);
+                lookAtMapping(dataset.mapping, tuned);
                 dataset.room = 0;
                 dataset.data64 = (flags & data64) != 0 || isByDefault(flags, data64Formats);
                 dataset.classic = lookAtCreation(flags);
             } else {
                 // A number that would be negative the library leaves alone.
-                lookAtMapping(flags, tuned <= std::numeric_limits<std::int64_t>::max() ? tuned : 0);
+                lookAtMapping(dataset.mapping,
+                              tuned <= std::numeric_limits<std::int64_t>::max() ? tuned : 0);
                 const Header found = lookAtOpening(dataset.path, flags);
                 if (dataset.writable && found.extent.end > found.size) {
-                    lookAtMapping(flags, found.extent.end);
+                    lookAtMapping(dataset.mapping, found.extent.end);
                 }
                 dataset.file = found.file;
                 dataset.classic = found.classic;

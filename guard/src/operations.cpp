@@ -9,6 +9,7 @@
 #include <cstdint>
 #include <cstring>
 #include <limits>
+#include <span>
 #include <string_view>
 #include <type_traits>
 
@@ -43,11 +44,11 @@ constexpr std::array rows = {
     Row{"copy_att", Kind::copyAttribute, 6},
 };
 
-/// The typed families, whose names end with a type.
+/// The typed families, whose names end with a type; those that do least per call come first.
 constexpr std::array families = {
-    Row{"put_att_text", Kind::writeAttribute, 5}, Row{"put_att_", Kind::writeAttribute, 6},
-    Row{"put_var1_", Kind::writeElement, 5},      Row{"put_vara_", Kind::writeBlock, 6},
-    Row{"put_vars_", Kind::writeStrided, 7},
+    Row{"put_var1_", Kind::writeElement, 5},  Row{"put_vara_", Kind::writeBlock, 6},
+    Row{"put_vars_", Kind::writeStrided, 7},  Row{"put_att_text", Kind::writeAttribute, 5},
+    Row{"put_att_", Kind::writeAttribute, 6},
 };
 
 struct NamePlace {
@@ -63,20 +64,31 @@ constexpr std::array namePlaces = {
 
 constexpr std::string_view longPrefix = "nc_";
 
+using Units = std::span<const tsChar>;
+
+constexpr tsChar lowered(tsChar unit) {
+    return unit >= 'A' && unit <= 'Z' ? static_cast<tsChar>(unit + ('a' - 'A')) : unit;
+}
+
+constexpr bool startsWith(Units units, std::string_view lower) {
+    return units.size() >= lower.size() &&
+           std::equal(lower.begin(), lower.end(), units.begin(),
+                      [](char letter, tsChar unit) { return lowered(unit) == letter; });
+}
+
 /// A name of an operation, lower-cased, up to the first zero. No operation has a longer one.
 class Name {
   public:
-    explicit Name(const tsArray *input) noexcept {
-        const auto *const units = static_cast<const tsChar *>(tsGetData(input));
-        const std::size_t n = tsGetNumberOfElements(input);
-        for (std::size_t i = 0; i < n && units[i] != 0; ++i) {
-            if (length == text.size() || units[i] > 0x7F) {
+    explicit Name(Units units) noexcept {
+        for (const tsChar unit : units) {
+            if (unit == 0) {
+                return;
+            }
+            if (length == text.size() || unit > 0x7F) {
                 length = 0;
                 return;
             }
-            const auto letter = static_cast<char>(units[i]);
-            text[length++] =
-                letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter + ('a' - 'A')) : letter;
+            text[length++] = static_cast<char>(lowered(unit));
         }
     }
 
@@ -139,20 +151,21 @@ Kind kindOf(Inputs inputs) {
     if (inputs.empty() || tsGetClassID(inputs[0]) != tsCHAR) {
         return Kind::other;
     }
-    const Name lowered(inputs[0]);
-    std::string_view name = lowered.view();
-    if (name.starts_with(longPrefix)) {
-        name.remove_prefix(longPrefix.size());
+    Units units(static_cast<const tsChar *>(tsGetData(inputs[0])),
+                tsGetNumberOfElements(inputs[0]));
+    if (startsWith(units, longPrefix)) {
+        units = units.subspan(longPrefix.size());
     }
     // Nearly all calls read or inquire.
-    if (name.starts_with("get_") || name.starts_with("inq")) {
+    if (startsWith(units, "get_") || startsWith(units, "inq")) {
         return Kind::other;
     }
-    if (name.starts_with("put_")) {
+    if (startsWith(units, "put_")) {
         return kindIn(families, inputs.size(),
-                      [&](const Row &row) { return name.starts_with(row.name); });
+                      [&](const Row &row) { return startsWith(units, row.name); });
     }
-    return kindIn(rows, inputs.size(), [&](const Row &row) { return name == row.name; });
+    const Name name(units);
+    return kindIn(rows, inputs.size(), [&](const Row &row) { return row.name == name.view(); });
 }
 
 std::optional<std::size_t> placeOfNewName(Kind kind) noexcept {

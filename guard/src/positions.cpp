@@ -3,6 +3,7 @@
 
 #include "bytes.hpp"
 #include "header.hpp"
+#include "mapping.hpp"
 #include "refusals.hpp"
 
 #include <sys/stat.h>
@@ -62,12 +63,17 @@ void lookAtEnd(std::uint64_t number, const Layout &layout, const Dataset *datase
                              "records of " + inWords(layout.record) +
                              " that is behind 2^63 bytes, where no file reaches");
     }
+    if (dataset != nullptr) {
+        lookAtMapping(dataset->mapping, static_cast<std::uint64_t>(gaps + bytesOf(layout, number)));
+    }
 }
 
 void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const Ask &ask,
                   std::uint64_t limit) {
     const bool isShort = dataset != nullptr && dataset->shortfall.end > 0;
-    if (dataset != nullptr && sum(dataset->room, tuned) < modestRoom && !isShort) {
+    const Mapping mapping = dataset == nullptr ? Mapping::none : dataset->mapping;
+    if (dataset != nullptr && sum(dataset->room, tuned) < modestRoom && !isShort &&
+        mapping == Mapping::none) {
         return;
     }
     const Layout layout = layoutOf(ncid, ask);
@@ -80,6 +86,8 @@ void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const A
     if (gaps + bytes > mostBytes && !answered) {
         refuse(position, "the variables end behind 2^63 bytes, where no file reaches");
     }
+    // It is mapped no later than the first read or write at its end.
+    lookAtMapping(mapping, answered ? 0 : static_cast<std::uint64_t>(gaps + bytes));
     if (isShort) {
         lookAtMissing(*dataset, layout.record, limit);
     }

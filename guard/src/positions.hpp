@@ -27,11 +27,13 @@ inline bool liesWithin(const Dataset &dataset, std::uint64_t records) noexcept {
 /// A number of bytes, for a message.
 std::string inWords(double bytes);
 
-/// Refuses a write that makes the dataset this many records long, where they do not fit.
+/// Refuses a write that makes the dataset this many records long, where they do not fit into a
+/// file, or into the memory that is mapped in its place.
 void lookAtEnd(std::uint64_t number, const Layout &layout, const Dataset *dataset);
 
-/// Refuses an end of definitions that lays variables where no file reaches, or that would write
-/// more than the limit to records that the file claims and does not have.
+/// Refuses an end of definitions that lays variables where no file reaches, or no memory can be
+/// mapped, or that would write more than the limit to records that the file claims and does not
+/// have.
 void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const Ask &ask,
                   std::uint64_t limit);
 

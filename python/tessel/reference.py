@@ -228,17 +228,18 @@ def _around(shaped: bool, given: bool) -> tuple[Raised, ...]:
 def _refused(operation: Operation) -> Iterator[Raised]:
     """What the guard looks for before the operation."""
     short = operation.short
-    ends = ("enddef", "end_def", "_enddef", "close")  # of definitions
+    ends = short in ("enddef", "end_def", "_enddef", "close")  # definitions
+    writes = short.startswith(("put_var1_", "put_vara_", "put_vars_"))
     words = {
-        "remote": operation.opens, "mode": operation.opens,
-        "header": short in ("open", "_open", "sync", "redef", *ends),
+        "remote": operation.opens, "mode": operation.opens or ends or writes,
+        "header": short in ("open", "_open", "sync", "redef") or ends,
         "alignment": short == "_enddef",
         "name": short.startswith(("def_", "rename_", "put_att_", "copy_att")),
         "lengths": short == "def_var",
         "redefinition": short == "redef",
-        "position": short in ends or short.startswith(("put_var1_", "put_vara_", "put_vars_")),
+        "position": ends or writes,
         "counts": short.startswith(("put_vara_", "put_vars_")),
-        "records": short.startswith(("put_var1_", "put_vara_", "put_vars_")),
+        "records": writes,
         "closed": any(each.name.startswith("ncid") for each in operation.arguments),
     }
     for word, may in words.items():

@@ -11,7 +11,6 @@ using namespace std::string_literals;
 
 constexpr double wraps = -1; // as a count: 2^64-1
 constexpr int share = 2048;
-constexpr int mapped = 16;
 constexpr double longest = 0x1p60 - 0x1p7; // of doubles, in a file of 64-bit data
 
 /// Closed once, which failed.
@@ -190,6 +189,33 @@ const Fatal rows[] = {
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
          netcdf("_open", folder.file("a.nc"), 16, 1e15);
+     }},
+    {"ARecordBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mode",
+     "the flag 16 (NC_MMAP) is set, and there is no memory for 180144",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("put_var1_double", longRecords(netcdf, folder), 0, Array::row({0, 0x1p20}), 1);
+     }},
+    {"ARecordBehindThePromisedMemory", SIGSEGV, "TESSEL:guard:mode", "no memory for 10737418",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped);
+         const LittleMemory little;
+         netcdf("put_var1_double", ncid, 0, 0x1p27, 1);
+     }},
+    {"ABlockOfRecordsBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mode", "no memory for 180144",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("put_vara_double", longRecords(netcdf, folder), 0, Array::row({0, 0x1p20 - 1}),
+                Array::row({1, 2}), Array::row({1, 2}));
+     }},
+    {"DefinitionsThatCannotBeMapped", SIGSEGV, "TESSEL:guard:mode", "no memory for 900719925474",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid =
+             unfilledVariable(netcdf, folder, ncDouble, {0x1p25, 0x1p25}, data64 + mapped);
+         netcdf("get_var1_double", ncid, 0, Array::row({0x1p25 - 1, 0x1p25 - 1}));
+     }},
+    {"DefinitionsBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mode", "no memory for 1000000000",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = definingVariable(netcdf, folder, ncInt, {3}, mapped + offset64);
+         netcdf("_enddef", ncid, 1e15, 4, 0, 4);
      }},
     {"OpenOfATypeWithoutSize", SIGFPE, "TESSEL:guard:header", "has a variable of the type 12",
      [](const Module &netcdf, const Folder &folder) { open(netcdf, folder, variableOfType(12)); },

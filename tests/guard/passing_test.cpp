@@ -58,6 +58,26 @@ const Passing rows[] = {
          netcdf("close", netcdf("_open", folder.file("a.nc"), 16, 0x1p40)[1]);
          netcdf("close", netcdf("_open", folder.file("a.nc"), 16, 0x1p63)[1]);
      }},
+    {"RecordsInMappedMemory", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped);
+         netcdf("put_var1_double", ncid, 0, 0x1p20, 1);
+         const LittleMemory little;
+         netcdf("put_var1_double", ncid, 0, 0x1p21, 1);
+         netcdf("close", ncid);
+     }},
+    {"RecordsOfAMappedFile", "", // which are no memory of the process
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped + persistent);
+         const LittleMemory little;
+         netcdf("put_var1_double", ncid, 0, 0x1p27, 1);
+         netcdf("close", ncid);
+     }},
+    {"DefinitionsOfAMappedFile", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const LittleMemory little;
+         netcdf("close", unfilledVariable(netcdf, folder, ncDouble, {0x1p27}, mapped + persistent));
+     }},
     {"MemoryThatIsNotMapped", "",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));

@@ -70,6 +70,28 @@ class FullDisk {
     void (*handler)(int) = std::signal(SIGXFSZ, SIG_IGN); // an error like any other
 };
 
+/// As long as it lives, the process may have some more memory than it has.
+class LittleMemory {
+  public:
+    LittleMemory() {
+        std::ifstream status("/proc/self/status");
+        std::string word;
+        while (status >> word && word != "VmData:") {
+        }
+        rlim_t kilobytes = 0;
+        status >> kilobytes;
+        getrlimit(RLIMIT_DATA, &before);
+        const rlimit little = {(kilobytes << 10U) + (rlim_t{1} << 28U), before.rlim_max};
+        setrlimit(RLIMIT_DATA, &little);
+    }
+    ~LittleMemory() { setrlimit(RLIMIT_DATA, &before); }
+    LittleMemory(const LittleMemory &) = delete;
+    LittleMemory &operator=(const LittleMemory &) = delete;
+
+  private:
+    rlimit before{};
+};
+
 /// A new file with these bytes.
 inline std::string written(const Folder &folder, std::string_view name, std::string_view bytes) {
     std::ofstream(folder.file(name), std::ios::binary) << bytes;
@@ -115,7 +137,11 @@ constexpr double noFill = 256; // of set_fill
 constexpr double ncInt = 4;
 constexpr double global = -1; // in the place of a variable
 constexpr double ncChar = 2;
-constexpr int data64 = 32; // of create
+// Flags of create.
+constexpr int mapped = 16;
+constexpr int data64 = 32;
+constexpr int offset64 = 512;
+constexpr int persistent = 0x4000; // of what is mapped, a file
 
 /// A dataset in data mode: the fixed variable 0 over x (10), and the record variable 1 over t and
 /// x.

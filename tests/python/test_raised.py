@@ -180,9 +180,13 @@ def lacking_more() -> int:
     return ncid
 
 
-def distant() -> int:
+MAPPED = 16
+"""The library's mode flag for files in mapped memory."""
+
+
+def distant(flags: int = 0) -> int:
     """A dataset of 64-bit data with records of which no file holds as many as may be asked for."""
-    ncid = nc.create("distant.nc", 32)
+    ncid = nc.create("distant.nc", 32 + flags)
     t = nc.def_dim(ncid, "t", 0)
     nc.def_var(ncid, "v", nc.param("BYTE"), [nc.def_dim(ncid, "x", 2.0**31), t])
     nc.def_var(ncid, "text", nc.param("CHAR"), [1, t])
@@ -191,13 +195,23 @@ def distant() -> int:
     return ncid
 
 
-def endless() -> int:
+def endless(flags: int = 0, length: float = 2.0**31) -> int:
     """A dataset whose variables, which are being defined, end where no file reaches."""
-    ncid = nc.create("endless.nc", 32)
-    dimids = [nc.def_dim(ncid, f"d{i}", 2.0**31) for i in range(2)]
+    ncid = nc.create("endless.nc", 32 + flags)
+    dimids = [nc.def_dim(ncid, f"d{i}", length) for i in range(2)]
     for name in ("v", "w"):
         nc.def_var(ncid, name, nc.param("BYTE"), dimids)
     return ncid
+
+
+def distant_in_memory() -> int:
+    """One whose records no memory holds."""
+    return distant(MAPPED)
+
+
+def endless_in_memory() -> int:
+    """One whose variables no memory holds, though a file would."""
+    return endless(MAPPED, 2.0**26)
 
 
 def many() -> int:
@@ -215,6 +229,9 @@ REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
     ("remote", {"path": "https://127.0.0.1:1/a.nc"}),
     ("mode", {"mode": 32768, "path": "none.nc"}),
     ("mode", {"cmode": 64}),
+    ("mode", {"ncid": endless_in_memory}),
+    ("mode", {"ncid": distant_in_memory, "varid": 0, "index": [0, 2.0**20],
+              "start": [0, 2.0**20], "count": [1, 1], "stride": [1, 1]}),
     ("header", {"path": "overwritten.nc", "mode": "NOWRITE", "ncid": overwritten}),
     ("header", {"ncid": lacking}),
     ("header", {"ncid": lacking_more}),
@@ -256,7 +273,7 @@ def test_refused_are_those_whose_page_says_so(word: str) -> None:
                         value = once or value()
                         made += [] if once else [value]
                     given[i] = value
-                elif argument.name == "data" and word in ("counts", "position", "records"):
+                elif argument.name == "data" and word in ("counts", "mode", "position", "records"):
                     given[i] = given[i][:1]
             if error_of(operation, *given) == identifier:
                 refused.add(operation.short)
