@@ -254,7 +254,7 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Module &guarded, const Dat
           std::pair<const char *, Work>("get_var_double of 256 MiB, beside pread with byte swap",
                                         [&data] { readPlainly(data); })}) {
         pairs.push_back({what, reference, read, true});
-        pairs.back().group = "blocks";
+        pairs.back().group = what;
     }
     return pairs;
 }

@@ -82,9 +82,8 @@ WATCHED = ("the guard finds the dataset, and whether the variable has records, i
 ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters, which "
          "are twice as large, are zeros before they are anything else; to widen them takes longer "
          "than the quarter by itself; see [Blocks of text](#blocks-of-text)")
-UNCOPIED = ("nothing is copied or added on this way; the row shows the worst of six types, whose "
-            "medians stray by as much below one as above it; see "
-            "[Blocks of numbers](#blocks-of-numbers)")
+UNCOPIED = ("nothing is copied or added on this way; the row shows the worst of six types, of "
+            "which others lie below one; see [Blocks of numbers](#blocks-of-numbers)")
 
 NOISE = ("both sides leave nearly all of the work to the library, and a difference below 3 % is "
          "noise")
@@ -97,7 +96,7 @@ FILLED = ("for each call, the library moves in the file twice and fills its buff
           "itself; see [From Python](measurements.md#from-python)")
 
 REASONS = {
-    **{f"{each}, one element": Reason(MORE_FUNCTIONS, 160e-9) for each in FAMILIES},
+    **{f"{each}, one element": Reason(MORE_FUNCTIONS, 140e-9) for each in FAMILIES},
     "get_vars, one element": Reason(STRIDED, 330e-9),
     "put_vars, one element": Reason(STRIDED, 330e-9),
     "get_att, one element": Reason(TWICE, 420e-9),
@@ -111,7 +110,7 @@ REASONS = {
     "get_att, text of 64 MiB": Reason(ZEROS, 4),
     **{f"{each}, text of 64 MiB": Reason(ZEROS, 1.45)
        for each in ("put_var", "put_vara", "put_att")},
-    **{f"{each}, numbers of 64 MiB": Reason(UNCOPIED, 1.1) for each in BLOCKS},
+    **{f"{each}, numbers of 64 MiB": Reason(UNCOPIED, 1.03) for each in BLOCKS},
     "get_var_double of 256 MiB": Reason(UNCOPIED, 1.03),
 }
 

@@ -311,45 +311,17 @@ class Type {
             putAtt(name, hostOne));
     }
 
-    /// A read of text with all that it takes: a zero-filled buffer of so many bytes a character for
-    /// the library, and a zero-filled result of the host's characters.
-    template <class Fill>
-    Work widening(std::size_t unit, const Fill &fill) const {
-        return [unit, fill, this] {
-            const Array result = Array::characters(count);
-            const Array buffer = Array::logical(std::array{elements + 1, unit});
-            auto *const bytes = static_cast<char *>(buffer.data());
-            check(fill(bytes));
-            std::transform(bytes, bytes + elements, static_cast<tsChar *>(result.data()),
-                           [](char byte) { return static_cast<tsChar>(byte); });
-        };
-    }
-
-    /// A write of text likewise: a zero-filled buffer, and the characters made bytes.
-    template <class Write>
-    Work narrowing(const Write &write) const {
-        return [this, write] {
-            const Array buffer = Array::logical(std::array{elements, std::size_t{1}});
-            auto *const bytes = static_cast<char *>(buffer.data());
-            const auto characters = hostBlock.template elements<const tsChar>();
-            std::transform(characters.begin(), characters.end(), bytes,
-                           [](tsChar character) { return static_cast<char>(character); });
-            check(write(bytes));
-        };
-    }
-
     /// What is wanted of blocks is a difference of a hundredth. The library takes strided ones an
     /// element at a time, for seconds where elements are bytes.
     static int repetitionsOf(std::string_view family) {
-        return family.ends_with("_vars") ? 5 : 2 * bench::usualRepetitions;
+        return family.ends_with("_vars") ? 9 : 3 * bench::usualRepetitions;
     }
 
-    /// A block, which takes turns with those of its type: of all types together, each would find
-    /// nothing of its own in the caches.
     void addBlock(std::vector<Pair> &pairs, const char *family, Work reference, Work module,
                   Work steps) const {
         pairs.push_back({operation(family) + "/64MiB", std::move(reference), std::move(module),
-                         true, std::move(steps), repetitionsOf(family), nullptr, library.suffix});
+                         true, std::move(steps), repetitionsOf(family), nullptr,
+                         operation(family)});
     }
 
     /// A block read by `fill`; where it is text, the second reference has a buffer of so many bytes
@@ -359,7 +331,7 @@ class Type {
                  Work module) const {
         Work steps;
         if constexpr (std::is_same_v<T, char>) {
-            steps = widening(unit, fill);
+            steps = bench::widening(count, unit, fill);
         }
         addBlock(pairs, family, intoNew(fill), std::move(module), std::move(steps));
     }
@@ -370,7 +342,7 @@ class Type {
                   Work module) const {
         Work steps;
         if constexpr (std::is_same_v<T, char>) {
-            steps = narrowing(write);
+            steps = bench::narrowing(hostBlock.template elements<const tsChar>(), write);
         }
         addBlock(
             pairs, family, [from = values.data(), write] { check(write(from)); }, std::move(module),

@@ -40,11 +40,12 @@ class Series(NamedTuple):
 
     @property
     def growth(self) -> float:
-        """How many times as large a ratio is as the smallest one with less, at most."""
-        least, growth = self.first, 1.0
+        """How many times as large a ratio is as the smallest one with less, at most. A call that
+        does all of its work takes no less time: a ratio below one is the machine's."""
+        least, growth = max(self.first, 1.0), 1.0
         for _, ratio in sorted(self.ratios.items()):
             growth = max(growth, ratio / least)
-            least = min(least, ratio)
+            least = max(min(least, ratio), 1.0)
         return growth
 
     @property

@@ -10,6 +10,7 @@
 #include <filesystem>
 #include <functional>
 #include <memory>
+#include <span>
 #include <string>
 #include <utility>
 #include <vector>
@@ -35,8 +36,9 @@ struct Pair {
 
     Work before = nullptr; ///< comes before each repetition, unmeasured
 
-    /// Pairs of one group, which are neighbours, take turns with each other only: together they
-    /// must not be so much memory that what one uses is gone from the caches whenever it comes.
+    /// Pairs of one group, which are neighbours, take turns with each other only. What a block
+    /// finds in the caches depends on what came before it, so that the sides of a large one take
+    /// turns with nothing but themselves.
     std::string group = {};
 };
 
@@ -69,6 +71,32 @@ Work called(const Module &module, Inputs... made) {
 
 /// Throws the library's text for a status that is not zero.
 void check(int status);
+
+/// A read of text of these dimensions, with all that it takes: a zero-filled buffer of so many
+/// bytes a character for the library, and a zero-filled result of the host's characters.
+template <class Fill>
+Work widening(std::array<std::size_t, 2> dims, std::size_t unit, const Fill &fill) {
+    return [dims, unit, fill] {
+        const Array result = Array::characters(dims);
+        const Array buffer = Array::logical(std::array{dims[0] * dims[1] + 1, unit});
+        auto *const bytes = static_cast<char *>(buffer.data());
+        check(fill(bytes));
+        std::transform(bytes, bytes + dims[0] * dims[1], static_cast<tsChar *>(result.data()),
+                       [](char byte) { return static_cast<tsChar>(byte); });
+    };
+}
+
+/// A write of text likewise: a zero-filled buffer, and the characters made bytes.
+template <class Write>
+Work narrowing(std::span<const tsChar> characters, const Write &write) {
+    return [characters, write] {
+        const Array buffer = Array::logical(std::array{characters.size(), std::size_t{1}});
+        auto *const bytes = static_cast<char *>(buffer.data());
+        std::transform(characters.begin(), characters.end(), bytes,
+                       [](tsChar character) { return static_cast<char>(character); });
+        check(write(bytes));
+    };
+}
 
 /// A folder that is gone at the end.
 class TemporaryFolder {

@@ -13,8 +13,10 @@
 #include <cstdio>
 #include <list>
 #include <memory>
+#include <span>
 #include <string>
 #include <tuple>
+#include <type_traits>
 #include <utility>
 #include <vector>
 
@@ -55,6 +57,7 @@ class Series {
         Pair &added = pairs.back();
         added.block = size >= blockElements;
         added.repetitions = size > blockElements ? fewRepetitions : bench::usualRepetitions;
+        added.group = added.name;
     }
 
     std::vector<Pair> pairs;
@@ -123,40 +126,54 @@ struct Datasets {
 
 // ---- the size of the data -----------------------------------------------------------------------
 
-/// Reads of bytes or of characters, by the library's function for them.
+/// Reads of bytes or of characters, by the library's function for them. The work of a read of text
+/// is more than that.
 template <class T>
 void addReads(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted,
               const char *operation, nc_type type, int (*function)(int, int, T *)) {
     for (const std::size_t size : wanted) {
         const int varid =
             data.variable(numbered("v", size), type, {data.dimension(numbered("x", size), size)});
-        const auto library = [&data, varid, size, function] {
-            const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{size, 1});
-            check(function(data.ncid, varid, static_cast<T *>(memory.data())));
+        const auto fill = [&data, varid, function](T *to) {
+            return function(data.ncid, varid, to);
         };
+        Work library = [size, fill] {
+            const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{size, 1});
+            check(fill(static_cast<T *>(memory.data())));
+        };
+        if constexpr (std::is_same_v<T, char>) {
+            library = bench::widening({size, 1}, 1, fill);
+        }
         series.addTransfer(
-            operation, size, library,
+            operation, size, std::move(library),
             called(netcdf, Array::text(operation), Array::scalar(data.ncid), Array::scalar(varid)));
     }
     data.endDefinition();
 }
 
-/// Writes, from the memory of the library's type and of the host's.
+/// Writes likewise, from the host's memory, which for numbers is the library's as well.
 template <class T, class Host>
 void addWrites(Series &series, const Module &netcdf, const Dataset &data, const Numbers &wanted,
                const char *operation, nc_type type, int (*function)(int, int, const T *),
                tsClassID hostClass) {
-    const auto values = std::make_shared<std::vector<T>>(wanted.back(), 'x');
-    const auto inHost = std::make_shared<std::vector<Host>>(wanted.back(), 'x');
+    const auto values = std::make_shared<std::vector<Host>>(wanted.back(), 'x');
     for (const std::size_t size : wanted) {
         const int varid =
             data.variable(numbered("v", size), type, {data.dimension(numbered("x", size), size)});
-        series.addTransfer(
-            operation, size,
-            [&data, varid, values, function] { check(function(data.ncid, varid, values->data())); },
-            called(netcdf, Array::text(operation), Array::scalar(data.ncid), Array::scalar(varid),
-                   Array::borrowed(hostClass, std::array<std::size_t, 2>{size, 1}, inHost->data(),
-                                   inHost)));
+        const auto write = [&data, varid, function](const T *from) {
+            return function(data.ncid, varid, from);
+        };
+        Work library;
+        if constexpr (std::is_same_v<T, Host>) {
+            library = [values, write] { check(write(values->data())); };
+        } else {
+            library = bench::narrowing(std::span(*values).first(size), write);
+        }
+        series.addTransfer(operation, size, std::move(library),
+                           called(netcdf, Array::text(operation), Array::scalar(data.ncid),
+                                  Array::scalar(varid),
+                                  Array::borrowed(hostClass, std::array<std::size_t, 2>{size, 1},
+                                                  values->data(), values)));
     }
     data.endDefinition();
 }

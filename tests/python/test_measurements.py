@@ -40,6 +40,9 @@ def saved(folder: Path, rows: list[dict]) -> Path:
     ([1.0, 4.0, 1.0], True),  # whatever comes after it
     ([5.0, 1.0, 2.0], True),  # below the first one, which is the call itself
     ([5.0, 4.0, 5.5], False),
+    ([2.0, 0.4, 1.1], False),  # what is less than the work was disturbed
+    ([2.0, 0.4, 1.6], True),
+    ([0.4, 1.1], False),
 ])
 def test_growth(tmp_path: Path, ratios: list[float], grows: bool) -> None:
     rows = [run for count, ratio in enumerate(ratios)
