@@ -253,8 +253,8 @@ std::vector<Pair> pairsOf(const Module &netcdf, const Module &guarded, const Dat
          {std::pair<const char *, Work>("get_var_double of 256 MiB", readDirect),
           std::pair<const char *, Work>("get_var_double of 256 MiB, beside pread with byte swap",
                                         [&data] { readPlainly(data); })}) {
-        pairs.push_back({what, reference, read, true});
-        pairs.back().group = what;
+        pairs.push_back(
+            {what, reference, read, true, nullptr, 3 * bench::usualRepetitions, nullptr, what});
     }
     return pairs;
 }

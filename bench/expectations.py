@@ -4,6 +4,7 @@
 from __future__ import annotations
 
 from collections.abc import Callable
+from statistics import geometric_mean
 from typing import NamedTuple
 
 from results import Results
@@ -55,7 +56,8 @@ class Reason(NamedTuple):
 
 class Row(NamedTuple):
     """Something measured, in all of its forms, of which the table shows the one that is furthest
-    from its expectation or nearest to it."""
+    from its expectation or nearest to it; or, where all of them do the same work, what they come to
+    together: the geometric mean."""
 
     what: str
     reference: str
@@ -66,6 +68,7 @@ class Row(NamedTuple):
 
     ours: str = "module"
     theirs: str = "reference"
+    together: bool = False
 
 
 DIRECT = "direct call"
@@ -82,8 +85,8 @@ WATCHED = ("the guard finds the dataset, and whether the variable has records, i
 ZEROS = ("the library's bytes go through a buffer, and both the buffer and the characters, which "
          "are twice as large, are zeros before they are anything else; to widen them takes longer "
          "than the quarter by itself; see [Blocks of text](#blocks-of-text)")
-UNCOPIED = ("nothing is copied or added on this way; the row shows the worst of six types, of "
-            "which others lie below one; see [Blocks of numbers](#blocks-of-numbers)")
+UNCOPIED = ("nothing is copied or added on this way, and ratios lie on either side of one; see "
+            "[Blocks of numbers](#blocks-of-numbers)")
 
 NOISE = ("both sides leave nearly all of the work to the library, and a difference below 3 % is "
          "noise")
@@ -121,7 +124,8 @@ def of_family(family: str, size: str, types: tuple[str, ...], limit: Limit,
         "text of 64 MiB" if types == ("text",) else "numbers of 64 MiB"
     what = f"{family}, {kind}"
     return Row(what, reference, limit, "bench_families",
-               tuple(f"{family}_{each}/{size}" for each in types), REASONS.get(what))
+               tuple(f"{family}_{each}/{size}" for each in types), REASONS.get(what),
+               together=kind == "numbers of 64 MiB")
 
 
 def from_python(what: str, limit: Limit) -> Row:
@@ -155,12 +159,14 @@ ROWS = (
 
 
 class Outcome(NamedTuple):
-    """What was measured of a row, in the form that counts."""
+    """What was measured of a row: in one form, or in all of them together."""
 
     row: Row
     form: str
     reference: float
     ours: float
+    values: tuple[float, ...] = ()
+    """Those of all forms, where they count together."""
 
     @property
     def value(self) -> float:
@@ -175,11 +181,26 @@ class Outcome(NamedTuple):
         return self.row.reason is not None and self.value <= self.row.reason.most
 
 
-def outcome(row: Row, results: Results) -> Outcome:
-    def of_form(form: str) -> Outcome:
+def of_each_form(row: Row, results: Results) -> list[Outcome]:
+    found = []
+    for form in row.forms:
         sides = results.of(row.program, form)
-        return Outcome(row, form, sides[row.theirs], sides[row.ours])
-    return max(map(of_form, row.forms), key=lambda each: each.value)
+        found.append(Outcome(row, form, sides[row.theirs], sides[row.ours]))
+    return found
+
+
+def furthest(row: Row, results: Results) -> Outcome:
+    """The form that is furthest from its expectation."""
+    return max(of_each_form(row, results), key=lambda each: each.value)
+
+
+def outcome(row: Row, results: Results) -> Outcome:
+    if not row.together:
+        return furthest(row, results)
+    found = of_each_form(row, results)
+    return Outcome(row, "", geometric_mean([each.reference for each in found]),
+                   geometric_mean([each.ours for each in found]),
+                   tuple(each.value for each in found))
 
 
 def outcomes(results: Results) -> list[Outcome]:
@@ -204,10 +225,13 @@ def table(results: Results) -> str:
     reasons = []
     for each in outcomes(results):
         row = each.row
-        form = f" ({each.form.split('/')[0]})" if len(row.forms) > 1 else ""
+        form = f" ({each.form.split('/')[0]})" if len(row.forms) > 1 and each.form else ""
+        measured = row.limit.shown(each.value)
+        if row.together:
+            measured += f" ({min(each.values):.3f} to {max(each.values):.3f})"
         lines.append(f"| {row.what}{form} | {row.reference or '–'} | {row.limit.text} | "
                      f"{shown(each.reference) if row.reference else '–'} | {shown(each.ours)} | "
-                     f"{row.limit.shown(each.value)} | {'met' if each.met else '**missed**'} |")
+                     f"{measured} | {'met' if each.met else '**missed**'} |")
         if not each.met:
             reasons.append(f"- **{row.what}**: " + (row.reason.text if each.explained
                                                     else "not explained yet"))

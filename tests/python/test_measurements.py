@@ -76,6 +76,30 @@ def test_outcome(tmp_path: Path, monkeypatch: pytest.MonkeyPatch, double: float,
     assert ("not explained yet" in table) == (not met and not explained)
 
 
+@pytest.mark.parametrize(("double", "text", "shown", "met"), [
+    (102.0, 99.0, "1.005 times (0.990 to 1.020)", True),
+    (104.0, 99.0, "1.015 times (0.990 to 1.040)", False),  # few of them are not enough
+])
+def test_outcome_of_all_together(tmp_path: Path, monkeypatch: pytest.MonkeyPatch, double: float,
+                                 text: float, shown: str, met: bool) -> None:
+    row = ROW._replace(limit=expectations.times(1.01), together=True, reason=None)
+    monkeypatch.setattr(expectations, "ROWS", (row,))
+    results = Results({"program": saved(tmp_path, [*runs("call_double", 100, double),
+                                                   *runs("call_text", 100, text)])})
+    outcome, = expectations.outcomes(results)
+    assert (outcome.form, outcome.met) == ("", met)
+    assert expectations.furthest(row, results).form == "call_double"
+    assert f"| a call | {expectations.DIRECT} | 1.01 times | 100 ns |" in (
+        table := expectations.table(results))
+    assert f"| {shown} | {'met' if met else '**missed**'} |" in table
+
+
+def test_which_count_together() -> None:
+    """Blocks of numbers, whose ways are the same."""
+    assert {each.what for each in expectations.ROWS if each.together} == \
+        {f"{family}, numbers of 64 MiB" for family in expectations.BLOCKS}
+
+
 @pytest.mark.parametrize(("row", "most"), [
     ("lookup of any name", "30 ns"),
     ("get_vars, one element", "+ 120 ns"),
