@@ -54,15 +54,20 @@ class Lengths {
     std::unordered_map<int, double> known;
 };
 
-/// The bytes of a variable, rounded up as the formats have it, or of one record of it.
+/// The bytes of a variable, or of one record of it.
 double bytesOf(const Variable &variable, std::span<const double> dimids, Lengths &lengthOf) {
-    constexpr double word = 4;
     // What only files based on HDF5 have is taken for the largest of the others.
     const auto type = static_cast<std::size_t>(variable.type);
     auto bytes = static_cast<double>(type < typeSizes.size() ? typeSizes[type] : sizeof(double));
     for (const double dimid : dimids) {
         bytes *= lengthOf(dimid);
     }
+    return bytes;
+}
+
+/// Rounded up as the formats have it.
+double rounded(double bytes) {
+    constexpr double word = 4;
     return std::ceil(bytes / word) * word;
 }
 
@@ -73,6 +78,8 @@ Layout layoutOf(int ncid, const Ask &ask) {
     const int unlimited = asInt(dataset[3]);
     Lengths lengthOf(ncid, ask);
     Layout layout;
+    int recordVariables = 0;
+    double last = 0; // of them
     layout.records = unlimited < 0 ? 0 : static_cast<std::uint64_t>(lengthOf(unlimited));
     for (int each = 0; each < asInt(dataset[1]); ++each) {
         const Variable variable = variableOf(ncid, each, ask);
@@ -80,8 +87,13 @@ Layout layoutOf(int ncid, const Ask &ask) {
         const double bytes =
             bytesOf(variable, variable.dimids.first(variable.dimids.size() - (inRecords ? 1 : 0)),
                     lengthOf);
-        (inRecords ? layout.record : layout.fixed) += bytes;
-        layout.largest = std::max(layout.largest, bytes);
+        (inRecords ? layout.record : layout.fixed) += rounded(bytes);
+        layout.largest = std::max(layout.largest, rounded(bytes));
+        recordVariables += inRecords ? 1 : 0;
+        last = inRecords ? bytes : last;
+    }
+    if (recordVariables == 1) { // the records of one are not rounded
+        layout.record = last;
     }
     return layout;
 }

@@ -30,8 +30,8 @@ struct Dataset {
     bool classic = true; // not based on HDF5
     bool data64 = false; // of 64-bit data
     bool writable = true;
-    Mapping mapping = Mapping::none;
-    bool shared = false; // its header is read again when it is redefined
+    Mapping mapping = Mapping::none; // of a new one: no other that is mapped may be written
+    bool shared = false;             // its header is read again when it is redefined
     bool defining = false;
     bool modeInDoubt = false; // it may have left define mode
     bool filling = true;

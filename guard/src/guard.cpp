@@ -351,7 +351,7 @@ bool needsNoLook(const Dataset *dataset, int varid) {
     if (dataset == nullptr) {
         return false;
     }
-    if (!dataset->classic || dataset->defining ||
+    if (!dataset->classic || !dataset->writable || dataset->defining ||
         (!dataset->filling && dataset->room < modestRoom && dataset->mapping == Mapping::none)) {
         return true;
     }
@@ -450,23 +450,20 @@ class Guard : public Watcher {
             // A mode that is given by a name has none of the flags.
             const int flags = integer(inputs[2]).value_or(0);
             dataset.shared = (flags & share) != 0;
-            dataset.mapping = mappingOf(flags, creates);
-            // It maps what it is told that a new file begins with, what it is told to read an old
-            // one by, and what an old one that may become longer claims.
+            // What a new file begins with, or what an old one is read by.
             const std::uint64_t tuned = inputs.size() > 3 ? size(inputs[3]).value_or(0) : 0;
             if (creates) {
-                lookAtMapping(dataset.mapping, tuned);
                 dataset.room = 0;
                 dataset.data64 = (flags & data64) != 0 || isByDefault(flags, data64Formats);
                 dataset.classic = lookAtCreation(flags);
+                dataset.mapping = dataset.classic ? mappingOfNew(flags) : Mapping::none;
+                lookAtMapping(dataset.mapping, tuned);
             } else {
-                // A number that would be negative the library leaves alone.
-                lookAtMapping(dataset.mapping,
-                              tuned <= std::numeric_limits<std::int64_t>::max() ? tuned : 0);
                 const Header found = lookAtOpening(dataset.path, flags);
-                if (dataset.writable && found.extent.end > found.size) {
-                    lookAtMapping(dataset.mapping, found.extent.end);
-                }
+                // A number that would be negative the library leaves alone.
+                lookAtMappedFile(flags, dataset.writable,
+                                 tuned <= std::numeric_limits<std::int64_t>::max() ? tuned : 0,
+                                 found);
                 dataset.file = found.file;
                 dataset.classic = found.classic;
                 dataset.data64 = found.data64;

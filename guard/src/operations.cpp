@@ -145,6 +145,14 @@ constexpr std::array readers = {
     Reader{tsINT64, wrapped<std::int64_t>}, Reader{tsUINT64, wrapped<std::uint64_t>},
 };
 
+/// nullptr for what is no number, or none at all.
+const Reader *readerOf(const tsArray *input) {
+    const tsClassID found = tsGetClassID(input);
+    const auto *const reader = std::find_if(
+        readers.begin(), readers.end(), [&](const Reader &row) { return row.classID == found; });
+    return reader == readers.end() || tsIsEmpty(input) ? nullptr : &*reader;
+}
+
 } // namespace
 
 Kind kindOf(Inputs inputs) {
@@ -199,15 +207,13 @@ std::optional<int> code(const tsArray *input) {
 }
 
 std::optional<std::uint64_t> size(const tsArray *input) {
-    const auto found = indices(input);
-    return found ? std::optional(found->back()) : std::nullopt;
+    const Reader *const reader = readerOf(input);
+    return reader != nullptr ? reader->read(input, 0) : std::nullopt;
 }
 
 std::optional<Indices> indices(const tsArray *input) {
-    const tsClassID found = tsGetClassID(input);
-    const auto *const reader = std::find_if(
-        readers.begin(), readers.end(), [&](const Reader &row) { return row.classID == found; });
-    if (reader == readers.end() || tsIsEmpty(input)) {
+    const Reader *const reader = readerOf(input);
+    if (reader == nullptr) {
         return std::nullopt;
     }
     const std::size_t n = tsGetNumberOfElements(input);

@@ -17,6 +17,7 @@ struct Refusal {
 inline constexpr Refusal
     alignment = {"TESSEL:guard:alignment", "the library divides by the alignment of the data and of the records and multiplies by it again, so that it must be at least 1 and below 2^63 (4 is the usual one)"},
     mode      = {"TESSEL:guard:mode",      "the library follows an invalid pointer when it is given this mode flag without what belongs to it"},
+    mapping   = {"TESSEL:guard:mapping",   "the library does not look whether what it maps is there: what is not ends the process, or is lost when it is written"},
     closed    = {"TESSEL:guard:closed",    "an earlier closing of the dataset failed, and the library may have freed its memory but not its id"},
     name      = {"TESSEL:guard:name",      "the library stores a name as it is composed, and copies it over the end of buffers of the size that its documentation gives"},
     redefinition = {"TESSEL:guard:redefinition", "the library counts records with 31 bits when it moves them: of more it moves none, and does not say so"},

@@ -812,6 +812,9 @@ GUARD: dict[str, str] = {
     "TESSEL:guard:mode":
         "The call was not made: <particulars>, and the library follows an invalid "
         "pointer when it is given this mode flag without what belongs to it.",
+    "TESSEL:guard:mapping":
+        "The call was not made: <particulars>, and the library does not look whether "
+        "what it maps is there: what is not ends the process, or is lost when it is written.",
     "TESSEL:guard:closed":
         "The call was not made: <particulars>, and an earlier closing of the dataset "
         "failed, and the library may have freed its memory but not its id.",

@@ -55,7 +55,7 @@ BUILT_INS: dict[type[Exception], str] = {
         unlimitedDimensionInTheWrongIndex onlyOneUnlimitedDimensionAllowed libraryMaxDimsExceeded
         maximumNumberOfAttributesExceeded maximumNumberOfVariablesExceeded
         actionProhibitedOnGlobalVarid mathArgumentOutOfDomainOfFunc
-        alignment closed counts lengths mode name position records redefinition
+        alignment closed counts lengths mapping mode name position records redefinition
         badBlockSize badDimensions badEncoding badFormat badMode badModuleName badOutputCount
         badShape badGuard badPath characterTooLarge differentFields dimensionsTooLarge missingInput
         nestedTooDeeply notExact nothingToDraw notOneByte notText readOnlyArray

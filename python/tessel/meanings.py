@@ -346,9 +346,12 @@ _GUARD = {
         "_enddef has an alignment of 0, by which the library divides, or of 2^63 or more.",
         "Give an alignment of at least 1 and below 2^63; 4 is the usual one."),
     "mode": (
-        "The mode has a flag that makes the library follow an invalid pointer, or the file is in "
-        "mapped memory, of which there is not enough.",
+        "The mode has a flag that makes the library follow an invalid pointer.",
         "Leave the flags for files in memory and for user-defined formats out."),
+    "mapping": (
+        "The file is in mapped memory (flag 16), of which there is not enough, or would be written "
+        "there, where it does not become longer.",
+        "Leave the flag 16 out."),
     "closed": (
         "An earlier closing of the dataset failed; the library may have freed it, but not its id.",
         "Do not use the id again; open the file anew."),

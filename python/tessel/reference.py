@@ -231,7 +231,8 @@ def _refused(operation: Operation) -> Iterator[Raised]:
     ends = short in ("enddef", "end_def", "_enddef", "close")  # definitions
     writes = short.startswith(("put_var1_", "put_vara_", "put_vars_"))
     words = {
-        "remote": operation.opens, "mode": operation.opens or ends or writes,
+        "remote": operation.opens, "mode": operation.opens,
+        "mapping": short in ("open", "_open", "_create") or ends or writes,
         "header": short in ("open", "_open", "sync", "redef") or ends,
         "alignment": short == "_enddef",
         "name": short.startswith(("def_", "rename_", "put_att_", "copy_att")),

@@ -1,4 +1,5 @@
 // tests/guard/closing_test.cpp: closing and synchronising behind the guard.
+#include "ending.hpp"
 #include "support.hpp"
 
 #include <fcntl.h>
@@ -110,6 +111,29 @@ TEST(Abort, ThatFailedHasEndedTheDataset) {
         EXPECT_EQ(identifierOf([&] { netcdf("abort", ncid); }), "TESSEL:netcdf:abort:fileTooLarge");
         EXPECT_EQ(identifierOf([&] { netcdf("inq", ncid); }), "TESSEL:netcdf:inq:notNetcdfID");
     }
+}
+
+/// Closing a file based on HDF5 is not divided into steps. In a process of its own, because the
+/// library keeps the file and meets it again at the end of the process.
+TEST(ClosedDatasets, MayBeBasedOnHdf5) {
+    EXPECT_EQ(endOf([](const Folder &folder) {
+                  const Module netcdf = guardedModule();
+                  const int ncid = intOf(netcdf("create", folder.file("a.nc"), hdf5));
+                  const int x = intOf(netcdf("def_dim", ncid, "x", 20000));
+                  netcdf("def_var", ncid, "v", ncDouble, x);
+                  netcdf("enddef", ncid);
+                  {
+                      const FullDisk full;
+                      identifierOf([&] { netcdf("put_var1_double", ncid, 0, 19999, 1); });
+                      if (identifierOf([&] { netcdf("close", ncid); }).empty()) {
+                          return;
+                      }
+                  }
+                  if (identifierOf([&] { netcdf("inq", ncid); }) == "TESSEL:guard:closed") {
+                      throw Error("refused", "as it should be");
+                  }
+              }),
+              raised);
 }
 
 TEST(ClosedDatasets, AreRefusedToEveryOperation) {

@@ -164,18 +164,18 @@ const Fatal rows[] = {
      [](const Module &netcdf, const Folder &folder) {
          netcdf("nc__open", folder.file("a.nc"), 32768 + 1, 1024);
      }},
-    {"CreateInMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mode",
+    {"CreateInMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mapping",
      "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 16, 1e15, 4096);
      }},
-    {"CreateInMemoryOfANegativeSize", SIGSEGV, "TESSEL:guard:mode",
+    {"CreateInMemoryOfANegativeSize", SIGSEGV, "TESSEL:guard:mapping",
      "there is no memory for 9223372036854775808 bytes",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_create", folder.file("a.nc"), 16, 0x1p63, 4096);
      }},
-    {"ReadOfMappedMemoryThatTheFileLacks", SIGSEGV, "TESSEL:guard:mode",
-     "there is no memory for 281474976710664 bytes",
+    {"ReadOfMappedMemoryThatTheFileLacks", SIGSEGV, "TESSEL:guard:mapping",
+     "the flag 16 (NC_MMAP) is set, and the file is to be written",
      [](const Module &netcdf, const Folder &folder) {
          const std::string file = written(
              folder, "a.nc",
@@ -184,35 +184,69 @@ const Fatal rows[] = {
                  words({6, 0, 8, 0x10000, 0}) + std::string(8000, '\0'));
          netcdf("get_var_double", netcdf("open", file, 17)[0], 0);
      }},
-    {"OpenByMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mode",
+    {"OpenByMoreMemoryThanThereIs", SIGSEGV, "TESSEL:guard:mapping",
      "the flag 16 (NC_MMAP) is set, and there is no memory for 1000000000000000 bytes",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
          netcdf("_open", folder.file("a.nc"), 16, 1e15);
      }},
-    {"ARecordBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mode",
+    {"ARecordBehindTheEndOfAMappedFile", SIGBUS, "TESSEL:guard:mapping",
+     "the flag 16 (NC_MMAP) is set, and the file is to be written",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), 16 + 1, 1e6));
+         netcdf("set_fill", ncid, noFill);
+         netcdf("put_var1_double", ncid, 1, Array::row({0, 1000}), 1);
+     }},
+    {"AReadOfWhatIsMappedAndNotThere", SIGBUS, "TESSEL:guard:mapping",
+     "of a file of 200 bytes, which claims more, 1000000 are to be mapped",
+     [](const Module &netcdf, const Folder &folder) {
+         const int made = definingVariable(netcdf, folder, ncDouble, {100'000});
+         netcdf("close", made);
+         std::filesystem::resize_file(folder.file("a.nc"), 200);
+         netcdf("get_var_double", intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6)), 0);
+     }},
+    {"AFileThatIsLongerThanWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mapping",
+     "there is no memory for 50331648 bytes",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         std::filesystem::resize_file(folder.file("a.nc"), std::uintmax_t{48} << 20U);
+         const FewAddresses few;
+         netcdf("open", folder.file("a.nc"), 16);
+     }},
+    {"AlignmentsOfWhichTheFirstCounts", SIGFPE, "TESSEL:guard:alignment", "an alignment is 0",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = newDataset(netcdf, folder.file("a.nc"));
+         netcdf("redef", ncid);
+         netcdf("_enddef", ncid, 0, Array::row({0, std::nan("")}), 0, 4);
+     }},
+    {"SizesOfWhichTheFirstCounts", SIGSEGV, "TESSEL:guard:mapping", "no memory for 10000000000000",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_create", folder.file("a.nc"), 16, Array::row({1e15, HUGE_VAL}), 4096);
+     }},
+    {"ARecordBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mapping",
      "the flag 16 (NC_MMAP) is set, and there is no memory for 180144",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("put_var1_double", longRecords(netcdf, folder), 0, Array::row({0, 0x1p20}), 1);
      }},
-    {"ARecordBehindThePromisedMemory", SIGSEGV, "TESSEL:guard:mode", "no memory for 10737418",
+    {"ARecordBehindThePromisedMemory", SIGSEGV, "TESSEL:guard:mapping", "no memory for 10737418",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped);
          const LittleMemory little;
          netcdf("put_var1_double", ncid, 0, 0x1p27, 1);
      }},
-    {"ABlockOfRecordsBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mode", "no memory for 180144",
+    {"ABlockOfRecordsBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mapping", "no memory for 180144",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("put_vara_double", longRecords(netcdf, folder), 0, Array::row({0, 0x1p20 - 1}),
                 Array::row({1, 2}), Array::row({1, 2}));
      }},
-    {"DefinitionsThatCannotBeMapped", SIGSEGV, "TESSEL:guard:mode", "no memory for 900719925474",
+    {"DefinitionsThatCannotBeMapped", SIGSEGV, "TESSEL:guard:mapping", "no memory for 900719925474",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid =
              unfilledVariable(netcdf, folder, ncDouble, {0x1p25, 0x1p25}, data64 + mapped);
          netcdf("get_var1_double", ncid, 0, Array::row({0x1p25 - 1, 0x1p25 - 1}));
      }},
-    {"DefinitionsBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mode", "no memory for 1000000000",
+    {"DefinitionsBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mapping", "no memory for 1000000000",
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = definingVariable(netcdf, folder, ncInt, {3}, mapped + offset64);
          netcdf("_enddef", ncid, 1e15, 4, 0, 4);

@@ -39,11 +39,10 @@ TEST_P(FatalCall, IsHarmlessWithTheGuard) {
 TEST(NotFenced, MappedFileThatCannotGrow) {
     for (const Module &netcdf : {plainModule(), guardedModule()}) {
         EXPECT_EQ(endOf([&](const Folder &folder) {
-                      netcdf("close", newDataset(netcdf, folder.file("a.nc")));
-                      const int ncid = intOf(netcdf("open", folder.file("a.nc"), 16 + 1));
-                      netcdf("set_fill", ncid, noFill);
+                      const int ncid =
+                          unfilledVariable(netcdf, folder, ncDouble, {0}, mapped + persistent);
                       const FullDisk full;
-                      netcdf("put_var1_double", ncid, 1, Array::row({0, 10000}), 1);
+                      netcdf("put_var1_double", ncid, 0, 100'000, 1);
                   }),
                   strsignal(SIGBUS));
     }

@@ -66,6 +66,40 @@ const Passing rows[] = {
          netcdf("put_var1_double", ncid, 0, 0x1p21, 1);
          netcdf("close", ncid);
      }},
+    {"NoRecordsInMappedMemory", "", // of which one would be a GiB
+     [](const Module &netcdf, const Folder &folder) {
+         const LittleMemory little;
+         netcdf("close", unfilledVariable(netcdf, folder, ncDouble, {0, 0x1p27}, mapped));
+     }},
+    {"RecordsOfSingleBytes", "", // the records of a single variable are not rounded up
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = unfilledVariable(netcdf, folder, ncChar, {0}, mapped);
+         const LittleMemory little;
+         netcdf("put_var1_text", ncid, 0, 0x1p27, "a");
+         netcdf("close", ncid);
+     }},
+    {"AMappedFileThatIsRead", "",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6));
+         netcdf("get_var_double", ncid, 0);
+         netcdf("close", ncid);
+     }},
+    {"AMappedFileThatIsNotThere", "TESSEL:netcdf:pOpen:noSuchFileOrDirectory",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("_open", folder.file("none.nc"), 16, 1e15);
+     }},
+    {"AnHdf5FileThatIsNotMapped", "TESSEL:netcdf:open:invalidArgument",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc"), 4096));
+         netcdf("close", intOf(netcdf("open", folder.file("a.nc"), 16 + 1)));
+     }},
+    {"AFarRecordOfADatasetForReading", "TESSEL:netcdf:putVar1:writeToReadOnly",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         netcdf("put_var1_double", intOf(netcdf("open", folder.file("a.nc"), 0)), 1,
+                Array::row({0, 0x1p31}), 1);
+     }},
     {"RecordsOfAMappedFile", "", // which are no memory of the process
      [](const Module &netcdf, const Folder &folder) {
          const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped + persistent);
@@ -356,6 +390,27 @@ TEST(Alignment, Of2To63OrMoreIsRefused) {
 
 /// Dimensions and attributes of such names end a process; a variable of one only makes a file that
 /// the guard itself refuses.
+/// Without the guard, what is written to a mapped file is lost, and nobody says so.
+TEST(Mapping, OfAFileThatIsWritten) {
+    const Folder folder;
+    const auto write = [&](const Module &netcdf) {
+        netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+        const int ncid = intOf(netcdf("open", folder.file("a.nc"), mapped + 1));
+        netcdf("put_var1_double", ncid, 1, Array::row({3, 0}), 21);
+        netcdf("close", ncid);
+    };
+    const auto read = [&] {
+        const Module netcdf = plainModule();
+        const int ncid = intOf(netcdf("open", folder.file("a.nc"), "NOWRITE"));
+        const double found = netcdf("get_var1_double", ncid, 1, Array::row({3, 0}))[0].number();
+        netcdf("close", ncid);
+        return found;
+    };
+    EXPECT_EQ(identifierOf([&] { write(plainModule()); }), "");
+    EXPECT_NE(read(), 21);
+    EXPECT_EQ(identifierOf([&] { write(guardedModule()); }), "TESSEL:guard:mapping");
+}
+
 TEST(Names, OfVariablesThatGrow) {
     const Folder folder;
     definingName(plainModule(), folder, repeated(growing, 128));

@@ -70,26 +70,36 @@ class FullDisk {
     void (*handler)(int) = std::signal(SIGXFSZ, SIG_IGN); // an error like any other
 };
 
-/// As long as it lives, the process may have some more memory than it has.
-class LittleMemory {
+/// As long as it lives, the process may have so many MiB more of something than it has: of
+/// RLIMIT_DATA, which is "VmData" of its status, or of RLIMIT_AS, "VmSize".
+class Limited {
   public:
-    LittleMemory() {
+    Limited(__rlimit_resource of, std::string_view name, rlim_t more) : resource(of) {
         std::ifstream status("/proc/self/status");
         std::string word;
-        while (status >> word && word != "VmData:") {
+        while (status >> word && word != name) {
         }
         rlim_t kilobytes = 0;
         status >> kilobytes;
-        getrlimit(RLIMIT_DATA, &before);
-        const rlimit little = {(kilobytes << 10U) + (rlim_t{1} << 28U), before.rlim_max};
-        setrlimit(RLIMIT_DATA, &little);
+        getrlimit(resource, &before);
+        const rlimit little = {(kilobytes << 10U) + (more << 20U), before.rlim_max};
+        setrlimit(resource, &little);
     }
-    ~LittleMemory() { setrlimit(RLIMIT_DATA, &before); }
-    LittleMemory(const LittleMemory &) = delete;
-    LittleMemory &operator=(const LittleMemory &) = delete;
+    ~Limited() { setrlimit(resource, &before); }
+    Limited(const Limited &) = delete;
+    Limited &operator=(const Limited &) = delete;
 
   private:
+    __rlimit_resource resource;
     rlimit before{};
+};
+
+struct LittleMemory : Limited {
+    LittleMemory() : Limited(RLIMIT_DATA, "VmData:", 256) {}
+};
+
+struct FewAddresses : Limited {
+    FewAddresses() : Limited(RLIMIT_AS, "VmSize:", 32) {}
 };
 
 /// A new file with these bytes.
@@ -142,6 +152,7 @@ constexpr int mapped = 16;
 constexpr int data64 = 32;
 constexpr int offset64 = 512;
 constexpr int persistent = 0x4000; // of what is mapped, a file
+constexpr int hdf5 = 0x1000;
 
 /// A dataset in data mode: the fixed variable 0 over x (10), and the record variable 1 over t and
 /// x.

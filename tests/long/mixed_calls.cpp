@@ -95,14 +95,17 @@ struct Scene {
         ncid = make(file, true);
     }
 
-    /// A file with the variables v (double), s (short) and c (char) over x and y.
+    /// A file with the variables v (double), s (short) and c (char) over x and y, and r (double)
+    /// over t, which has no end.
     double make(const std::string &path, bool leftOpen = false) const {
         const double made = netcdf("create", path, "CLOBBER")[0].number();
         netcdf("def_dim", made, "x", static_cast<double>(columns));
         netcdf("def_dim", made, "y", static_cast<double>(rows));
+        netcdf("def_dim", made, "t", 0);
         netcdf("def_var", made, "v", 6, pair(0, 1));
         netcdf("def_var", made, "s", 3, pair(0, 1));
         netcdf("def_var", made, "c", 2, pair(0, 1));
+        netcdf("def_var", made, "r", 6, 2);
         netcdf("put_att_text", made, 0, "units", "degrees");
         netcdf("put_att_double", made, 0, "range", 6, pair(0, 40));
         netcdf("enddef", made);
@@ -156,7 +159,16 @@ const std::vector<Kind> successes = {
          n("put_att_text", s.ncid, 0, "units", "degrees"); // as long as it was: nothing moves
          n("put_att_double", s.ncid, 0, "range", 6, pair(0, 40));
          n("enddef", s.ncid); }},
-    {nullptr, 13, [](const Scene &s, const Module &) { s.make(s.other); }},
+    {nullptr, 15, [](const Scene &s, const Module &) { s.make(s.other); }},
+    {nullptr, 1, [](const Scene &s, const Module &n) { n("put_var1_double", s.ncid, 3, 7, 21); }},
+    {nullptr, 1, [](const Scene &s, const Module &n) { n("put_vara_double", s.ncid, 3, 2, 2, pair(21, 22)); }},
+    {nullptr, 1, [](const Scene &s, const Module &n) { n("put_vars_double", s.ncid, 3, 1, 2, 3, pair(21, 22)); }},
+    {nullptr, 5, [](const Scene &s, const Module &n) { // records that the guard does not know of
+         const double ncid = n("open", s.other, "WRITE")[0].number();
+         n("put_var1_double", ncid, 3, 1, 21);
+         want(n("get_var1_double", ncid, 3, 1)[0].number() == 21, "value");
+         want(n("inq_dim", ncid, 2)[1].number() >= 2, "records");
+         n("close", ncid); }},
 };
 
 const std::vector<Kind> failures = {
@@ -171,7 +183,24 @@ const std::vector<Kind> failures = {
     {"TESSEL:netcdf:putVar:dataSizeMismatch",             1, [](const Scene &s, const Module &n) { n("put_var_double", s.ncid, 0, pair(1, 2)); }},
     {"TESSEL:netcdf:defDim:operationNotAllowedInDataMode", 1, [](const Scene &s, const Module &n) { n("def_dim", s.ncid, "z", 2); }},
 };
+
+/// What only the guard refuses.
+const std::vector<Kind> refusals = {
+    {"TESSEL:guard:mode",      1, [](const Scene &s, const Module &n) { n("create", s.other, 64); }},
+    {"TESSEL:guard:mapping",   1, [](const Scene &s, const Module &n) { n("open", s.other, 17); }},
+    {"TESSEL:guard:remote",    1, [](const Scene &, const Module &n) { n("open", "https://127.0.0.1:1/a.nc", "NOWRITE"); }},
+    {"TESSEL:guard:records",   1, [](const Scene &s, const Module &n) { n("put_var1_double", s.ncid, 3, 0x1p31, 21); }},
+    {"TESSEL:guard:counts",    1, [](const Scene &s, const Module &n) { n("put_vara_double", s.ncid, 0, pair(0, 0), pair(-1, -1), 1); }},
+};
 // clang-format on
+
+std::vector<Kind> failuresOf(bool guarded) {
+    std::vector<Kind> all = failures;
+    if (guarded) {
+        all.insert(all.end(), refusals.begin(), refusals.end());
+    }
+    return all;
+}
 
 /// How things stood at the end of a part of the run.
 struct Part {
@@ -234,7 +263,7 @@ class Run {
     /// Makes a call of a kind by lot: an error whenever they are less than a third.
     void one(Part &part) {
         const bool fail = 3 * part.errors < part.calls;
-        const std::vector<Kind> &kinds = fail ? failures : successes;
+        const std::vector<Kind> &kinds = fail ? failing : successes;
         const Kind &kind =
             kinds[std::uniform_int_distribution<std::size_t>(0, kinds.size() - 1)(lot)];
         std::string raised;
@@ -257,6 +286,7 @@ class Run {
 
     Options options;
     Scene scene{options.guard};
+    std::vector<Kind> failing = failuresOf(options.guard);
     std::mt19937 lot{1};
     std::vector<Array> kept;
     std::chrono::duration<double> hours{options.hours * 3600};

@@ -204,6 +204,13 @@ def endless(flags: int = 0, length: float = 2.0**31) -> int:
     return ncid
 
 
+def plain() -> int:
+    """One that nothing is wrong with."""
+    ncid = nc.create("plain.nc", "CLOBBER")
+    nc.enddef(ncid)
+    return ncid
+
+
 def distant_in_memory() -> int:
     """One whose records no memory holds."""
     return distant(MAPPED)
@@ -229,8 +236,10 @@ REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
     ("remote", {"path": "https://127.0.0.1:1/a.nc"}),
     ("mode", {"mode": 32768, "path": "none.nc"}),
     ("mode", {"cmode": 64}),
-    ("mode", {"ncid": endless_in_memory}),
-    ("mode", {"ncid": distant_in_memory, "varid": 0, "index": [0, 2.0**20],
+    ("mapping", {"path": "plain.nc", "mode": MAPPED + 1, "cmode": MAPPED, "initialsz": 2.0**50,
+                 "ncid": plain}),
+    ("mapping", {"ncid": endless_in_memory}),
+    ("mapping", {"ncid": distant_in_memory, "varid": 0, "index": [0, 2.0**20],
               "start": [0, 2.0**20], "count": [1, 1], "stride": [1, 1]}),
     ("header", {"path": "overwritten.nc", "mode": "NOWRITE", "ncid": overwritten}),
     ("header", {"ncid": lacking}),
@@ -248,6 +257,10 @@ REFUSED: list[tuple[str, dict[str, typing.Any]]] = [
                  "start": [2**40], "count": [1], "stride": [1]}),
     ("closed", {"ncid": lost, "ncid_in": lost, "ncid_out": lost}),
 ]
+
+
+WRITTEN = ("counts", "mapping", "position", "records")
+"""The words of writes, which are of one element."""
 
 
 def test_every_refusal_is_tried() -> None:
@@ -273,7 +286,7 @@ def test_refused_are_those_whose_page_says_so(word: str) -> None:
                         value = once or value()
                         made += [] if once else [value]
                     given[i] = value
-                elif argument.name == "data" and word in ("counts", "mode", "position", "records"):
+                elif argument.name == "data" and word in WRITTEN:
                     given[i] = given[i][:1]
             if error_of(operation, *given) == identifier:
                 refused.add(operation.short)
