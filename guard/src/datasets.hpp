@@ -2,7 +2,6 @@
 #pragma once
 
 #include "header.hpp"
-#include "mapping.hpp"
 #include "tessel/runtime/watcher.hpp"
 
 #include <cstdint>
@@ -30,8 +29,8 @@ struct Dataset {
     bool classic = true; // not based on HDF5
     bool data64 = false; // of 64-bit data
     bool writable = true;
-    Mapping mapping = Mapping::none; // of a new one: no other that is mapped may be written
-    bool shared = false;             // its header is read again when it is redefined
+    bool mapped = false; // a new one that is nothing but memory
+    bool shared = false; // its header is read again when it is redefined
     bool defining = false;
     bool modeInDoubt = false; // it may have left define mode
     bool filling = true;

@@ -352,7 +352,7 @@ bool needsNoLook(const Dataset *dataset, int varid) {
         return false;
     }
     if (!dataset->classic || !dataset->writable || dataset->defining ||
-        (!dataset->filling && dataset->room < modestRoom && dataset->mapping == Mapping::none)) {
+        (!dataset->filling && dataset->room < modestRoom && !dataset->mapped)) {
         return true;
     }
     const auto known = dataset->hasRecords.find(varid);
@@ -371,7 +371,7 @@ std::uint64_t lookAtRecords(const Write &write, int ncid, int varid, Dataset *da
         return added - std::min(added, write.count[0]);
     };
     if (dataset != nullptr && filled(dataset->records) == 0 && liesWithin(*dataset, end) &&
-        (dataset->mapping == Mapping::none || end <= dataset->records)) {
+        (!dataset->mapped || end <= dataset->records)) {
         return dataset->hasRecords.contains(varid) ? end : 0;
     }
     const std::optional<Layout> found = recordsOf(ncid, varid, ask);
@@ -456,14 +456,17 @@ class Guard : public Watcher {
                 dataset.room = 0;
                 dataset.data64 = (flags & data64) != 0 || isByDefault(flags, data64Formats);
                 dataset.classic = lookAtCreation(flags);
-                dataset.mapping = dataset.classic ? mappingOfNew(flags) : Mapping::none;
-                lookAtMapping(dataset.mapping, tuned);
+                dataset.mapped = dataset.classic && isMapped(flags);
+                if (dataset.mapped) {
+                    lookAtMappedCreation(flags, tuned);
+                }
             } else {
                 const Header found = lookAtOpening(dataset.path, flags);
-                // A number that would be negative the library leaves alone.
-                lookAtMappedFile(flags, dataset.writable,
-                                 tuned <= std::numeric_limits<std::int64_t>::max() ? tuned : 0,
-                                 found);
+                if (found.classic && isMapped(flags)) {
+                    // A number that would be negative the library leaves alone.
+                    constexpr std::uint64_t most = std::numeric_limits<std::int64_t>::max();
+                    lookAtMappedFile(dataset.writable, tuned <= most ? tuned : 0, found);
+                }
                 dataset.file = found.file;
                 dataset.classic = found.classic;
                 dataset.data64 = found.data64;

@@ -15,48 +15,51 @@ constexpr int diskless = 0x8; // the file is kept in memory
 constexpr int mapped = 0x10;  // and is that memory
 constexpr int persistent = 0x4000;
 
-/// Whether so much can be mapped. Only what belongs to no file counts as memory of the process, and
-/// is promised by the system.
-bool isMappable(Mapping kind, std::uint64_t bytes) {
-    const bool promised = kind == Mapping::ofMemory;
-    void *const memory = mmap(nullptr, bytes, PROT_READ | (promised ? PROT_WRITE : 0),
-                              MAP_PRIVATE | MAP_ANONYMOUS | (promised ? 0 : MAP_NORESERVE), -1, 0);
-    return memory != MAP_FAILED && munmap(memory, bytes) == 0;
+constexpr int memory = PROT_READ | PROT_WRITE; // which the system has to promise
+constexpr int file = PROT_READ;
+
+[[noreturn]] void refuseMapping(const std::string &why) {
+    refuse(mapping, "the flag 16 (NC_MMAP) is set, and " + why);
 }
+
+void lookAtRoom(std::uint64_t bytes, int protection) {
+    const int promise = protection == memory ? 0 : MAP_NORESERVE;
+    void *const room =
+        mmap(nullptr, bytes, protection, MAP_PRIVATE | MAP_ANONYMOUS | promise, -1, 0);
+    if (room == MAP_FAILED) {
+        refuseMapping("there is no memory for " + std::to_string(bytes) + " bytes");
+    }
+    munmap(room, bytes);
+}
+
+} // namespace
 
 bool isMapped(int flags) noexcept {
     return (flags & (mapped | diskless)) == mapped;
 }
 
-} // namespace
-
-Mapping mappingOfNew(int flags) noexcept {
-    if (!isMapped(flags)) {
-        return Mapping::none;
-    }
-    return (flags & persistent) == 0 ? Mapping::ofMemory : Mapping::ofFile;
-}
-
-void lookAtMapping(Mapping kind, std::uint64_t bytes) {
-    if (kind != Mapping::none && bytes > 0 && !isMappable(kind, bytes)) {
-        refuse(mapping, "the flag 16 (NC_MMAP) is set, and there is no memory for " +
-                            std::to_string(bytes) + " bytes");
+void lookAtMappedMemory(std::uint64_t bytes) {
+    if (bytes > 0) {
+        lookAtRoom(bytes, memory);
     }
 }
 
-void lookAtMappedFile(int flags, bool writable, std::uint64_t readBy, const Header &found) {
-    if (!isMapped(flags) || !found.classic) {
-        return;
+void lookAtMappedCreation(int flags, std::uint64_t initial) {
+    if ((flags & persistent) != 0) {
+        refuseMapping("the file is to be written");
     }
+    lookAtMappedMemory(initial);
+}
+
+void lookAtMappedFile(bool writable, std::uint64_t readBy, const Header &found) {
     if (writable) {
-        refuse(mapping, "the flag 16 (NC_MMAP) is set, and the file is to be written");
+        refuseMapping("the file is to be written");
     }
     if (readBy > found.size && found.extent.end > found.size) {
-        refuse(mapping, "the flag 16 (NC_MMAP) is set, and of a file of " +
-                            std::to_string(found.size) + " bytes, which claims more, " +
-                            std::to_string(readBy) + " are to be mapped");
+        refuseMapping("of a file of " + std::to_string(found.size) + " bytes, which claims more, " +
+                      std::to_string(readBy) + " are to be mapped");
     }
-    lookAtMapping(Mapping::ofFile, std::max(readBy, found.size));
+    lookAtRoom(std::max(readBy, found.size), file);
 }
 
 } // namespace tessel::guard

@@ -8,23 +8,20 @@
 
 namespace tessel::guard {
 
-/// What the library maps.
-enum class Mapping {
-    none,
-    ofMemory, // nothing of it becomes a file
-    ofFile,
-};
+/// Whether the flags of creating or of opening a file map it.
+bool isMapped(int flags) noexcept;
 
-/// What it maps by the flags of creating a file of a classic format.
-Mapping mappingOfNew(int flags) noexcept;
+/// Refuses to make so much mapped memory, or to make it so long, where there is not as much: the
+/// library writes to an address that there is not.
+void lookAtMappedMemory(std::uint64_t bytes);
 
-/// Refuses what makes the library map so much, where that cannot be: it writes to an address that
-/// there is not.
-void lookAtMapping(Mapping kind, std::uint64_t bytes);
+/// Refuses to create a file in mapped memory that becomes one of the disk (the flag 16384,
+/// NC_PERSIST), where an error of the disk ends the process; and to begin it with too much.
+void lookAtMappedCreation(int flags, std::uint64_t initial);
 
 /// Refuses to open a file of a classic format in mapped memory for writing, because the library
 /// does not make it longer up to the end of what it has mapped; to read it by so many bytes that
 /// some of what its header claims is mapped and not there; and where it cannot be mapped.
-void lookAtMappedFile(int flags, bool writable, std::uint64_t readBy, const Header &found);
+void lookAtMappedFile(bool writable, std::uint64_t readBy, const Header &found);
 
 } // namespace tessel::guard

@@ -63,17 +63,16 @@ void lookAtEnd(std::uint64_t number, const Layout &layout, const Dataset *datase
                              "records of " + inWords(layout.record) +
                              " that is behind 2^63 bytes, where no file reaches");
     }
-    if (dataset != nullptr && dataset->mapping != Mapping::none) {
-        lookAtMapping(dataset->mapping, static_cast<std::uint64_t>(gaps + bytesOf(layout, number)));
+    if (dataset != nullptr && dataset->mapped) {
+        lookAtMappedMemory(static_cast<std::uint64_t>(gaps + bytesOf(layout, number)));
     }
 }
 
 void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const Ask &ask,
                   std::uint64_t limit) {
     const bool isShort = dataset != nullptr && dataset->shortfall.end > 0;
-    const Mapping kind = dataset == nullptr ? Mapping::none : dataset->mapping;
-    if (dataset != nullptr && sum(dataset->room, tuned) < modestRoom && !isShort &&
-        kind == Mapping::none) {
+    const bool isMapped = dataset != nullptr && dataset->mapped;
+    if (dataset != nullptr && sum(dataset->room, tuned) < modestRoom && !isShort && !isMapped) {
         return;
     }
     const Layout layout = layoutOf(ncid, ask);
@@ -86,10 +85,9 @@ void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const A
     if (gaps + bytes > mostBytes && !answered) {
         refuse(position, "the variables end behind 2^63 bytes, where no file reaches");
     }
-    if (const double all = gaps + bytesOf(layout, layout.records);
-        kind != Mapping::none && all <= mostBytes) {
+    if (const double all = gaps + bytesOf(layout, layout.records); isMapped && all <= mostBytes) {
         // Mapped no later than the first read or write at its end.
-        lookAtMapping(kind, static_cast<std::uint64_t>(all));
+        lookAtMappedMemory(static_cast<std::uint64_t>(all));
     }
     if (isShort) {
         lookAtMissing(*dataset, layout.record, limit);

@@ -350,7 +350,7 @@ _GUARD = {
         "Leave the flags for files in memory and for user-defined formats out."),
     "mapping": (
         "The file is in mapped memory (flag 16), of which there is not enough, or would be written "
-        "there, where it does not become longer.",
+        "there, where the disk's errors end the process.",
         "Leave the flag 16 out."),
     "closed": (
         "An earlier closing of the dataset failed; the library may have freed it, but not its id.",

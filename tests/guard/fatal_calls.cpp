@@ -198,6 +198,13 @@ const Fatal rows[] = {
          netcdf("set_fill", ncid, noFill);
          netcdf("put_var1_double", ncid, 1, Array::row({0, 1000}), 1);
      }},
+    {"AMappedFileOnAFullDisk", SIGBUS, "TESSEL:guard:mapping",
+     "the flag 16 (NC_MMAP) is set, and the file is to be written",
+     [](const Module &netcdf, const Folder &folder) {
+         const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped + persistent);
+         const FullDisk full;
+         netcdf("put_var1_double", ncid, 0, 100'000, 1);
+     }},
     {"AReadOfWhatIsMappedAndNotThere", SIGBUS, "TESSEL:guard:mapping",
      "of a file of 200 bytes, which claims more, 1000000 are to be mapped",
      [](const Module &netcdf, const Folder &folder) {

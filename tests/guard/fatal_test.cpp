@@ -35,19 +35,6 @@ TEST_P(FatalCall, IsHarmlessWithTheGuard) {
     EXPECT_GT(netcdf("inq_libvers")[0].size(), 0U) << "the next call works";
 }
 
-/// There is memory for it, and no disk. If this fails, docs/reliability.md is to say so.
-TEST(NotFenced, MappedFileThatCannotGrow) {
-    for (const Module &netcdf : {plainModule(), guardedModule()}) {
-        EXPECT_EQ(endOf([&](const Folder &folder) {
-                      const int ncid =
-                          unfilledVariable(netcdf, folder, ncDouble, {0}, mapped + persistent);
-                      const FullDisk full;
-                      netcdf("put_var1_double", ncid, 0, 100'000, 1);
-                  }),
-                  strsignal(SIGBUS));
-    }
-}
-
 /// Which signal it is depends on what the freed memory holds by then.
 TEST(NotFenced, Hdf5FileOnAFullDisk) {
     for (const Module &netcdf : {plainModule(), guardedModule()}) {

@@ -100,17 +100,21 @@ const Passing rows[] = {
          netcdf("put_var1_double", intOf(netcdf("open", folder.file("a.nc"), 0)), 1,
                 Array::row({0, 0x1p31}), 1);
      }},
-    {"RecordsOfAMappedFile", "", // which are no memory of the process
+    {"AMappedFileIsNoMemoryOfTheProcess", "",
      [](const Module &netcdf, const Folder &folder) {
-         const int ncid = unfilledVariable(netcdf, folder, ncDouble, {0}, mapped + persistent);
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         std::filesystem::resize_file(folder.file("a.nc"), std::uintmax_t{1} << 30U);
          const LittleMemory little;
-         netcdf("put_var1_double", ncid, 0, 0x1p27, 1);
-         netcdf("close", ncid);
+         netcdf("close", intOf(netcdf("open", folder.file("a.nc"), mapped)));
      }},
-    {"DefinitionsOfAMappedFile", "",
+    {"ANewFileWithBothFlags", "TESSEL:netcdf:create:unknownErrorStatus",
      [](const Module &netcdf, const Folder &folder) {
-         const LittleMemory little;
-         netcdf("close", unfilledVariable(netcdf, folder, ncDouble, {0x1p27}, mapped + persistent));
+         netcdf("create", folder.file("a.nc"), 8 + mapped + persistent);
+     }},
+    {"AFileWithBothFlags", "TESSEL:netcdf:open:unknownErrorStatus",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         netcdf("close", intOf(netcdf("open", folder.file("a.nc"), 8 + mapped + 1)));
      }},
     {"MemoryThatIsNotMapped", "",
      [](const Module &netcdf, const Folder &folder) {

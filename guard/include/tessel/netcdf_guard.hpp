@@ -28,9 +28,10 @@ struct GuardOptions {
 /// - "TESSEL:guard:alignment": a tuned enddef with an alignment of 0, which divides by zero, or
 ///   of 2^63 or more, which puts the data over the header
 /// - "TESSEL:guard:mode": a mode flag that makes create or open follow an invalid pointer
-/// - "TESSEL:guard:mapping": in mapped memory (the flag 16, NC_MMAP), what makes a new file longer
-///   than what can be mapped, and a file that is opened for writing, which would not become longer,
-///   that is too long to be mapped, or that is mapped further than it reaches and claims to
+/// - "TESSEL:guard:mapping": in mapped memory (the flag 16, NC_MMAP), a file of a classic format
+///   that is to be written, because the disk's errors would end the process and what is written may
+///   be lost; one that is too long to be mapped, or is mapped further than it reaches and claims
+///   more; and what makes memory that is no file longer than what there is
 /// - "TESSEL:guard:closed": anything with a dataset that is based on HDF5, or was opened without
 ///   the guard, and whose closing failed: its memory may be freed
 /// - "TESSEL:guard:name": a name that may become longer than NC_MAX_NAME, 256 bytes, when its
