@@ -94,8 +94,10 @@ def profile(outcome: Outcome, side: str, built: Path) -> Profile:
 
 
 def name_of(outcome: Outcome, side: str) -> str:
-    return outcome.row.what if side == outcome.row.ours else \
-        f"{outcome.row.what}: {outcome.row.reference}"
+    what = outcome.row.what
+    if outcome.row.together:  # of which one form is profiled
+        what += f" ({outcome.form.split('/')[0]})"
+    return what if side == outcome.row.ours else f"{what}: {outcome.row.reference}"
 
 
 def table(missed: list[Outcome], profiles: dict[str, Profile]) -> str:

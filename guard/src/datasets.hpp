@@ -29,8 +29,9 @@ struct Dataset {
     bool classic = true; // not based on HDF5
     bool data64 = false; // of 64-bit data
     bool writable = true;
-    bool mapped = false; // a new one that is nothing but memory
-    bool shared = false; // its header is read again when it is redefined
+    bool mapped = false;      // a new one that is nothing but memory
+    std::uint64_t readBy = 0; // of an old one that is mapped: how much of it, if that was said
+    bool shared = false;      // its header is read again when it is redefined
     bool defining = false;
     bool modeInDoubt = false; // it may have left define mode
     bool filling = true;

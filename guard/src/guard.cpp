@@ -153,6 +153,9 @@ void lookAtOpenHeader(Dataset &dataset) {
                                inQuotes(std::filesystem::read_symlink(link, ignored).string()) +
                                " " + *found.claim);
         }
+        if (dataset.readBy > 0) {
+            lookAtMappedFile(dataset.writable, dataset.readBy, found);
+        }
         take(found, dataset);
     }
 }
@@ -465,7 +468,8 @@ class Guard : public Watcher {
                 if (found.classic && isMapped(flags)) {
                     // A number that would be negative the library leaves alone.
                     constexpr std::uint64_t most = std::numeric_limits<std::int64_t>::max();
-                    lookAtMappedFile(dataset.writable, tuned <= most ? tuned : 0, found);
+                    dataset.readBy = tuned <= most ? tuned : 0;
+                    lookAtMappedFile(dataset.writable, dataset.readBy, found);
                 }
                 dataset.file = found.file;
                 dataset.classic = found.classic;

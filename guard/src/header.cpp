@@ -78,13 +78,26 @@ class Reader {
         return value;
     }
 
+    /// Whether there is anything where something is to be.
+    [[nodiscard]] bool goesOn() {
+        lacking = lacking || !has(1);
+        return has(1);
+    }
+
     /// The library reads on behind the end of the file, where it finds zeros.
-    void skip(std::uint64_t bytes) { position += has(bytes) ? bytes : left(); }
+    void skip(std::uint64_t bytes) {
+        lacking = lacking || !has(bytes);
+        position += has(bytes) ? bytes : left();
+    }
+
+    /// Whether something was to be there, and was not.
+    [[nodiscard]] bool wasShort() const noexcept { return lacking; }
 
   private:
     unsigned char byte() {
         if (ahead() == 0) {
             if (left() == 0) {
+                lacking = true;
                 return 0;
             }
             fill();
@@ -109,6 +122,7 @@ class Reader {
     int file;
     struct stat status {};
     bool known = false;
+    bool lacking = false;
     std::uint64_t position = 0;
     std::uint64_t start = 0;
     std::uint64_t buffered = 0;
@@ -135,15 +149,16 @@ class Walk {
         found.data64 = version == 5;
         found.size = reader.size();
         const std::uint64_t records = reader.number(countSize);
-        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.has(1); --n) {
+        for (std::uint64_t n = list(dimensionList, "dimensions"); n > 0 && reader.goesOn(); --n) {
             name();
             lengths.push_back(reader.number(countSize));
         }
         attributes();
-        for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.has(1); --n) {
+        for (std::uint64_t n = list(variableList, "variables"); n > 0 && reader.goesOn(); --n) {
             variable();
         }
         found.extent = extent(records);
+        found.whole = !reader.wasShort();
         if (found.extent.end > maxLength) {
             throw Distrusted{"claims data that end behind 2^63 bytes, where no file reaches"};
         }
@@ -179,7 +194,7 @@ class Walk {
     }
 
     void attributes() {
-        for (std::uint64_t n = list(attributeList, "attributes"); n > 0 && reader.has(1); --n) {
+        for (std::uint64_t n = list(attributeList, "attributes"); n > 0 && reader.goesOn(); --n) {
             name();
             const std::uint64_t type = reader.number(4);
             const std::uint64_t values = count("values in an attribute");

@@ -32,6 +32,7 @@ struct Header {
     std::uint64_t size = 0;           ///< of the file
     bool classic = false;             ///< whether it is one of the classic formats'
     bool data64 = false;              ///< whether that is the one of 64-bit data
+    bool whole = false;               ///< whether the file has all of the header
     std::optional<std::string> claim; ///< what is not to be trusted in it, as part of a sentence
     Extent extent;                    ///< where there is no claim
 };

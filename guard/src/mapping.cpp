@@ -1,6 +1,7 @@
 // guard/src/mapping.cpp: files in mapped memory, and whether there is enough of it.
 #include "mapping.hpp"
 
+#include "positions.hpp"
 #include "refusals.hpp"
 
 #include <sys/mman.h>
@@ -55,9 +56,10 @@ void lookAtMappedFile(bool writable, std::uint64_t readBy, const Header &found) 
     if (writable) {
         refuseMapping("the file is to be written");
     }
-    if (readBy > found.size && found.extent.end > found.size) {
-        refuseMapping("of a file of " + std::to_string(found.size) + " bytes, which claims more, " +
-                      std::to_string(readBy) + " are to be mapped");
+    if (readBy > found.size && isShort(found)) {
+        refuseMapping("of a file of " + std::to_string(found.size) +
+                      " bytes, which is to have more, " + std::to_string(readBy) +
+                      " are to be mapped");
     }
     lookAtRoom(std::max(readBy, found.size), file);
 }

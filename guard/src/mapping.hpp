@@ -20,8 +20,9 @@ void lookAtMappedMemory(std::uint64_t bytes);
 void lookAtMappedCreation(int flags, std::uint64_t initial);
 
 /// Refuses to open a file of a classic format in mapped memory for writing, because the library
-/// does not make it longer up to the end of what it has mapped; to read it by so many bytes that
-/// some of what its header claims is mapped and not there; and where it cannot be mapped.
+/// does not make it longer up to the end of what it has mapped; to read it by more bytes than it
+/// has, if its header ends there or claims more, so that what is mapped and not there is read; and
+/// where it cannot be mapped.
 void lookAtMappedFile(bool writable, std::uint64_t readBy, const Header &found);
 
 } // namespace tessel::guard

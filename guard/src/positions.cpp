@@ -49,6 +49,11 @@ void lookAtMissing(const Dataset &dataset, double record, std::uint64_t limit) {
     }
 }
 
+bool claimsMore(const Header &found) noexcept {
+    constexpr std::uint64_t filling = 3; // the most that is no value, and nobody has to write
+    return found.extent.end > sum(found.size, filling);
+}
+
 } // namespace
 
 std::string inWords(double bytes) {
@@ -108,11 +113,13 @@ void take(const Header &found, Dataset &dataset) {
     dataset.gaps = found.extent.gaps;
 }
 
+bool isShort(const Header &found) noexcept {
+    return !found.whole || claimsMore(found);
+}
+
 Shortfall shortfallOf(const Header &found) noexcept {
-    constexpr std::uint64_t filling = 3; // the most that is no value, and nobody has to write
     const Extent &extent = found.extent;
-    return extent.end > sum(found.size, filling) ? Shortfall{extent.end, found.size, extent.record}
-                                                 : Shortfall{};
+    return claimsMore(found) ? Shortfall{extent.end, found.size, extent.record} : Shortfall{};
 }
 
 void lookAtShortfall(const Dataset &dataset, std::uint64_t limit) {

@@ -232,7 +232,7 @@ def _refused(operation: Operation) -> Iterator[Raised]:
     writes = short.startswith(("put_var1_", "put_vara_", "put_vars_"))
     words = {
         "remote": operation.opens, "mode": operation.opens,
-        "mapping": short in ("open", "_open", "_create") or ends or writes,
+        "mapping": operation.opens or ends or writes,
         "header": short in ("open", "_open", "sync", "redef") or ends,
         "alignment": short == "_enddef",
         "name": short.startswith(("def_", "rename_", "put_att_", "copy_att")),

@@ -206,12 +206,30 @@ const Fatal rows[] = {
          netcdf("put_var1_double", ncid, 0, 100'000, 1);
      }},
     {"AReadOfWhatIsMappedAndNotThere", SIGBUS, "TESSEL:guard:mapping",
-     "of a file of 200 bytes, which claims more, 1000000 are to be mapped",
+     "of a file of 200 bytes, which is to have more, 1000000 are to be mapped",
      [](const Module &netcdf, const Folder &folder) {
          const int made = definingVariable(netcdf, folder, ncDouble, {100'000});
          netcdf("close", made);
          std::filesystem::resize_file(folder.file("a.nc"), 200);
          netcdf("get_var_double", intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6)), 0);
+     }},
+    {"AHeaderThatIsMappedAndNotThere", SIGBUS, "TESSEL:guard:mapping",
+     "of a file of 4096 bytes, which is to have more, 8192 are to be mapped",
+     [](const Module &netcdf, const Folder &folder) {
+         std::string header = "CDF\1" + words({0, 10, 400}); // of which 340 fill the page
+         for (int i = 1000; header.size() < 4096; ++i) {
+             header += words({4}) + std::to_string(i) + words({5});
+         }
+         netcdf("_open", written(folder, "a.nc", header), 16, 8192);
+     }},
+    {"SyncOfAMappedFileThatClaimsMoreByNow", SIGBUS, "TESSEL:guard:mapping",
+     "which is to have more, 1000000 are to be mapped",
+     [](const Module &netcdf, const Folder &folder) {
+         netcdf("close", newDataset(netcdf, folder.file("a.nc")));
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6));
+         std::fstream(folder.file("a.nc")).seekp(4) << words({1000}); // records
+         netcdf("sync", ncid);
+         netcdf("get_var1_double", ncid, 1, Array::row({0, 999}));
      }},
     {"AFileThatIsLongerThanWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mapping",
      "there is no memory for 50331648 bytes",

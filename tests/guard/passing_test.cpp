@@ -85,6 +85,15 @@ const Passing rows[] = {
          netcdf("get_var_double", ncid, 0);
          netcdf("close", ncid);
      }},
+    {"AMappedFileWhoseRecordsAreNotRoundedUp", "",
+     [](const Module &netcdf, const Folder &folder) {
+         const int made = unfilledVariable(netcdf, folder, ncChar, {0});
+         netcdf("put_vara_text", made, 0, 0, 10, "abcdefghij");
+         netcdf("close", made);
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), mapped, 8192));
+         netcdf("get_var_text", ncid, 0);
+         netcdf("close", ncid);
+     }},
     {"AMappedFileThatIsNotThere", "TESSEL:netcdf:pOpen:noSuchFileOrDirectory",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("_open", folder.file("none.nc"), 16, 1e15);
@@ -392,8 +401,6 @@ TEST(Alignment, Of2To63OrMoreIsRefused) {
     }
 }
 
-/// Dimensions and attributes of such names end a process; a variable of one only makes a file that
-/// the guard itself refuses.
 /// Without the guard, what is written to a mapped file is lost, and nobody says so.
 TEST(Mapping, OfAFileThatIsWritten) {
     const Folder folder;
@@ -415,6 +422,8 @@ TEST(Mapping, OfAFileThatIsWritten) {
     EXPECT_EQ(identifierOf([&] { write(guardedModule()); }), "TESSEL:guard:mapping");
 }
 
+/// Dimensions and attributes of such names end a process; a variable of one only makes a file that
+/// the guard itself refuses.
 TEST(Names, OfVariablesThatGrow) {
     const Folder folder;
     definingName(plainModule(), folder, repeated(growing, 128));

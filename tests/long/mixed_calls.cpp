@@ -159,7 +159,7 @@ const std::vector<Kind> successes = {
          n("put_att_text", s.ncid, 0, "units", "degrees"); // as long as it was: nothing moves
          n("put_att_double", s.ncid, 0, "range", 6, pair(0, 40));
          n("enddef", s.ncid); }},
-    {nullptr, 15, [](const Scene &s, const Module &) { s.make(s.other); }},
+    {nullptr, 14, [](const Scene &s, const Module &) { s.make(s.other); }},
     {nullptr, 1, [](const Scene &s, const Module &n) { n("put_var1_double", s.ncid, 3, 7, 21); }},
     {nullptr, 1, [](const Scene &s, const Module &n) { n("put_vara_double", s.ncid, 3, 2, 2, pair(21, 22)); }},
     {nullptr, 1, [](const Scene &s, const Module &n) { n("put_vars_double", s.ncid, 3, 1, 2, 3, pair(21, 22)); }},
