@@ -217,7 +217,8 @@ def missed_without_reason(results: Results) -> list[str]:
 def shown(seconds: float) -> str:
     """A time with its unit."""
     scale, unit = next((scale, unit) for scale, unit, least in
-                       ((1, "s", 1), (1e3, "ms", 1e-3), (1e6, "µs", 1e-6), (1e9, "ns", 0)) if seconds >= least)
+                       ((1, "s", 1), (1e3, "ms", 1e-3), (1e6, "µs", 1e-6), (1e9, "ns", 0))
+                       if seconds >= least)
     return f"{seconds * scale:.3g} {unit}"
 
 

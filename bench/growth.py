@@ -5,6 +5,7 @@ from __future__ import annotations
 
 import json
 import re
+from math import inf
 from pathlib import Path
 from typing import NamedTuple
 
@@ -42,10 +43,10 @@ class Series(NamedTuple):
     def growth(self) -> float:
         """How many times as large a ratio is as the smallest one with less, at most. A call that
         does all of its work takes no less time: a ratio below one is the machine's."""
-        least, growth = max(self.first, 1.0), 1.0
+        least, growth = inf, 1.0
         for _, ratio in sorted(self.ratios.items()):
+            least = min(least, max(ratio, 1.0))
             growth = max(growth, ratio / least)
-            least = max(min(least, ratio), 1.0)
         return growth
 
     @property

@@ -137,12 +137,14 @@ void addReads(Series &series, const Module &netcdf, const Dataset &data, const N
         const auto fill = [&data, varid, function](T *to) {
             return function(data.ncid, varid, to);
         };
-        Work library = [size, fill] {
-            const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{size, 1});
-            check(fill(static_cast<T *>(memory.data())));
-        };
+        Work library;
         if constexpr (std::is_same_v<T, char>) {
             library = bench::widening({size, 1}, 1, fill);
+        } else {
+            library = [size, fill] {
+                const Array memory = Array::numeric(tsUINT8, std::array<std::size_t, 2>{size, 1});
+                check(fill(static_cast<T *>(memory.data())));
+            };
         }
         series.addTransfer(
             operation, size, std::move(library),

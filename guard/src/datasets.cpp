@@ -87,8 +87,9 @@ Layout layoutOf(int ncid, const Ask &ask) {
         const double bytes =
             bytesOf(variable, variable.dimids.first(variable.dimids.size() - (inRecords ? 1 : 0)),
                     lengthOf);
-        (inRecords ? layout.record : layout.fixed) += rounded(bytes);
-        layout.largest = std::max(layout.largest, rounded(bytes));
+        const double whole = rounded(bytes);
+        (inRecords ? layout.record : layout.fixed) += whole;
+        layout.largest = std::max(layout.largest, whole);
         recordVariables += inRecords ? 1 : 0;
         last = inRecords ? bytes : last;
     }

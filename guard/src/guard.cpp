@@ -417,6 +417,7 @@ class Guard : public Watcher {
     }
 
     void after(Inputs inputs, const Results &results, const Error *error) noexcept override {
+        // A write that did not move the end of the records leaves nothing to remember.
         if (kind != Kind::other && !(isWrite() && recordsEnd == 0)) {
             remember(inputs, results, error);
         }

@@ -80,14 +80,16 @@ class Reader {
 
     /// Whether there is anything where something is to be.
     [[nodiscard]] bool goesOn() {
-        lacking = lacking || !has(1);
-        return has(1);
+        const bool any = has(1);
+        lacking = lacking || !any;
+        return any;
     }
 
     /// The library reads on behind the end of the file, where it finds zeros.
     void skip(std::uint64_t bytes) {
-        lacking = lacking || !has(bytes);
-        position += has(bytes) ? bytes : left();
+        const bool all = has(bytes);
+        lacking = lacking || !all;
+        position += all ? bytes : left();
     }
 
     /// Whether something was to be there, and was not.
@@ -307,6 +309,15 @@ struct CloseFolder {
 };
 
 } // namespace
+
+bool claimsMore(const Header &found) noexcept {
+    constexpr std::uint64_t filling = 3; // the most that is no value, and nobody has to write
+    return found.extent.end > sum(found.size, filling);
+}
+
+bool isShort(const Header &found) noexcept {
+    return !found.whole || claimsMore(found);
+}
 
 Header headerOf(const std::string &path) {
     const File file(path);

@@ -37,6 +37,12 @@ struct Header {
     Extent extent;                    ///< where there is no claim
 };
 
+/// Whether the header of a file claims more than the file has.
+bool claimsMore(const Header &found) noexcept;
+
+/// Whether a file lacks some of its header, or of what that claims.
+bool isShort(const Header &found) noexcept;
+
 /// Looks at the header of a file and at nothing else of it. What is not of the classic formats, and
 /// what the library says itself, is no claim.
 ///

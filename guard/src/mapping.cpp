@@ -1,7 +1,6 @@
 // guard/src/mapping.cpp: files in mapped memory, and whether there is enough of it.
 #include "mapping.hpp"
 
-#include "positions.hpp"
 #include "refusals.hpp"
 
 #include <sys/mman.h>

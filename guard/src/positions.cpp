@@ -49,11 +49,6 @@ void lookAtMissing(const Dataset &dataset, double record, std::uint64_t limit) {
     }
 }
 
-bool claimsMore(const Header &found) noexcept {
-    constexpr std::uint64_t filling = 3; // the most that is no value, and nobody has to write
-    return found.extent.end > sum(found.size, filling);
-}
-
 } // namespace
 
 std::string inWords(double bytes) {
@@ -75,9 +70,9 @@ void lookAtEnd(std::uint64_t number, const Layout &layout, const Dataset *datase
 
 void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const Ask &ask,
                   std::uint64_t limit) {
-    const bool isShort = dataset != nullptr && dataset->shortfall.end > 0;
+    const bool lacks = dataset != nullptr && dataset->shortfall.end > 0;
     const bool isMapped = dataset != nullptr && dataset->mapped;
-    if (dataset != nullptr && sum(dataset->room, tuned) < modestRoom && !isShort && !isMapped) {
+    if (dataset != nullptr && sum(dataset->room, tuned) < modestRoom && !lacks && !isMapped) {
         return;
     }
     const Layout layout = layoutOf(ncid, ask);
@@ -94,7 +89,7 @@ void lookAtLayout(std::uint64_t tuned, int ncid, const Dataset *dataset, const A
         // Mapped no later than the first read or write at its end.
         lookAtMappedMemory(static_cast<std::uint64_t>(all));
     }
-    if (isShort) {
+    if (lacks) {
         lookAtMissing(*dataset, layout.record, limit);
     }
 }
@@ -111,10 +106,6 @@ std::uint64_t tunedRoom(Inputs inputs) {
 void take(const Header &found, Dataset &dataset) {
     dataset.room = found.extent.room;
     dataset.gaps = found.extent.gaps;
-}
-
-bool isShort(const Header &found) noexcept {
-    return !found.whole || claimsMore(found);
 }
 
 Shortfall shortfallOf(const Header &found) noexcept {

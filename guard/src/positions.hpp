@@ -43,9 +43,6 @@ std::uint64_t tunedRoom(Inputs inputs);
 /// Notes how much room a file has by its header.
 void take(const Header &found, Dataset &dataset);
 
-/// Whether a file lacks some of its header, or of what that claims.
-bool isShort(const Header &found) noexcept;
-
 /// What a file that is being opened lacks of what its header claims.
 Shortfall shortfallOf(const Header &found) noexcept;
 

@@ -349,8 +349,8 @@ _GUARD = {
         "The mode has a flag that makes the library follow an invalid pointer.",
         "Leave the flags for files in memory and for user-defined formats out."),
     "mapping": (
-        "In mapped memory (flag 16), the file would be written, which may lose it, be mapped where it "
-        "does not reach, or need more memory than there is.",
+        "In mapped memory (flag 16), the file would be written, which may lose it, be mapped where "
+        "it does not reach, or need more memory than there is.",
         "Leave the flag 16 out."),
     "closed": (
         "An earlier closing of the dataset failed; the library may have freed it, but not its id.",

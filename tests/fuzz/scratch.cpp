@@ -1,6 +1,8 @@
 // tests/fuzz/scratch.cpp: where the fuzzers work, and what they may use there.
 #include "scratch.hpp"
 
+#include "support/process.hpp"
+
 #include <dirent.h>
 #include <fcntl.h>
 #include <poll.h>
@@ -14,7 +16,6 @@
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <functional>
 #include <vector>
 
@@ -63,17 +64,6 @@ void limit(int resource, rlim_t most, rlim_t ever) {
     }
 }
 
-/// The bytes of memory that the process has reserved, which with a sanitizer are many.
-rlim_t reserved() {
-    std::ifstream status("/proc/self/status");
-    std::string word;
-    while (status >> word && word != "VmData:") {
-    }
-    rlim_t kilobytes = 0;
-    status >> kilobytes;
-    return kilobytes << 10U;
-}
-
 } // namespace
 
 void die(const std::string &what) {
@@ -92,7 +82,8 @@ Scratch::Scratch() {
     }
     std::signal(SIGXFSZ, SIG_IGN); // a full disk is an error like any other
     limit(RLIMIT_CORE, 0, 0);
-    limit(RLIMIT_DATA, reserved() + mostMemory, RLIM_INFINITY);
+    // What the process has reserved is much, with a sanitizer.
+    limit(RLIMIT_DATA, tessel::test::bytesInStatus("VmData:") + mostMemory, RLIM_INFINITY);
     entries = opendir(folder.c_str());
     if (entries == nullptr) {
         die("cannot read " + folder);

@@ -194,7 +194,7 @@ const Fatal rows[] = {
      "the flag 16 (NC_MMAP) is set, and the file is to be written",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
-         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), 16 + 1, 1e6));
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), mapped + 1, 1e6));
          netcdf("set_fill", ncid, noFill);
          netcdf("put_var1_double", ncid, 1, Array::row({0, 1000}), 1);
      }},
@@ -211,7 +211,7 @@ const Fatal rows[] = {
          const int made = definingVariable(netcdf, folder, ncDouble, {100'000});
          netcdf("close", made);
          std::filesystem::resize_file(folder.file("a.nc"), 200);
-         netcdf("get_var_double", intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6)), 0);
+         netcdf("get_var_double", intOf(netcdf("_open", folder.file("a.nc"), mapped, 1e6)), 0);
      }},
     {"AHeaderThatIsMappedAndNotThere", SIGBUS, "TESSEL:guard:mapping",
      "of a file of 4096 bytes, which is to have more, 8192 are to be mapped",
@@ -220,13 +220,13 @@ const Fatal rows[] = {
          for (int i = 1000; header.size() < 4096; ++i) {
              header += words({4}) + std::to_string(i) + words({5});
          }
-         netcdf("_open", written(folder, "a.nc", header), 16, 8192);
+         netcdf("_open", written(folder, "a.nc", header), mapped, 8192);
      }},
     {"SyncOfAMappedFileThatClaimsMoreByNow", SIGBUS, "TESSEL:guard:mapping",
      "which is to have more, 1000000 are to be mapped",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
-         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6));
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), mapped, 1e6));
          std::fstream(folder.file("a.nc")).seekp(4) << words({1000}); // records
          netcdf("sync", ncid);
          netcdf("get_var1_double", ncid, 1, Array::row({0, 999}));
@@ -237,7 +237,7 @@ const Fatal rows[] = {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
          std::filesystem::resize_file(folder.file("a.nc"), std::uintmax_t{48} << 20U);
          const FewAddresses few;
-         netcdf("open", folder.file("a.nc"), 16);
+         netcdf("open", folder.file("a.nc"), mapped);
      }},
     {"AlignmentsOfWhichTheFirstCounts", SIGFPE, "TESSEL:guard:alignment", "an alignment is 0",
      [](const Module &netcdf, const Folder &folder) {
@@ -247,7 +247,7 @@ const Fatal rows[] = {
      }},
     {"SizesOfWhichTheFirstCounts", SIGSEGV, "TESSEL:guard:mapping", "no memory for 10000000000000",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("_create", folder.file("a.nc"), 16, Array::row({1e15, HUGE_VAL}), 4096);
+         netcdf("_create", folder.file("a.nc"), mapped, Array::row({1e15, HUGE_VAL}), 4096);
      }},
     {"ARecordBehindWhatCanBeMapped", SIGSEGV, "TESSEL:guard:mapping",
      "the flag 16 (NC_MMAP) is set, and there is no memory for 180144",

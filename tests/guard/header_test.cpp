@@ -251,13 +251,7 @@ TEST_P(Header, IsLookedAt) {
 
 /// The addresses that this process has taken at most, in megabytes.
 long peakMegabytes() {
-    std::ifstream status("/proc/self/status");
-    for (std::string line; std::getline(status, line);) {
-        if (line.starts_with("VmPeak:")) {
-            return std::stol(line.substr(line.find_first_of("0123456789"))) / 1024;
-        }
-    }
-    return 0;
+    return static_cast<long>(bytesInStatus("VmPeak:") >> 20U);
 }
 
 /// From now on there is a gigabyte more than what the process has.

@@ -81,7 +81,7 @@ const Passing rows[] = {
     {"AMappedFileThatIsRead", "",
      [](const Module &netcdf, const Folder &folder) {
          netcdf("close", newDataset(netcdf, folder.file("a.nc")));
-         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), 16, 1e6));
+         const int ncid = intOf(netcdf("_open", folder.file("a.nc"), mapped, 1e6));
          netcdf("get_var_double", ncid, 0);
          netcdf("close", ncid);
      }},
@@ -96,12 +96,12 @@ const Passing rows[] = {
      }},
     {"AMappedFileThatIsNotThere", "TESSEL:netcdf:pOpen:noSuchFileOrDirectory",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("_open", folder.file("none.nc"), 16, 1e15);
+         netcdf("_open", folder.file("none.nc"), mapped, 1e15);
      }},
     {"AnHdf5FileThatIsNotMapped", "TESSEL:netcdf:open:invalidArgument",
      [](const Module &netcdf, const Folder &folder) {
-         netcdf("close", newDataset(netcdf, folder.file("a.nc"), 4096));
-         netcdf("close", intOf(netcdf("open", folder.file("a.nc"), 16 + 1)));
+         netcdf("close", newDataset(netcdf, folder.file("a.nc"), hdf5));
+         netcdf("close", intOf(netcdf("open", folder.file("a.nc"), mapped + 1)));
      }},
     {"AFarRecordOfADatasetForReading", "TESSEL:netcdf:putVar1:writeToReadOnly",
      [](const Module &netcdf, const Folder &folder) {

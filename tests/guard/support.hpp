@@ -75,14 +75,8 @@ class FullDisk {
 class Limited {
   public:
     Limited(__rlimit_resource of, std::string_view name, rlim_t more) : resource(of) {
-        std::ifstream status("/proc/self/status");
-        std::string word;
-        while (status >> word && word != name) {
-        }
-        rlim_t kilobytes = 0;
-        status >> kilobytes;
         getrlimit(resource, &before);
-        const rlimit little = {(kilobytes << 10U) + (more << 20U), before.rlim_max};
+        const rlimit little = {bytesInStatus(name) + (more << 20U), before.rlim_max};
         setrlimit(resource, &little);
     }
     ~Limited() { setrlimit(resource, &before); }

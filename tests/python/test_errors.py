@@ -78,8 +78,8 @@ def test_every_word_is_in_the_table() -> None:
     own = words_in((ROOT / "python" / "src").glob("*.cpp"), r'refuse\(\s*"(\w+)"')
     own |= words_in((ROOT / "python" / "tessel").rglob("*.py"), r'"TESSEL:python:(\w+)"')
     assert len(full) > 50 and len(statuses) > 60 and len(host) > 10 and len(own) > 15
-    assert guard == {"alignment", "closed", "counts", "header", "lengths", "mapping", "mode", "name",
-                     "position", "records", "redefinition", "remote"}
+    assert guard == {"alignment", "closed", "counts", "header", "lengths", "mapping", "mode",
+                     "name", "position", "records", "redefinition", "remote"}
     assert (full | statuses | guard | host | own) - set(WORDS) == set()
 
 

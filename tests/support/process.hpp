@@ -53,6 +53,17 @@ inline std::size_t openDescriptors() {
     return static_cast<std::size_t>(std::distance(begin(descriptors), end(descriptors)));
 }
 
+/// A line of what the system says of this process, in bytes: "VmData:", or another of memory.
+inline std::size_t bytesInStatus(std::string_view name) {
+    std::ifstream status("/proc/self/status");
+    std::string word;
+    while (status >> word && word != name) {
+    }
+    std::size_t kilobytes = 0;
+    status >> kilobytes;
+    return kilobytes << 10U;
+}
+
 /// The memory of this process that is there, in megabytes.
 inline double residentMegabytes() {
     std::size_t total = 0;
